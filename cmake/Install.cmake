@@ -1,0 +1,26 @@
+# What `cmake --install` puts where: libraries, public headers, pkg-config files, CMake package.
+include(CMakePackageConfigHelpers)
+
+install(TARGETS raster tarnlibs EXPORT rasterTargets
+  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+install(FILES
+  lib/raster/raster.h lib/rect/rect.h lib/image/imageUtil.h
+  lib/tarnlibs/baseTypes.h lib/tarnlibs/message.h lib/tarnlibs/utilAlloc.h
+  lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h
+  DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/raster)
+
+install(EXPORT rasterTargets NAMESPACE raster::
+  DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/raster)
+configure_package_config_file(${CMAKE_CURRENT_LIST_DIR}/rasterConfig.cmake.in
+  ${PROJECT_BINARY_DIR}/rasterConfig.cmake
+  INSTALL_DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/raster)
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
+  COMPATIBILITY SameMajorVersion)
+install(FILES ${PROJECT_BINARY_DIR}/rasterConfig.cmake ${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
+  DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/raster)
+
+foreach(package raster tarnlibs)
+  configure_file(${CMAKE_CURRENT_LIST_DIR}/${package}.pc.in ${PROJECT_BINARY_DIR}/${package}.pc @ONLY)
+  install(FILES ${PROJECT_BINARY_DIR}/${package}.pc
+    DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+endforeach()

@@ -1,0 +1,101 @@
+// SPDX-License-Identifier: MIT
+//
+// Frame buffers as memory: row addresses, pitches, single pixels, and the choice by pixel size.
+
+#ifndef RASTER_FRAME_BUFFER_H
+#define RASTER_FRAME_BUFFER_H
+
+#include <cstdint>
+#include <cstring>
+#include <type_traits>
+
+#include "baseTypes.h"
+
+namespace raster {
+
+/// The address of pixel (x, y), with the wrap-around of pointer-size integers. `pitch` may be
+/// negative; an unsigned pitch arrives zero-extended, a signed one sign-extended.
+template <class Byte>
+inline Byte* rowAt(Byte* base, intptr_t pitch, uint32 y, uint32 x, size_t bytesPerPixel) {
+  const uintptr_t offset = static_cast<uintptr_t>(pitch) * y + uintptr_t{x} * bytesPerPixel;
+  // Integers, because the sum may leave the buffer on the way (negative pitches).
+  return reinterpret_cast<Byte*>(  // NOLINT(performance-no-int-to-ptr)
+      reinterpret_cast<uintptr_t>(base) + offset);
+}
+
+/// The row after (or, with a negative step, before) the one at `row`.
+template <class Byte>
+inline Byte* nextRow(Byte* row, intptr_t step) {
+  return rowAt(row, step, 1, 0, 0);
+}
+
+/// An unsigned pitch as the signed, pointer-size number that rowAt takes.
+inline intptr_t pitchOf(uint32 pitch) { return static_cast<intptr_t>(uintptr_t{pitch}); }
+inline intptr_t pitchOf(int32 pitch) { return pitch; }
+
+/// Deliberate: rows of 2- and 4-byte pixels step by whole pixels, so a pitch that is not a multiple
+/// of the pixel size is rounded down (toward minus infinity) for the steps, while the first row is
+/// found with the full pitch.
+inline intptr_t rowStep(intptr_t pitch, uint32 bytesPerPixel) {
+  const bool wholeWords = bytesPerPixel == 2 || bytesPerPixel == 4;
+  return wholeWords ? pitch & -static_cast<intptr_t>(bytesPerPixel) : pitch;
+}
+
+/// One pixel of kBytes bytes, at any alignment.
+template <unsigned kBytes>
+inline uint32 loadPixel(const uint8* at) {
+  uint32 pixel = 0;
+  memcpy(&pixel, at, kBytes);
+  return pixel;
+}
+template <unsigned kBytes>
+inline void storePixel(uint8* at, uint32 pixel) {
+  memcpy(at, &pixel, kBytes);
+}
+
+/// Calls `body` with the pixel size as a compile-time constant (1 to 4) and returns true; for any
+/// other size returns false.
+template <class Body>
+inline bool withPixelSize(uint32 bytesPerPixel, Body body) {
+  switch (bytesPerPixel) {
+    case 1:
+      body(std::integral_constant<unsigned, 1>());
+      return true;
+    case 2:
+      body(std::integral_constant<unsigned, 2>());
+      return true;
+    case 3:
+      body(std::integral_constant<unsigned, 3>());
+      return true;
+    case 4:
+      body(std::integral_constant<unsigned, 4>());
+      return true;
+    default:
+      return false;
+  }
+}
+
+/// A constant pixel repeated through memory, as the first three 32-bit words of the run. Twelve
+/// bytes hold whole pixels of every size, so the words repeat from there on.
+struct PixelWords {
+  uint32 word[3];
+};
+inline PixelWords repeatPixel(uint32 pixel, uint32 bytesPerPixel) {
+  switch (bytesPerPixel) {
+    case 1:
+      pixel = (pixel & 0xFF) * 0x01010101u;
+      return {{pixel, pixel, pixel}};
+    case 2:
+      pixel = (pixel & 0xFFFF) * 0x00010001u;
+      return {{pixel, pixel, pixel}};
+    case 3:
+      pixel &= 0xFFFFFF;
+      return {{pixel | pixel << 24, pixel >> 8 | pixel << 16, pixel >> 16 | pixel << 8}};
+    default:
+      return {{pixel, pixel, pixel}};
+  }
+}
+
+}  // namespace raster
+
+#endif

@@ -1,0 +1,318 @@
+// SPDX-License-Identifier: MIT
+//
+// Raster graphics on frame buffers that the caller owns: fill, copy, raster operations, tiling, bit
+// planes, format conversion, comparison, blending, scaling, cursors, video and compression.
+//
+// Conventions that hold for every function unless it says otherwise:
+// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next) and
+//   a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel. Base and
+//   pitch may have any alignment. Nothing outside the named rectangle is read or written.
+// - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
+// - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
+//   the lowest address.
+// - Fatal errors go through Warning and Panic (message.h); Panic does not return.
+// - No function keeps state or takes a lock; calls on disjoint memory may run on several threads.
+
+#ifndef RASTER_RASTER_H
+#define RASTER_RASTER_H
+
+#include "baseTypes.h"
+#include "rect.h"
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+// ---- Fill and copy -----------------------------------------------------------------------------
+
+/// A switch for Raster_RectCopy, 0 when the library is loaded. The host may set it to non-zero,
+/// before its first copy, on processors with MMX and the non-temporal 64-bit store: copies of at
+/// least 32 bytes by 16 rows then bypass the cache. The pixels are the same either way. The library
+/// never writes it.
+extern TARNLIBS_EXPORT uint32 rasterops_mmx;
+
+/// Stores `pixel` in every pixel of a rectangle.
+///
+/// `pitch` is in bytes; `bytesPerPixel` is 1, 2, 3 or 4. Any other size calls
+/// Warning("Raster: Unsupported frame buffer depth\n") and then
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterops". A width or height of 0 writes
+/// nothing.
+///
+/// Deliberate: for 2- and 4-byte pixels the first row is found with the full pitch, and rows after
+/// it step by the pitch rounded down to a multiple of the pixel size.
+TARNLIBS_EXPORT void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPixel, uint32 pixel,
+                                     uint32 x, uint32 y, uint32 width, uint32 height);
+
+/// Copies a rectangle within a frame buffer or between two with the same pixel size.
+///
+/// The rectangles may overlap when `dst` and `src` are the same frame buffer: rows run from the last
+/// one up when dstY > srcY and from the first one down otherwise, and a row whose start lies within
+/// the other's is moved as by memmove. `bytesPerPixel` may have any value, since bytes are copied.
+/// With rasterops_mmx set, rows that do not overlap bypass the cache when the rectangle has at least
+/// 32 bytes a row and 16 rows.
+TARNLIBS_EXPORT void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPitch,
+                                     uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
+                                     uint32 dstY, uint32 width, uint32 height);
+
+/// Sets bits 24-31 of every pixel of a rectangle of 4-byte pixels to `alpha`; bits 0-23 stay.
+/// Rows step by the full pitch.
+TARNLIBS_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y,
+                                          uint32 width, uint32 height);
+
+// ---- Raster operations -------------------------------------------------------------------------
+
+TARNLIBS_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pixel,
+                                        uint32 rop, uint32 x, uint32 y, uint32 width,
+                                        uint32 height);
+TARNLIBS_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src,
+                                        int32 srcPitch, uint32 bytesPerPixel, uint32 srcX,
+                                        uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY,
+                                        uint32 width, uint32 height);
+
+// ---- Tiling ------------------------------------------------------------------------------------
+
+TARNLIBS_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
+                                           uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
+                                           uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
+                                           uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+TARNLIBS_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
+                                              uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
+                                              uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
+                                              uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                                              uint32 height);
+TARNLIBS_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
+                                              uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
+                                              uint32 dstX, uint32 dstY, uint32 width,
+                                              uint32 height);
+TARNLIBS_EXPORT void RasterRectPixmapROPcopy16(uint8* dst, uint32 dstPitch, const uint8* src,
+                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
+                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                                               uint32 height);
+TARNLIBS_EXPORT void RasterRectPixmapROPcopy24(uint8* dst, uint32 dstPitch, const uint8* src,
+                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
+                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                                               uint32 height);
+TARNLIBS_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, const uint8* src,
+                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
+                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                                               uint32 height);
+
+// ---- Bit planes --------------------------------------------------------------------------------
+
+TARNLIBS_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                         uint32 dstPitch, int32 bytesPerPixel, int32 width,
+                                         int32 height, uint32 foreground, uint32 background);
+TARNLIBS_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                                uint32 dstPitch, int32 bytesPerPixel, int32 width,
+                                                int32 height, uint32 foreground);
+TARNLIBS_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                         uint32 dstPitch, int32 width, int32 height,
+                                         uint32 foreground, uint32 background);
+TARNLIBS_EXPORT void RasterBitsToPixels16(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                          uint32 dstPitch, int32 width, int32 height,
+                                          uint32 foreground, uint32 background);
+TARNLIBS_EXPORT void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                          uint32 dstPitch, int32 width, int32 height,
+                                          uint32 foreground, uint32 background);
+TARNLIBS_EXPORT void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                          uint32 dstPitch, int32 width, int32 height,
+                                          uint32 foreground, uint32 background);
+TARNLIBS_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                                uint32 dstPitch, int32 width, int32 height,
+                                                uint32 foreground);
+TARNLIBS_EXPORT void RasterBitsToPixelsStencil16(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                                 uint32 dstPitch, int32 width, int32 height,
+                                                 uint32 foreground);
+TARNLIBS_EXPORT void RasterBitsToPixelsStencil24(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                                 uint32 dstPitch, int32 width, int32 height,
+                                                 uint32 foreground);
+TARNLIBS_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                                 uint32 dstPitch, int32 width, int32 height,
+                                                 uint32 foreground);
+
+// ---- Pixel formats and conversion --------------------------------------------------------------
+
+TARNLIBS_EXPORT bool Raster_IsModeReasonable(uint32 depth, uint32 bpp, bool pseudoColor);
+TARNLIBS_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
+TARNLIBS_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
+                                              bool pseudoColor, const uint32* palette);
+TARNLIBS_EXPORT void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth,
+                                          const void* src, uint32 srcPitch, int32 srcDepth,
+                                          bool pseudoColor, const uint32* palette, uint32 srcX,
+                                          uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
+                                          uint32 height);
+TARNLIBS_EXPORT void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src,
+                                              uint32 srcPitch, int32 srcDepth, bool pseudoColor,
+                                              const uint32* palette, uint32 srcX, uint32 srcY,
+                                              uint32 dstX, uint32 dstY, uint32 width,
+                                              uint32 height);
+TARNLIBS_EXPORT void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth,
+                                                const uint32* src, uint32 srcPitch, uint32 srcX,
+                                                uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
+                                                uint32 height);
+TARNLIBS_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src, uint32 srcPitch,
+                                       int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
+                                       uint32 dstY, uint32 width, uint32 height);
+
+// ---- Rect lists --------------------------------------------------------------------------------
+
+// NOLINTBEGIN(modernize-use-using)
+
+/// One rectangle of a list, by origin and size.
+typedef struct RectListEntry {
+  int32 x;
+  int32 y;
+  int32 width;
+  int32 height;
+} RectListEntry;
+
+enum { RASTER_RECT_LIST_SIZE = 16 };
+
+/// A region as disjoint rectangles; it ends at the first entry whose width is not positive.
+typedef struct RectList {
+  RectListEntry rects[RASTER_RECT_LIST_SIZE];
+} RectList;
+
+// NOLINTEND(modernize-use-using)
+
+TARNLIBS_EXPORT void Raster_ClearRectList(RectList* list);
+TARNLIBS_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
+TARNLIBS_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
+
+// ---- Comparison --------------------------------------------------------------------------------
+
+TARNLIBS_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 aBpp, const void* b,
+                                           uint32 bPitch, int32 bBpp, uint32 aX, uint32 aY,
+                                           uint32 bX, uint32 bY, uint32 width, uint32 height);
+TARNLIBS_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aBpp, const void* b,
+                                          uint32 bPitch, int32 bBpp, const RectList* rects);
+TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 aBpp, const uint8* b,
+                                          uint32 bPitch, int32 bBpp, const uint8* mask,
+                                          uint32 maskPitch, int32 maskBpp, int32 x, int32 y,
+                                          uint32 width, uint32 height, int32 maxDiffs);
+
+// ---- Alpha blending ----------------------------------------------------------------------------
+
+TARNLIBS_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
+                                       const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
+                                       uint32 width, uint32 height, uint32 depth, uint32 bpp,
+                                       uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
+                                       uint8 staged);
+TARNLIBS_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
+                                           const uint8* src, uint32 srcX, uint32 srcY,
+                                           uint32 srcPitch, uint32 width, uint32 height,
+                                           uint32 depth, uint32 bpp, uint8 staged);
+
+// ---- Scaling -----------------------------------------------------------------------------------
+
+TARNLIBS_EXPORT bool Raster_ScaleInit(void);
+TARNLIBS_EXPORT void Raster_ScaleExit(void);
+TARNLIBS_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth,
+                                  uint32 dstWidth, uint32 dstHeight, uint32 dstIgnored, int32 x1,
+                                  int32 y1, int32 x2, int32 y2, const void* srcBits, int32 srcPitch,
+                                  uint32 srcBpp, int32 srcDepth, uint32 srcIgnored, uint32 srcWidth,
+                                  uint32 srcHeight, uint32 ignored, double scaleX, double scaleY,
+                                  int32 smooth);
+TARNLIBS_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 height,
+                                                 double invScaleX, double invScaleY);
+
+// ---- Cursors -----------------------------------------------------------------------------------
+
+// NOLINTBEGIN(modernize-use-using)
+
+enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
+
+/// The planes of a mask cursor.
+typedef struct RasterCursorMask {
+  uint32 depth;
+  uint32 bpp;
+  uint8* andMask;
+  uint8* xorMask;
+} RasterCursorMask;
+
+typedef struct RasterCursor {
+  uint32 type;
+  int32 hotX;
+  int32 hotY;
+  uint32 width;
+  uint32 height;
+  union {
+    uint8* pixels;          ///< RASTER_CURSOR_ALPHA
+    RasterCursorMask mask;  ///< RASTER_CURSOR_MASK
+  } image;
+} RasterCursor;
+
+typedef struct RasterFrameBufferDesc {
+  uint32 width;
+  uint32 height;
+  uint32 depth;
+  uint32 bpp;
+  uint32 pitch;
+} RasterFrameBufferDesc;
+
+typedef struct RasterCursorBox {
+  int32 x;
+  int32 y;
+  int32 width;
+  int32 height;
+  int32 srcX;
+  int32 srcY;
+} RasterCursorBox;
+
+// NOLINTEND(modernize-use-using)
+
+TARNLIBS_EXPORT uint32 Raster_CalculateCursorSize(uint32 width, uint32 height, uint32 bitsPerPixel);
+TARNLIBS_EXPORT void Raster_ExpandCursorBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel,
+                                                 const uint8* bits, uint8* dst, uint32 dstSize);
+TARNLIBS_EXPORT void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
+                                                   const uint8* andBits, uint32 xorDepth,
+                                                   const uint8* xorBits, uint32 bitsPerPixel,
+                                                   uint8* dst, uint32 dstSize);
+TARNLIBS_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
+                                             const RasterCursor* cursor, int32 x, int32 y,
+                                             RasterCursorBox* box);
+TARNLIBS_EXPORT void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb,
+                                       uint8* saveBits, uint32 savePitch,
+                                       const RasterCursor* cursor, const RasterCursorBox* box);
+TARNLIBS_EXPORT uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight,
+                                                  uint32* scaledWidth, uint32* scaledHeight,
+                                                  int32* scaledHot, uint32 width, uint32 height,
+                                                  double scaleX, double scaleY, int32 hotX,
+                                                  int32 hotY);
+TARNLIBS_EXPORT void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX,
+                                             double scaleY, uint32 paddedWidth, uint32 paddedHeight,
+                                             uint32 scaledWidth, uint32 scaledHeight);
+TARNLIBS_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst,
+                                             const RasterCursor* cursor, double scaleX,
+                                             double scaleY, uint32 paddedWidth, uint32 paddedHeight,
+                                             uint32 scaledWidth, uint32 scaledHeight);
+
+// ---- Video -------------------------------------------------------------------------------------
+
+// NOLINTBEGIN(modernize-use-using)
+
+typedef struct RasterRGBParam {
+  uint32 multiplier;
+  uint32 shift;
+  uint32 mask;
+} RasterRGBParam;
+
+// NOLINTEND(modernize-use-using)
+
+TARNLIBS_EXPORT void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height,
+                                     uint32 format, int32 bppdepth);
+TARNLIBS_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
+TARNLIBS_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask);
+
+// ---- Compression -------------------------------------------------------------------------------
+
+TARNLIBS_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width,
+                                     uint32 height, uint8** outBlock, uint32* outSize);
+TARNLIBS_EXPORT void Raster_Decompress(const uint8* block, uint8** outData, uint32* outPitch,
+                                       uint32* outBpp, uint32* outWidth, uint32* outHeight);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

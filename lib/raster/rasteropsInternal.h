@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+//
+// Fill and copy for the other modules of the library: as the exported functions, but with signed
+// pitches and without the way through the dynamic linker.
+
+#ifndef RASTER_RASTEROPS_INTERNAL_H
+#define RASTER_RASTEROPS_INTERNAL_H
+
+#include "frameBuffer.h"
+
+namespace raster {
+
+/// What the kernels of one instruction-set level offer. Rows are given as the first row's address,
+/// the signed step to the next one, their length and their number.
+struct RasteropsKernels {
+  void (*fillRows)(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels);
+  void (*copyRows)(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, size_t bytes,
+                   uint32 height);
+  void (*fillAlphaRows)(uint8* row, intptr_t step, size_t pixels, uint32 height, uint32 alphaBits);
+};
+
+/// As Raster_RectFill.
+void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
+              uint32 width, uint32 height);
+
+/// As Raster_RectCopy.
+void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
+              uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+              uint32 width, uint32 height);
+
+}  // namespace raster
+
+#endif

@@ -1,0 +1,81 @@
+// SPDX-License-Identifier: MIT
+//
+// The row loops of the vector code. Included once per instruction set, after Highway.
+//
+// A kernel says what happens to one block of lanes; the loop here runs it over a row: whole vectors
+// first, then each smaller power of two that still fits, down to one lane. So every lane is handled
+// by the same text, nothing outside the row is touched, and the level without vectors runs one lane
+// at a time as the reference.
+
+#if defined(RASTER_ROWS_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef RASTER_ROWS_INL_H
+#undef RASTER_ROWS_INL_H
+#else
+#define RASTER_ROWS_INL_H
+#endif
+
+#include <cstddef>
+#include <cstring>
+
+#include "baseTypes.h"
+#include "hwy/highway.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace hn = hwy::HWY_NAMESPACE;
+
+/// The number of lanes of a tag, at compile time.
+template <class D>
+inline constexpr size_t kLanes = hn::MaxLanes(D());
+
+/// Loads and stores lanes of any width at any alignment.
+template <class D>
+HWY_INLINE hn::Vec<D> loadLanes(D d, const uint8* at) {
+#if HWY_TARGET == HWY_SCALAR
+  hn::TFromD<D> lane;
+  memcpy(&lane, at, sizeof lane);
+  return hn::Set(d, lane);
+#else
+  return hn::BitCast(d, hn::LoadU(hn::Repartition<uint8, D>(), at));
+#endif
+}
+template <class D>
+HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) {
+#if HWY_TARGET == HWY_SCALAR
+  (void)d;
+  const hn::TFromD<D> lane = hn::GetLane(lanes);
+  memcpy(at, &lane, sizeof lane);
+#else
+  const hn::Repartition<uint8, D> d8;
+  hn::StoreU(hn::BitCast(d8, lanes), d8, at);
+#endif
+}
+
+/// Runs body(tag, first) for the rest of a row that is shorter than two blocks of `d`.
+template <class D, class Body>
+HWY_INLINE void forRestOfLanes(D d, size_t first, size_t count, const Body& body) {
+  if (count - first >= hn::Lanes(d)) {
+    body(d, first);
+    first += hn::Lanes(d);
+  }
+  if constexpr (kLanes<D> > 1) {
+    if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
+  }
+}
+
+/// Runs body(tag, first) over the lanes [0, count) from left to right. `tag` says how many lanes
+/// from `first` on the call is for: those of `d`, and at the end of the row smaller ones.
+template <class D, class Body>
+HWY_INLINE void forLanes(D d, size_t count, const Body& body) {
+  const size_t step = hn::Lanes(d);
+  size_t first = 0;
+  for (; count - first >= step; first += step) body(d, first);
+  if constexpr (kLanes<D> > 1) {
+    if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
+  }
+}
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif
