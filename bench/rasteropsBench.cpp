@@ -50,7 +50,7 @@ void fillJob(uint32 bytes) {
 #ifdef HAVE_PIXMAN
     if (bytes != 3) {
       c.add("pixman", [=] {
-        pixman_fill(reinterpret_cast<uint32_t*>(dst), intPitch / 4, static_cast<int>(8 * bytes), 0,
+        pixman_fill(bench::words(dst), intPitch / 4, static_cast<int>(8 * bytes), 0,
                     0, w, h, kPixel);
       });
     }
@@ -94,7 +94,7 @@ void copyJob(const std::string& name, uint32 bytes, uint32 dx, uint32 sy, uint32
 #ifdef HAVE_PIXMAN
     if (bytes == 4) {
       c.add("pixman", [=] {
-        pixman_blt(reinterpret_cast<uint32_t*>(src), reinterpret_cast<uint32_t*>(dst), intPitch / 4,
+        pixman_blt(bench::words(src), bench::words(dst), intPitch / 4,
                    intPitch / 4, 32, 32, 0, 0, 0, 0, w, h);
       });
     }
@@ -124,7 +124,7 @@ void fillAlphaJob() {
 #ifdef HAVE_PIXMAN
     const int w = static_cast<int>(e.width);
     const int h = static_cast<int>(e.height);
-    auto* image = pixman_image_create_bits(PIXMAN_a8r8g8b8, w, h, reinterpret_cast<uint32_t*>(dst),
+    auto* image = pixman_image_create_bits(PIXMAN_a8r8g8b8, w, h, bench::words(dst),
                                            static_cast<int>(pitch));
     const pixman_color_t opaque = {0, 0, 0, 0xFFFF};
     auto* source = pixman_image_create_solid_fill(&opaque);

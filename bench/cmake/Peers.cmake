@@ -24,10 +24,13 @@ if(LIBYUV_INCLUDE AND LIBYUV_LIBRARY)
   target_compile_definitions(bench_peers INTERFACE HAVE_LIBYUV=1)
 endif()
 
-find_package(OpenCV QUIET COMPONENTS core imgproc)
-if(OpenCV_FOUND)
-  target_include_directories(bench_peers SYSTEM INTERFACE ${OpenCV_INCLUDE_DIRS})
-  target_link_libraries(bench_peers INTERFACE ${OpenCV_LIBS})
+# Without OpenCV's own package, which would ask for all of its modules.
+find_path(OPENCV_INCLUDE opencv2/core.hpp PATH_SUFFIXES opencv4)
+find_library(OPENCV_CORE opencv_core)
+find_library(OPENCV_IMGPROC opencv_imgproc)
+if(OPENCV_INCLUDE AND OPENCV_CORE AND OPENCV_IMGPROC)
+  target_include_directories(bench_peers SYSTEM INTERFACE ${OPENCV_INCLUDE})
+  target_link_libraries(bench_peers INTERFACE ${OPENCV_IMGPROC} ${OPENCV_CORE})
   target_compile_definitions(bench_peers INTERFACE HAVE_OPENCV=1)
 endif()
 

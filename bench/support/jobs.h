@@ -30,6 +30,9 @@ inline constexpr size_t kBufferBytes = size_t{16} << 20;
 inline constexpr int kBuffers = 4;
 uint8* buffer(int index);
 
+/// The same memory as the peers' interfaces want it.
+inline uint32* words(uint8* bytes) { return static_cast<uint32*>(static_cast<void*>(bytes)); }
+
 /// Tells the compiler that memory was used.
 inline void used() { benchmark::ClobberMemory(); }
 
@@ -45,7 +48,7 @@ class Contenders {
   template <class Work>
   void add(const std::string& contender, Work work) {
     remember(prefix_, contender, units_);
-    benchmark::RegisterBenchmark((prefix_ + contender).c_str(), [work](benchmark::State& state) {
+    benchmark::RegisterBenchmark((prefix_ + contender).c_str(), [work](benchmark::State& state) mutable {
       for (auto _ : state) {
         work();
         used();
