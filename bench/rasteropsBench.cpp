@@ -50,8 +50,8 @@ void fillJob(uint32 bytes) {
 #ifdef HAVE_PIXMAN
     if (bytes != 3) {
       c.add("pixman", [=] {
-        pixman_fill(bench::words(dst), intPitch / 4, static_cast<int>(8 * bytes), 0,
-                    0, w, h, kPixel);
+        pixman_fill(bench::words(dst), intPitch / 4, static_cast<int>(8 * bytes), 0, 0, w, h,
+                    kPixel);
       });
     }
 #endif
@@ -94,8 +94,8 @@ void copyJob(const std::string& name, uint32 bytes, uint32 dx, uint32 sy, uint32
 #ifdef HAVE_PIXMAN
     if (bytes == 4) {
       c.add("pixman", [=] {
-        pixman_blt(bench::words(src), bench::words(dst), intPitch / 4,
-                   intPitch / 4, 32, 32, 0, 0, 0, 0, w, h);
+        pixman_blt(bench::words(src), bench::words(dst), intPitch / 4, intPitch / 4, 32, 32, 0, 0,
+                   0, 0, w, h);
       });
     }
 #endif
@@ -108,8 +108,9 @@ void copyJob(const std::string& name, uint32 bytes, uint32 dx, uint32 sy, uint32
     });
 #endif
 #ifdef HAVE_OPENCV
-    c.add("OpenCV", [from = cv::Mat(h, intPitch, CV_8UC1, src, pitch),
-                     to = cv::Mat(h, intPitch, CV_8UC1, dst, pitch)]() mutable { from.copyTo(to); });
+    c.add("OpenCV",
+          [from = cv::Mat(h, intPitch, CV_8UC1, src, pitch),
+           to = cv::Mat(h, intPitch, CV_8UC1, dst, pitch)]() mutable { from.copyTo(to); });
 #endif
     (void)w, (void)h, (void)intPitch;
   });
@@ -124,8 +125,8 @@ void fillAlphaJob() {
 #ifdef HAVE_PIXMAN
     const int w = static_cast<int>(e.width);
     const int h = static_cast<int>(e.height);
-    auto* image = pixman_image_create_bits(PIXMAN_a8r8g8b8, w, h, bench::words(dst),
-                                           static_cast<int>(pitch));
+    auto* image =
+        pixman_image_create_bits(PIXMAN_a8r8g8b8, w, h, bench::words(dst), static_cast<int>(pitch));
     const pixman_color_t opaque = {0, 0, 0, 0xFFFF};
     auto* source = pixman_image_create_solid_fill(&opaque);
     c.add("pixman ADD", [=] {

@@ -31,8 +31,8 @@ Table& table() {
   return all;
 }
 
-/// Collects the best time of every contender; prints nothing while the benchmarks run but a dot on a
-/// terminal's error output.
+/// Collects the best time of every contender; prints nothing while the benchmarks run but a dot on
+/// a terminal's error output.
 class BestTimes : public benchmark::BenchmarkReporter {
  public:
   bool ReportContext(const Context& /*context*/) override { return true; }
@@ -40,7 +40,8 @@ class BestTimes : public benchmark::BenchmarkReporter {
   void ReportRuns(const std::vector<Run>& runs) override {
     for (const Run& run : runs) {
       if (run.run_type != Run::RT_Iteration || run.error_occurred) continue;
-      note(run.run_name.function_name, run.real_accumulated_time / static_cast<double>(run.iterations));
+      note(run.run_name.function_name,
+           run.real_accumulated_time / static_cast<double>(run.iterations));
     }
   }
 
@@ -55,7 +56,8 @@ class BestTimes : public benchmark::BenchmarkReporter {
 };
 
 const Contender* find(const std::vector<Contender>& all, const char* name) {
-  const auto at = std::find_if(all.begin(), all.end(), [&](const auto& c) { return c.name == name; });
+  const auto at =
+      std::find_if(all.begin(), all.end(), [&](const auto& c) { return c.name == name; });
   return at != all.end() && at->seconds > 0 ? &*at : nullptr;
 }
 

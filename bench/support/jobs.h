@@ -40,20 +40,20 @@ inline void used() { benchmark::ClobberMemory(); }
 /// memset of the same bytes) stand out in the report; every other one is a peer.
 class Contenders {
  public:
-  Contenders(std::string job, Extent extent, double units)
+  Contenders(const std::string& job, Extent extent, double units)
       : prefix_(job + "/" + std::to_string(extent.width) + "x" + std::to_string(extent.height) +
                 "/"),
         units_(units) {}
 
-  template <class Work>
-  void add(const std::string& contender, Work work) {
+  template <class Work> void add(const std::string& contender, Work work) {
     remember(prefix_, contender, units_);
-    benchmark::RegisterBenchmark((prefix_ + contender).c_str(), [work](benchmark::State& state) mutable {
-      for (auto _ : state) {
-        work();
-        used();
-      }
-    });
+    benchmark::RegisterBenchmark((prefix_ + contender).c_str(),
+                                 [work](benchmark::State& state) mutable {
+                                   for (auto _ : state) {
+                                     work();
+                                     used();
+                                   }
+                                 });
   }
 
  private:
@@ -64,8 +64,7 @@ class Contenders {
 
 /// Registers a job at the usual sizes (or those given): `describe(contenders, extent)` adds the
 /// contenders. Rates are in pixels.
-template <class Describe>
-void job(const std::string& name, Describe describe) {
+template <class Describe> void job(const std::string& name, Describe describe) {
   for (const Extent extent : kExtents) {
     Contenders contenders(name, extent, extent.pixels());
     describe(contenders, extent);

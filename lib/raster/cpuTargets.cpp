@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 //
 // Which instruction-set level the vector code runs at: the best one of the processor, or less when
-// the environment variable RASTER_CPU_LEVEL names one of scalar, ssse3, sse4, avx2, avx3. It is read
-// once, when the first vector function runs.
+// the environment variable RASTER_CPU_LEVEL names one of scalar, ssse3, sse4, avx2, avx3. It is
+// read once, when the first vector function runs.
 //
 // This takes the place of Highway's run-time library, of which the dispatch needs two functions.
 
@@ -39,7 +39,7 @@ bool supports(int64_t target) {
              RASTER_CPU_HAS("aes");
     case HWY_AVX2:
       return RASTER_CPU_HAS("avx2") && RASTER_CPU_HAS("bmi") && RASTER_CPU_HAS("bmi2") &&
-             RASTER_CPU_HAS("fma") && RASTER_CPU_HAS("f16c");
+             RASTER_CPU_HAS("fma");
     case HWY_AVX3:
       return RASTER_CPU_HAS("avx512f") && RASTER_CPU_HAS("avx512vl") &&
              RASTER_CPU_HAS("avx512dq") && RASTER_CPU_HAS("avx512bw") && RASTER_CPU_HAS("avx512cd");

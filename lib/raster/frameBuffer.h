@@ -24,8 +24,7 @@ inline Byte* rowAt(Byte* base, intptr_t pitch, uint32 y, uint32 x, size_t bytesP
 }
 
 /// The row after (or, with a negative step, before) the one at `row`.
-template <class Byte>
-inline Byte* nextRow(Byte* row, intptr_t step) {
+template <class Byte> inline Byte* nextRow(Byte* row, intptr_t step) {
   return rowAt(row, step, 1, 0, 0);
 }
 
@@ -42,21 +41,18 @@ inline intptr_t rowStep(intptr_t pitch, uint32 bytesPerPixel) {
 }
 
 /// One pixel of kBytes bytes, at any alignment.
-template <unsigned kBytes>
-inline uint32 loadPixel(const uint8* at) {
+template <unsigned kBytes> inline uint32 loadPixel(const uint8* at) {
   uint32 pixel = 0;
   memcpy(&pixel, at, kBytes);
   return pixel;
 }
-template <unsigned kBytes>
-inline void storePixel(uint8* at, uint32 pixel) {
+template <unsigned kBytes> inline void storePixel(uint8* at, uint32 pixel) {
   memcpy(at, &pixel, kBytes);
 }
 
 /// Calls `body` with the pixel size as a compile-time constant (1 to 4) and returns true; for any
 /// other size returns false.
-template <class Body>
-inline bool withPixelSize(uint32 bytesPerPixel, Body body) {
+template <class Body> inline bool withPixelSize(uint32 bytesPerPixel, Body body) {
   switch (bytesPerPixel) {
     case 1:
       body(std::integral_constant<unsigned, 1>());

@@ -15,7 +15,8 @@ struct Place {
   const char* source;
   int line;
   // Implicit, so that a call site names its module only.
-  constexpr Place(const char* path, int at = __builtin_LINE())  // NOLINT(google-explicit-constructor)
+  constexpr Place(const char* path,
+                  int at = __builtin_LINE())  // NOLINT(google-explicit-constructor)
       : source(path), line(at) {}
 };
 

@@ -4,7 +4,8 @@
 // planes, format conversion, comparison, blending, scaling, cursors, video and compression.
 //
 // Conventions that hold for every function unless it says otherwise:
-// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next) and
+// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next)
+// and
 //   a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel. Base and
 //   pitch may have any alignment. Nothing outside the named rectangle is read or written.
 // - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
@@ -45,11 +46,11 @@ TARNLIBS_EXPORT void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPix
 
 /// Copies a rectangle within a frame buffer or between two with the same pixel size.
 ///
-/// The rectangles may overlap when `dst` and `src` are the same frame buffer: rows run from the last
-/// one up when dstY > srcY and from the first one down otherwise, and a row whose start lies within
-/// the other's is moved as by memmove. `bytesPerPixel` may have any value, since bytes are copied.
-/// With rasterops_mmx set, rows that do not overlap bypass the cache when the rectangle has at least
-/// 32 bytes a row and 16 rows.
+/// The rectangles may overlap when `dst` and `src` are the same frame buffer: rows run from the
+/// last one up when dstY > srcY and from the first one down otherwise, and a row whose start lies
+/// within the other's is moved as by memmove. `bytesPerPixel` may have any value, since bytes are
+/// copied. With rasterops_mmx set, rows that do not overlap bypass the cache when the rectangle has
+/// at least 32 bytes a row and 16 rows.
 TARNLIBS_EXPORT void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPitch,
                                      uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
                                      uint32 dstY, uint32 width, uint32 height);

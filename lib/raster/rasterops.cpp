@@ -70,18 +70,19 @@ void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords
     if (isLong) {
       fillLongRow(row, bytes, from);
     } else {
-      forLanes(Bytes(), bytes, [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, from + i), d, row + i); });
+      forLanes(Bytes(), bytes,
+               [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, from + i), d, row + i); });
     }
   }
 }
 
-/// Copies rows of one to two blocks of `d`. A row is loaded whole before it is stored, so source and
-/// destination may overlap.
+/// Copies rows of one to two blocks of `d`. A row is loaded whole before it is stored, so source
+/// and destination may overlap.
 template <class D>
 void copyShortRows(D d, uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep,
                    size_t bytes, uint32 height) {
   if (bytes < hn::Lanes(d)) {
-    if constexpr (kLanes<D> > 1)
+    if constexpr (kLanes < D >> 1)
       copyShortRows(hn::Half<D>(), dst, dstStep, src, srcStep, bytes, height);
     return;
   }

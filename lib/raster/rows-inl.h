@@ -25,12 +25,10 @@ namespace raster::HWY_NAMESPACE {
 namespace hn = hwy::HWY_NAMESPACE;
 
 /// The number of lanes of a tag, at compile time.
-template <class D>
-inline constexpr size_t kLanes = hn::MaxLanes(D());
+template <class D> inline constexpr size_t kLanes = hn::MaxLanes(D());
 
 /// Loads and stores lanes of any width at any alignment.
-template <class D>
-HWY_INLINE hn::Vec<D> loadLanes(D d, const uint8* at) {
+template <class D> HWY_INLINE hn::Vec<D> loadLanes(D d, const uint8* at) {
 #if HWY_TARGET == HWY_SCALAR
   hn::TFromD<D> lane;
   memcpy(&lane, at, sizeof lane);
@@ -39,8 +37,7 @@ HWY_INLINE hn::Vec<D> loadLanes(D d, const uint8* at) {
   return hn::BitCast(d, hn::LoadU(hn::Repartition<uint8, D>(), at));
 #endif
 }
-template <class D>
-HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) {
+template <class D> HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) {
 #if HWY_TARGET == HWY_SCALAR
   (void)d;
   const hn::TFromD<D> lane = hn::GetLane(lanes);
@@ -58,19 +55,18 @@ HWY_INLINE void forRestOfLanes(D d, size_t first, size_t count, const Body& body
     body(d, first);
     first += hn::Lanes(d);
   }
-  if constexpr (kLanes<D> > 1) {
+  if constexpr (kLanes < D >> 1) {
     if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
   }
 }
 
 /// Runs body(tag, first) over the lanes [0, count) from left to right. `tag` says how many lanes
 /// from `first` on the call is for: those of `d`, and at the end of the row smaller ones.
-template <class D, class Body>
-HWY_INLINE void forLanes(D d, size_t count, const Body& body) {
+template <class D, class Body> HWY_INLINE void forLanes(D d, size_t count, const Body& body) {
   const size_t step = hn::Lanes(d);
   size_t first = 0;
   for (; count - first >= step; first += step) body(d, first);
-  if constexpr (kLanes<D> > 1) {
+  if constexpr (kLanes < D >> 1) {
     if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
   }
 }

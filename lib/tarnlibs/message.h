@@ -31,8 +31,7 @@ TARNLIBS_EXPORT void Warning(const char* format, ...) __attribute__((format(prin
 
 /// Reports a fatal fault and ends the process with abort(). It never returns to its caller: when
 /// an installed sink returns, the process still ends.
-TARNLIBS_EXPORT void Panic(const char* format, ...)
-    __attribute__((format(printf, 1, 2), noreturn));
+TARNLIBS_EXPORT void Panic(const char* format, ...) __attribute__((format(printf, 1, 2), noreturn));
 
 /// Installs the receiver of Log messages and returns the one before; null stands for the default,
 /// standard error.

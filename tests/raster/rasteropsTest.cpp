@@ -62,8 +62,8 @@ Place somePlace(Random& random, uint32 bytesPerPixel) {
 
 std::string describe(const Place& p) {
   return "base " + std::to_string(p.base) + " pitch " + std::to_string(p.pitch) + " at " +
-         std::to_string(p.x) + "," + std::to_string(p.y) + " size " + std::to_string(p.width) + "x" +
-         std::to_string(p.height) + " bytes " + std::to_string(p.bytesPerPixel);
+         std::to_string(p.x) + "," + std::to_string(p.y) + " size " + std::to_string(p.width) +
+         "x" + std::to_string(p.height) + " bytes " + std::to_string(p.bytesPerPixel);
 }
 
 TEST(Raster_RectFill, EqualsTheModelAndTouchesNothingElse) {
@@ -168,7 +168,8 @@ TEST(Raster_RectCopy, EqualsTheModelBetweenBuffers) {
 
       Raster_RectCopy(dst.data() + to.base, to.pitch, src.data() + from.base, from.pitch,
                       bytesPerPixel, from.x, from.y, to.x, to.y, to.width, to.height);
-      ASSERT_EQ(dst.bytes(), expected) << "round " << round << " mmx " << mmx << ": " << describe(to);
+      ASSERT_EQ(dst.bytes(), expected)
+          << "round " << round << " mmx " << mmx << ": " << describe(to);
       ASSERT_EQ(src.bytes(), source);
     }
   }

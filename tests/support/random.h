@@ -34,8 +34,7 @@ class Random {
     return static_cast<int32>(low + static_cast<int64>(next() % static_cast<uint64>(span)));
   }
 
-  template <class T>
-  T oneOf(std::initializer_list<T> values) {
+  template <class T> T oneOf(std::initializer_list<T> values) {
     return values.begin()[below(static_cast<uint32>(values.size()))];
   }
 
