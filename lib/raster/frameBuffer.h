@@ -40,6 +40,19 @@ inline intptr_t rowStep(intptr_t pitch, uint32 bytesPerPixel) {
   return wholeWords ? pitch & -static_cast<intptr_t>(bytesPerPixel) : pitch;
 }
 
+/// Rows of equal length: how many bytes each, how many rows.
+struct RowRun {
+  size_t bytes;
+  uint32 rows;
+};
+
+/// Rows that lie one after the other without a gap are one long row. For work that does not care
+/// where a row ends.
+inline RowRun joinRows(intptr_t step, size_t bytes, uint32 rows) {
+  const bool gapless = bytes != 0 && step == static_cast<intptr_t>(bytes) && rows != 0;
+  return gapless ? RowRun{bytes * rows, 1} : RowRun{bytes, rows};
+}
+
 /// One pixel of kBytes bytes, at any alignment.
 template <unsigned kBytes> inline uint32 loadPixel(const uint8* at) {
   uint32 pixel = 0;

@@ -37,42 +37,66 @@ void copyRows(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, 
 #else
 
 using Bytes = hn::ScalableTag<uint8>;
+using Words = hn::ScalableTag<uint32>;
 
-/// Fills a row of at least one vector. `pattern` is three vectors of pixels and the start of a
-/// fourth; the end of the row is stored as one vector that overlaps what is there already.
-HWY_INLINE void fillLongRow(uint8* row, size_t bytes, const uint8* pattern) {
+/// Constant pixels in memory: the start of a row, over three vectors long.
+struct Pattern {
+  uint8 bytes[4 * kLanes<Bytes>];
+};
+
+Pattern patternOf(PixelWords pixels) {
+  const Words d;
+  uint32 words[4 * kLanes<Words>];
+  hn::StoreInterleaved3(hn::Set(d, pixels.word[0]), hn::Set(d, pixels.word[1]),
+                        hn::Set(d, pixels.word[2]), d, words);
+  hn::StoreU(hn::LoadU(d, words), d, words + 3 * hn::Lanes(d));
+  Pattern pattern;
+  memcpy(&pattern, words, sizeof pattern);
+  return pattern;
+}
+
+/// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
+/// The end of a row is stored as one vector that overlaps what is there already.
+template <class V>
+HWY_INLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 height, V first,
+                             V second, V third, V last) {
   const Bytes d;
-  const size_t step = hn::Lanes(d);
-  const auto first = hn::LoadU(d, pattern);
-  const auto second = hn::LoadU(d, pattern + step);
-  const auto third = hn::LoadU(d, pattern + 2 * step);
-  size_t i = 0;
-  for (; bytes - i >= 3 * step; i += 3 * step) {
-    hn::StoreU(first, d, row + i);
-    hn::StoreU(second, d, row + i + step);
-    hn::StoreU(third, d, row + i + 2 * step);
+  const size_t n = hn::Lanes(d);
+  for (; height != 0; --height, row = nextRow(row, step)) {
+    size_t i = 0;
+    for (; bytes - i >= 3 * n; i += 3 * n) {
+      hn::StoreU(first, d, row + i);
+      hn::StoreU(second, d, row + i + n);
+      hn::StoreU(third, d, row + i + 2 * n);
+    }
+    if (bytes - i >= n) hn::StoreU(first, d, row + i);
+    if (bytes - i >= 2 * n) hn::StoreU(second, d, row + i + n);
+    hn::StoreU(last, d, row + bytes - n);
   }
-  if (bytes - i >= step) hn::StoreU(first, d, row + i);
-  if (bytes - i >= 2 * step) hn::StoreU(second, d, row + i + step);
-  const size_t last = bytes - step;
-  hn::StoreU(hn::LoadU(d, pattern + last % sizeof(PixelWords)), d, row + last);
+}
+
+void fillShortRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
+  const Pattern pattern = patternOf(pixels);
+  for (; height != 0; --height, row = nextRow(row, step)) {
+    forLanes(Bytes(), bytes,
+             [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, pattern.bytes + i), d, row + i); });
+  }
 }
 
 void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
-  const hn::ScalableTag<uint32> d32;
-  uint32 pattern[4 * kLanes<decltype(d32)>];
-  hn::StoreInterleaved3(hn::Set(d32, pixels.word[0]), hn::Set(d32, pixels.word[1]),
-                        hn::Set(d32, pixels.word[2]), d32, pattern);
-  hn::StoreU(hn::LoadU(d32, pattern), d32, pattern + 3 * hn::Lanes(d32));
-  const auto* from = reinterpret_cast<const uint8*>(pattern);
-  const bool isLong = bytes >= hn::Lanes(Bytes());
-  for (; height != 0; --height, row = nextRow(row, step)) {
-    if (isLong) {
-      fillLongRow(row, bytes, from);
-    } else {
-      forLanes(Bytes(), bytes,
-               [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, from + i), d, row + i); });
-    }
+  const Bytes d;
+  const size_t n = hn::Lanes(d);
+  if (bytes < n) {
+    fillShortRows(row, step, bytes, height, pixels);
+  } else if (pixels.word[0] == pixels.word[1] && pixels.word[1] == pixels.word[2]) {
+    const auto same = hn::BitCast(d, hn::Set(Words(), pixels.word[0]));
+    fillLongRows(row, step, bytes, height, same, same, same, same);
+  } else {
+    const Pattern pattern = patternOf(pixels);
+    const size_t lastPhase = (bytes - n) % sizeof pixels;
+    fillLongRows(row, step, bytes, height, hn::LoadU(d, pattern.bytes),
+                 hn::LoadU(d, pattern.bytes + n), hn::LoadU(d, pattern.bytes + 2 * n),
+                 hn::LoadU(d, pattern.bytes + lastPhase));
   }
 }
 
@@ -127,6 +151,7 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
+#include "kernelChoice.h"
 #include "mmxCopy.h"
 #include "panicPlace.h"
 #include "raster.h"
@@ -144,13 +169,61 @@ constexpr char kSource[] = "lib/raster/rasterops";
 constexpr size_t kMmxMinBytes = 32;
 constexpr uint32 kMmxMinRows = 16;
 
-const RasteropsKernels& kernels() { return *HWY_DYNAMIC_DISPATCH(rasteropsKernels)(); }
+const RasteropsKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(rasteropsKernels)(); }
+const RasteropsKernels& kernels() { return chosenKernels<lookUpKernels>(); }
 
-/// Whether a row of `bytes` bytes at `dst` overlaps one at `src`.
-bool rowsOverlap(const uint8* dst, const uint8* src, size_t bytes) {
+/// Whether `bytes` bytes at `dst` overlap as many at `src`.
+bool overlap(const uint8* dst, const uint8* src, size_t bytes) {
   const uintptr_t d = reinterpret_cast<uintptr_t>(dst);
   const uintptr_t s = reinterpret_cast<uintptr_t>(src);
   return s - bytes < d && d < s + bytes;
+}
+
+/// A copy of rows: the top row of both sides, and whether the rows are walked from the last one up.
+struct RowCopy {
+  uint8* dst;
+  intptr_t dstPitch;
+  const uint8* src;
+  intptr_t srcPitch;
+  size_t bytes;
+  uint32 height;
+  bool bottomUp;
+
+  /// Whether one move of all bytes does the same: the rows follow each other without a gap, and
+  /// where they overlap they are walked away from each other, as memmove does.
+  bool isOneMove() const {
+    if (dstPitch != srcPitch || joinRows(dstPitch, bytes, height).rows == height) return false;
+    if (!overlap(dst, src, bytes * height)) return true;
+    const bool movesUp = reinterpret_cast<uintptr_t>(dst) > reinterpret_cast<uintptr_t>(src);
+    return movesUp == bottomUp;
+  }
+
+  /// Whether the rows may be walked from the last one up and gain from it: a row that moves right
+  /// within itself is moved from its end, and memory is read fastest in one direction throughout.
+  /// Allowed while no row meets another one.
+  bool gainsFromBottomUp() const {
+    const uintptr_t distance = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
+    return dstPitch == srcPitch && dstPitch > 0 && distance != 0 && distance < bytes &&
+           distance + bytes <= static_cast<uintptr_t>(dstPitch);
+  }
+};
+
+void copyRows(const RowCopy& copy) {
+  const bool bottomUp = copy.bottomUp || copy.gainsFromBottomUp();
+  const uint32 first = bottomUp ? copy.height - 1 : 0;
+  uint8* const d = rowAt(copy.dst, copy.dstPitch, first, 0, 0);
+  const uint8* const s = rowAt(copy.src, copy.srcPitch, first, 0, 0);
+  const intptr_t dstStep = bottomUp ? -copy.dstPitch : copy.dstPitch;
+  const intptr_t srcStep = bottomUp ? -copy.srcPitch : copy.srcPitch;
+  const bool streams =
+      rasterops_mmx != 0 && copy.bytes >= kMmxMinBytes && copy.height >= kMmxMinRows;
+  if (streams && !overlap(d, s, copy.bytes)) {
+    mmxCopyRows(d, dstStep, s, srcStep, copy.bytes, copy.height);
+  } else if (copy.isOneMove()) {
+    kernels().copyRows(copy.dst, 0, copy.src, 0, copy.bytes * copy.height, 1);
+  } else {
+    kernels().copyRows(d, dstStep, s, srcStep, copy.bytes, copy.height);
+  }
 }
 
 }  // namespace
@@ -158,26 +231,23 @@ bool rowsOverlap(const uint8* dst, const uint8* src, size_t bytes) {
 void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
               uint32 width, uint32 height) {
   if (bytesPerPixel < 1 || bytesPerPixel > 4) unsupportedPixelSize(kSource);
-  kernels().fillRows(rowAt(fb, pitch, y, x, bytesPerPixel), rowStep(pitch, bytesPerPixel),
-                     size_t{width} * bytesPerPixel, height, repeatPixel(pixel, bytesPerPixel));
+  const intptr_t step = rowStep(pitch, bytesPerPixel);
+  const RowRun run = joinRows(step, size_t{width} * bytesPerPixel, height);
+  kernels().fillRows(rowAt(fb, pitch, y, x, bytesPerPixel), step, run.bytes, run.rows,
+                     repeatPixel(pixel, bytesPerPixel));
 }
 
 void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
               uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
               uint32 width, uint32 height) {
-  const bool bottomUp = dstY > srcY;
-  const uint32 firstRow = bottomUp ? height - 1 : 0;
-  const uint8* s = rowAt(src, srcPitch, srcY + firstRow, srcX, bytesPerPixel);
-  uint8* d = rowAt(dst, dstPitch, dstY + firstRow, dstX, bytesPerPixel);
-  const intptr_t srcStep = bottomUp ? -srcPitch : srcPitch;
-  const intptr_t dstStep = bottomUp ? -dstPitch : dstPitch;
-  const size_t bytes = size_t{width} * bytesPerPixel;
-  const bool streams = rasterops_mmx != 0 && bytes >= kMmxMinBytes && height >= kMmxMinRows;
-  if (streams && !rowsOverlap(d, s, bytes)) {
-    mmxCopyRows(d, dstStep, s, srcStep, bytes, height);
-  } else {
-    kernels().copyRows(d, dstStep, s, srcStep, bytes, height);
-  }
+  if (height == 0) return;
+  copyRows({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
+            .dstPitch = dstPitch,
+            .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
+            .srcPitch = srcPitch,
+            .bytes = size_t{width} * bytesPerPixel,
+            .height = height,
+            .bottomUp = dstY > srcY});
 }
 
 }  // namespace raster
@@ -198,9 +268,11 @@ void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPi
 
 void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y, uint32 width,
                           uint32 height) {
-  const intptr_t step = raster::pitchOf(pitch);
-  raster::kernels().fillAlphaRows(raster::rowAt(fb, step, y, x, 4), step, width, height,
-                                  uint32{alpha} << 24);
+  using namespace raster;
+  const intptr_t step = pitchOf(pitch);
+  const RowRun run = joinRows(step, size_t{width} * 4, height);
+  kernels().fillAlphaRows(rowAt(fb, step, y, x, 4), step, run.bytes / 4, run.rows,
+                          uint32{alpha} << 24);
 }
 
 }  // extern "C"
