@@ -1,0 +1,17 @@
+#!/bin/sh
+# The dynamic symbols that a library defines are exactly the names of its version script.
+# usage: exports.sh LIBRARY MAP
+set -eu
+library=$1
+map=$2
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+sed -n '/global:/,/local:/s/^ *\([A-Za-z_][A-Za-z0-9_]*\);.*/\1/p' "$map" | LC_ALL=C sort >"$work/named"
+nm -D --defined-only "$library" | awk '{print $3}' | sed 's/@.*//' | LC_ALL=C sort >"$work/defined"
+[ -s "$work/named" ] || { echo "no names found in $map"; exit 1; }
+
+diff "$work/named" "$work/defined" >"$work/difference" && exit 0
+echo "$library does not export what $map names (< missing, > not named):"
+cat "$work/difference"
+exit 1
