@@ -19,6 +19,20 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
 install(FILES ${PROJECT_BINARY_DIR}/rasterConfig.cmake ${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
   DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/raster)
 
+# The pkg-config files find their tree from where they lie, so an installed tree can be moved.
+if(IS_ABSOLUTE ${CMAKE_INSTALL_LIBDIR})
+  set(RASTER_PC_PREFIX ${CMAKE_INSTALL_PREFIX})
+  set(RASTER_PC_LIBDIR ${CMAKE_INSTALL_LIBDIR})
+else()
+  file(RELATIVE_PATH upward /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
+  set(RASTER_PC_PREFIX "\${pcfiledir}/${upward}")
+  set(RASTER_PC_LIBDIR "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
+endif()
+if(IS_ABSOLUTE ${CMAKE_INSTALL_INCLUDEDIR})
+  set(RASTER_PC_INCLUDEDIR ${CMAKE_INSTALL_INCLUDEDIR}/raster)
+else()
+  set(RASTER_PC_INCLUDEDIR "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}/raster")
+endif()
 foreach(package raster tarnlibs)
   configure_file(${CMAKE_CURRENT_LIST_DIR}/${package}.pc.in ${PROJECT_BINARY_DIR}/${package}.pc @ONLY)
   install(FILES ${PROJECT_BINARY_DIR}/${package}.pc

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// The layout of every public record, as C sees it, for 4-byte and 8-byte pointers. It compiles or it
-// does not; there is nothing to run.
+// The layout of every public record, as C sees it, for 4-byte and 8-byte pointers. It compiles or
+// it does not; there is nothing to run.
 
 #include <stddef.h>
 

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 //
-// Callers built for the old i386 convention enter with a stack that is aligned to 4 bytes only. Each
-// family of functions is called from such a stack, at each of the four offsets, and must give what it
-// gives from an aligned one.
+// Callers built for the old i386 convention enter with a stack that is aligned to 4 bytes only.
+// Each family of functions is called from such a stack, at each of the four offsets, and must give
+// what it gives from an aligned one.
 
 #include <cstdio>
 #include <cstdlib>
@@ -10,8 +10,8 @@
 
 #include "raster.h"
 
-/// Calls `function` with `count` argument words from a stack pointer that is `offset` above a multiple
-/// of 16, and returns its 32-bit result.
+/// Calls `function` with `count` argument words from a stack pointer that is `offset` above a
+/// multiple of 16, and returns its 32-bit result.
 extern "C" uint32 callFromStack(const void* function, const uint32* words, uint32 count,
                                 uint32 offset);
 asm(R"(
@@ -63,8 +63,7 @@ struct ArgumentWords {
   uint32 words[32];
   uint32 count = 0;
 
-  template <class T>
-  void add(T value) {
+  template <class T> void add(T value) {
     static_assert(sizeof value <= 8);
     uint32 raw[2] = {};
     memcpy(raw, &value, sizeof value);
@@ -92,7 +91,9 @@ const Case kCases[] = {
     {"Raster_RectFill",
      [](Memory& m) { call(m, Raster_RectFill, m.dst, kPitch, 4, 0x12345678, 1, 1, 70, 30); }},
     {"Raster_RectCopy",
-     [](Memory& m) { call(m, Raster_RectCopy, m.dst, kPitch, m.src, kPitch, 3, 1, 1, 2, 2, 70, 30); }},
+     [](Memory& m) {
+       call(m, Raster_RectCopy, m.dst, kPitch, m.src, kPitch, 3, 1, 1, 2, 2, 70, 30);
+     }},
     {"Raster_RectFillAlpha",
      [](Memory& m) { call(m, Raster_RectFillAlpha, m.dst, kPitch, 0x80, 1, 1, 70, 30); }},
 };

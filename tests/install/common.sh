@@ -1,0 +1,28 @@
+# Shared by the install tests; to be sourced. In the environment, from tests/install/CMakeLists.txt:
+# CMAKE SOURCE BUILD CC CXX TOOLCHAIN LDFLAGS PNG_FOLDER
+
+set -eu
+here=$SOURCE/tests/install
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+# Installs the build into $work/prefix.
+installHere() {
+  "$CMAKE" --install "$BUILD" --prefix "$work/prefix" >"$work/log" || { cat "$work/log"; exit 1; }
+  packages=$(dirname "$(find "$work/prefix" -name raster.pc)")
+  libraries=$(dirname "$packages")
+}
+
+# Runs a program with the installed libraries; libpng of the other word size is in a private folder.
+run() {
+  LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$@" || { echo "failed: $*"; exit 1; }
+}
+
+# Configures and builds a CMake project: configure FOLDER [ARGUMENT...]
+buildProject() {
+  folder=$1
+  shift
+  "$CMAKE" -S "$folder" -B "$work/build" ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} "$@" \
+    >"$work/log" 2>&1 && "$CMAKE" --build "$work/build" >>"$work/log" 2>&1 ||
+    { cat "$work/log"; exit 1; }
+}

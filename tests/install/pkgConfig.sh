@@ -1,0 +1,15 @@
+#!/bin/sh
+# The installed tree serves a C and a C++ program through pkg-config, wherever it was installed to.
+. "$(dirname "$0")/common.sh"
+command -v pkg-config >/dev/null || { echo "skipped: no pkg-config here"; exit 77; }
+installHere
+flags() { PKG_CONFIG_PATH=$packages pkg-config "$1" raster; }
+
+# Only what pkg-config says, the word size, and where libpng of that word size is.
+$CC -std=c11 "$here/consumer.c" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerC"
+$CXX -std=c++17 "$here/consumer.cpp" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerCpp"
+run "$work/consumerC"
+run "$work/consumerCpp"
+
+[ "$(flags --modversion)" = "$(PKG_CONFIG_PATH=$packages pkg-config --modversion tarnlibs)" ]
+PKG_CONFIG_PATH=$packages pkg-config --validate raster tarnlibs
