@@ -36,9 +36,9 @@ typedef struct Point {
 
 // ---- Rectangles --------------------------------------------------------------------------------
 //
-// Where a sum saturates, a + b is formed with wrap-around; when it went the wrong way the largest or
-// the smallest 32-bit number is stored instead, and the call returns false. Outputs may be the same
-// records as inputs. No pointer may be null unless it says so.
+// Where a sum saturates, a + b is formed with wrap-around; when it went the wrong way the largest
+// or the smallest 32-bit number is stored instead, and the call returns false. Outputs may be the
+// same records as inputs. No pointer may be null unless it says so.
 
 /// Fills `r` from an origin and a size. True when neither size is negative and neither sum
 /// saturated. A size of 0 is valid. A negative size collapses its side to the origin.
