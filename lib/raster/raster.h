@@ -176,17 +176,73 @@ typedef struct RectList {
 
 // NOLINTEND(modernize-use-using)
 
+// A sweep over the scanlines where rectangles begin or end rebuilds the whole list: a rectangle of
+// the result goes on downwards exactly as long as the region has the same horizontal extent there,
+// touching rectangles are joined, and rectangles are listed by top, then by x. The result has at
+// most 15 rectangles and fills the rest of the list with zeros. Any list is accepted, not only one
+// that came from here; the sums x + width and y + height must fit 32 bits, which is not checked. A
+// list must not be used by two threads at once.
+
+/// Sets all 16 entries to zero.
 TARNLIBS_EXPORT void Raster_ClearRectList(RectList* list);
+
+/// Adds a rectangle to the region and returns the area of the whole in pixels (modulo 2^32, as all
+/// areas here). When that takes more than 15 rectangles, the region becomes its bounding box.
+///
+/// A width or height of 0 (tested first) changes nothing and returns 0; a negative one ends in
+/// Panic("ASSERT %s:%d bugNr=%d\n") with "lib/raster/rasterRect" and 15740. When the first entry is
+/// empty by width or by height, the rectangle is stored there, its area is returned, and no other
+/// entry is touched.
+///
+/// Deliberate: the rectangle is first stored in the entry that ends the list. Old entries behind it
+/// come to life by that, but their tops and bottoms do not count as scanlines of the sweep.
+/// Deliberate: when all 16 entries are in use, the new rectangle is dropped and the list only
+/// rebuilt.
 TARNLIBS_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
+
+/// Takes a rectangle out of the region and returns the area that is left. A width or height of 0,
+/// or a list whose first entry is empty by width or by height, changes nothing and returns 0.
+/// When more than 15 rectangles would be left, or when a scanline of 16 spans would have to be
+/// split, the call ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterRect".
+///
+/// Deliberate: negative sizes are not rejected. A negative height takes out nothing; with a
+/// negative width a span that holds both x + width and x is left as two spans that overlap.
+/// Deliberate: when all 16 entries are in use, the tops and bottoms of the list alone are scanlines
+/// of the sweep, and the subtraction takes effect from one to the next of these.
 TARNLIBS_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
 
 // ---- Comparison --------------------------------------------------------------------------------
+//
+// In 4-byte pixels the fourth byte never counts. A broken precondition ends in
+// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterComp", without a warning. Positions and
+// sizes are not checked against the buffers. Memory is only read; pitches are in bytes.
 
+/// Compares the rectangle at (aX, aY) of `a` with the one at (bX, bY) of `b`, row by row from the
+/// top: 0 when they are equal, otherwise a number with memcmp's sign for the first byte that
+/// differs. Both bits per pixel must be the same multiple of 8, whatever the size of the rectangle.
 TARNLIBS_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 aBpp, const void* b,
                                            uint32 bPitch, int32 bBpp, uint32 aX, uint32 aY,
                                            uint32 bX, uint32 bY, uint32 width, uint32 height);
+
+/// Compares every rectangle of a list at the same position in both buffers: 0, or the first result
+/// of Raster_ComparePixels that is not 0. The bits per pixel are not looked at when the list is
+/// empty.
+///
+/// Deliberate: the walk ends at the first entry whose height or width is not positive and nowhere
+/// else, so after a full list there must be such an entry in memory.
 TARNLIBS_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aBpp, const void* b,
                                           uint32 bPitch, int32 bBpp, const RectList* rects);
+
+/// Whether two whole images agree under a mask, but for `maxDiffs` pixels' worth of bytes.
+///
+/// The mask has a byte for every byte of an image. With pixels of one byte a mask byte that is not
+/// 0 makes the byte count; with larger ones the mask's bits say which bits count. All three bits
+/// per pixel must be equal, all three pitches too, `x` and `y` must be 0, and the pitch must be
+/// `width` times the bytes per pixel (bits per pixel / 8, rounded up): rows follow each other
+/// without a gap. These are checked in this order. An image without bytes agrees.
+///
+/// Deliberate: differing bytes are counted, not pixels, against `maxDiffs` times the bytes per
+/// pixel; in 4-byte pixels (25 to 32 bits) the fourth byte is not counted but stands in the limit.
 TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 aBpp, const uint8* b,
                                           uint32 bPitch, int32 bBpp, const uint8* mask,
                                           uint32 maskPitch, int32 maskBpp, int32 x, int32 y,
