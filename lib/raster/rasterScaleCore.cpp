@@ -3,254 +3,205 @@
 // The scaler: destination rows from source rows that are resampled horizontally and kept for as
 // long as further destination rows need them.
 
-#include <algorithm>
-#include <cstdlib>
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/rasterScaleCore.cpp"
+#include "hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
 
+#include "rasterScaleColumns-inl.h"
 #include "rasterScaleInternal.h"
-#include "utilAlloc.h"
+#include "rasterScaleMemory.h"
+#include "rasterScaleRows-inl.h"
 
-namespace raster {
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
 namespace {
 
-constexpr uint32 kMaxRows = 32;
-constexpr uint32 kEvenBytes = 0x00FF00FF;
-constexpr uint32 kNoRow = ~0u;
-
-uint32 load(const uint8* at, uint32 bytesPerPixel) {
-  uint32 pixel = 0;
-  memcpy(&pixel, at, std::min<uint32>(bytesPerPixel, 4));
-  return pixel;
-}
-
-/// Two pixels mixed with byte weights: each channel is (c0 * w0 + c1 * w1) / 256, truncated.
-uint32 mix(uint32 p0, uint32 p1, uint32 w0, uint32 w1) {
-  const uint32 high = (p0 >> 8 & kEvenBytes) * w0 + (p1 >> 8 & kEvenBytes) * w1;
-  const uint32 low = (p0 & kEvenBytes) * w0 + (p1 & kEvenBytes) * w1;
-  return (high & ~kEvenBytes) | (low & ~kEvenBytes) >> 8;
-}
-
-/// Deliberate: the weights of a fraction add up to 255, so smoothed pixels are a shade darker.
-uint32 mixAt(uint32 p0, uint32 p1, uint32 position) {
-  const uint32 fraction = position & 0xFFFF;
-  return mix(p0, p1, (65535 - fraction) >> 8, fraction >> 8);
-}
-
-/// Sums of the four channels of weighted pixels, two to a word.
-struct Sums {
-  uint32 br = 0;
-  uint32 ga = 0;
-
-  void add(uint32 pixel) {
-    br += pixel & kEvenBytes;
-    ga += pixel >> 8 & kEvenBytes;
-  }
-  void add(uint32 pixel, uint32 weight) { add(mix(pixel, 0, weight, 0)); }
-
-  uint32 average(uint32 step) const {
-    const uint32 red = br / step & 255;
-    const uint32 blue = (br << 16) / step & 255;
-    const uint32 green = (ga << 16) / step & 255;
-    return ga / step << 24 | red << 16 | green << 8 | blue;
-  }
-};
-
-/// The source rows, resampled to the width of the destination, as 4-byte pixels.
+/// Source rows resampled to the width of the destination, as 4-byte pixels. Row numbers modulo the
+/// number of slots say where a row is kept.
 class RowCache {
  public:
-  explicit RowCache(const ScaleJob& job) : job_(job) {
-    if (job.smooth) slots_ = std::min(((job.stepY + 65535) >> 16) + 1, kMaxRows);
-    // Deliberate: a 24-bit row made from 32-bit pixels is read at 16 bytes a pixel.
-    pitch_ = job.width * (job.sizesDiffer && !job.depthsDiffer ? 4 : 1);
-    rows_ = static_cast<uint32*>(UtilSafeCalloc0(size_t{pitch_} * slots_, sizeof(uint32)));
-    std::fill_n(held_, slots_, kNoRow);
+  static size_t memoryFor(const ScaleJob& job) {
+    return slotsOf(job) * ScaleMemory::sizeOf<uint32>(Columns::rowPixels(job));
   }
-  ~RowCache() { free(rows_); }
-  RowCache(const RowCache&) = delete;
-  RowCache& operator=(const RowCache&) = delete;
 
-  /// The source row at a vertical position, which counts as signed.
-  const uint32* at(uint32 position) {
-    const auto y = static_cast<int32>(position);
-    const uint32 row = std::min(job_.srcHeight - 1, y < 0 ? 0 : position >> 16);
-    uint32* pixels = rows_ + size_t{row % slots_} * pitch_;
-    if (held_[row % slots_] != row) {
-      held_[row % slots_] = row;
-      resample(rowAt(job_.src, job_.srcPitch, row, 0, 0), pixels);
+  RowCache(const ScaleJob& job, const Columns& columns, ScaleMemory& memory)
+      : job_(job), columns_(columns), slots_(slotsOf(job)) {
+    const size_t pitch = Columns::rowPixels(job);
+    for (uint32 slot = 0; slot < slots_; ++slot) {
+      slot_[slot] = {memory.take<uint32>(pitch), kNoRow};
     }
-    return pixels;
+  }
+
+  /// The row at a vertical position.
+  const uint32* at(uint32 position) {
+    const uint32 row = job_.rowOf(position);
+    Slot& slot = slot_[row % slots_];
+    if (slot.row != row) {
+      slot.row = row;
+      columns_.resample(job_.srcRow(row), slot.pixels);
+    }
+    return slot.pixels;
   }
 
  private:
-  uint32 pixel(const uint8* row, uint32 column) const {
-    return load(row + size_t{column} * job_.srcBytesPerPixel, job_.srcBytesPerPixel);
-  }
+  static constexpr uint32 kNoRow = ~0u;
+  struct Slot {
+    uint32* pixels;
+    uint32 row;
+  };
 
-  void resample(const uint8* row, uint32* out) const {
-    uint32* const end = out + job_.width;
-    if (!job_.smooth || job_.stepX == kOnePixel) {
-      out = nearest(row, out, end);
-    } else if (job_.stepX < kOnePixel) {
-      out = enlarge(row, out, end);
-    } else {
-      out = reduce(row, out, end);
-    }
-    std::fill(out, end, pixel(row, job_.srcWidth - 1));
-  }
-
-  uint32* nearest(const uint8* row, uint32* out, const uint32* end) const {
-    for (uint32 x = job_.startX; out != end && x < job_.xLimit(); x += job_.stepX)
-      *out++ = pixel(row, x >> 16);
-    return out;
-  }
-
-  uint32* enlarge(const uint8* row, uint32* out, const uint32* end) const {
-    uint32 x = job_.startX - kOnePixel / 2;
-    for (; out != end && static_cast<int32>(x) < 0; x += job_.stepX) *out++ = pixel(row, 0);
-    for (; out != end && x < job_.xLimit(); x += job_.stepX)
-      *out++ = mixAt(pixel(row, x >> 16), pixel(row, (x >> 16) + 1), x);
-    return out;
-  }
-
-  uint32* reduce(const uint8* row, uint32* out, const uint32* end) const {
-    const uint32 limit = job_.xLimit();
-    for (uint32 x = job_.startX; out != end && x < limit;) {
-      Sums sums;
-      uint32 remaining = job_.stepX;
-      if ((x & 0xFFFF) != 0) {
-        const uint32 part = kOnePixel - (x & 0xFFFF);
-        sums.add(pixel(row, x >> 16), part >> 8);
-        remaining -= part;
-        x += part;
-      }
-      for (; x < limit && remaining >= kOnePixel; x += kOnePixel, remaining -= kOnePixel)
-        sums.add(pixel(row, x >> 16));
-      if (remaining != 0 && x < limit) {
-        sums.add(pixel(row, x >> 16), (remaining & 0xFFFF) >> 8);
-        x += remaining;
-      }
-      // Deliberate: the divisor is the whole step even where the source ended before.
-      *out++ = sums.average(job_.stepX);
-    }
-    return out;
+  static uint32 slotsOf(const ScaleJob& job) {
+    return job.smooth ? std::min(((job.stepY + 65535) >> 16) + 1, kMaxRows) : 1;
   }
 
   const ScaleJob& job_;
-  uint32 slots_ = 1;
-  uint32 pitch_ = 0;
-  uint32* rows_ = nullptr;
-  uint32 held_[kMaxRows];
+  const Columns& columns_;
+  const uint32 slots_;
+  Slot slot_[kMaxRows];
 };
 
-/// The source rows that one destination row averages, and their weights.
-struct WeightedRows {
-  const uint32* row[kMaxRows];
-  uint32 weight[kMaxRows];
-  uint32 count = 0;
-
-  void add(const uint32* pixels, uint32 rowWeight) {
-    row[count] = pixels;
-    weight[count++] = rowWeight;
-  }
-};
-
+/// The rows that the destination row at `y` averages: at most kMaxRows, a partial first one
+/// included.
 WeightedRows rowsOfStep(RowCache& cache, uint32 y, uint32 step) {
   WeightedRows rows;
+  rows.count = 0;
+  const auto add = [&](uint32 weight) {
+    rows.row[rows.count] = cache.at(y);
+    rows.weight[rows.count++] = weight;
+  };
   uint32 remaining = step;
-  if ((y & 0xFFFF) != 0) {
-    const uint32 part = kOnePixel - (y & 0xFFFF);
-    rows.add(cache.at(y), part >> 8);
+  if (fractionOf(y) != 0) {
+    const uint32 part = kOnePixel - fractionOf(y);
+    add(part >> 8);
     remaining -= part;
     y += part;
   }
   for (; remaining >= kOnePixel && rows.count < kMaxRows; y += kOnePixel, remaining -= kOnePixel)
-    rows.add(cache.at(y), 255);  // Deliberate: a whole row weighs 255/256, a whole pixel 1.
-  if (remaining != 0 && rows.count < kMaxRows) rows.add(cache.at(y), (remaining & 0xFFFF) >> 8);
+    add(kWholeRow);
+  if (remaining != 0 && rows.count < kMaxRows) add(fractionOf(remaining) >> 8);
   return rows;
 }
 
-class Scaler {
- public:
-  explicit Scaler(const ScaleJob& job) : job_(job), cache_(job) {}
-
-  void draw() {
-    uint8* dst = job_.dst;
-    uint32 y = job_.startY;
-    const bool mixes = job_.smooth && job_.stepY != kOnePixel;
-    if (mixes && job_.stepY < kOnePixel) y -= kOnePixel / 2;
-    for (uint32 i = 0; i < job_.height; ++i, y += job_.stepY, dst = nextRow(dst, job_.dstPitch)) {
-      if (!mixes) {
-        plainRow(dst, cache_.at(y));
-      } else if (job_.stepY < kOnePixel) {
-        mixedRow(dst, y);
-      } else {
-        averagedRow(dst, y);
-      }
-    }
-  }
-
- private:
-  uint8* pixelAt(uint8* row, uint32 i) const { return row + size_t{i} * job_.dstBytesPerPixel; }
-  void store(uint8* row, uint32 i, uint32 pixel) const {
-    memcpy(pixelAt(row, i), &pixel, std::min<uint32>(job_.dstBytesPerPixel, 4));
-  }
-
-  void plainRow(uint8* dst, const uint32* row) const {
-    if (job_.depthsDiffer) {
-      for (uint32 i = 0; i < job_.width; ++i) {
-        const uint32 v = row[i];
-        storePixel<2>(pixelAt(dst, i), (v & 0xF8) >> 3 | (v & 0xFC00) >> 5 | (v & 0xF80000) >> 8);
-      }
-    } else if (job_.sizesDiffer) {
-      for (uint32 i = 0; i + 1 < job_.width; ++i) storePixel<3>(pixelAt(dst, i), row[4 * i]);
+/// Mixed or averaged rows.
+template <unsigned kBytes> void drawSmoothRows(const ScaleJob& job, RowCache& cache) {
+  const bool enlarges = job.stepY < kOnePixel;
+  uint32 y = job.startY - (enlarges ? kHalfPixel : 0);
+  uint8* dst = job.dst;
+  for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
+    if (enlarges) {
+      const uint32* upper = cache.at(y);
+      mixRows<kBytes>(dst, upper, cache.at(y + kOnePixel), mixWeights(y), job.width);
     } else {
-      for (uint32 i = 0; i < job_.width; ++i) store(dst, i, row[i]);
-    }
-  }
-
-  void mixedRow(uint8* dst, uint32 y) {
-    const uint32* upper = cache_.at(y);
-    const uint32* lower = cache_.at(y + kOnePixel);
-    for (uint32 i = 0; i < job_.width; ++i) store(dst, i, mixAt(upper[i], lower[i], y));
-  }
-
-  void averagedRow(uint8* dst, uint32 y) {
-    const WeightedRows rows = rowsOfStep(cache_, y, job_.stepY);
-    for (uint32 i = 0; i < job_.width; ++i) {
-      Sums sums;
-      for (uint32 r = 0; r < rows.count; ++r) sums.add(rows.row[r][i], rows.weight[r]);
-      store(dst, i, sums.average(job_.stepY));
-    }
-  }
-
-  const ScaleJob& job_;
-  RowCache cache_;
-};
-
-/// Pixels of more than four bytes: nearest sampling, whole pixels.
-void copyWidePixels(const ScaleJob& job) {
-  const size_t size = job.srcBytesPerPixel;
-  for (uint32 i = 0; i < job.height; ++i) {
-    const uint32 y = job.startY + i * job.stepY;
-    const uint32 row = std::min(job.srcHeight - 1, static_cast<int32>(y) < 0 ? 0 : y >> 16);
-    const uint8* src = rowAt(job.src, job.srcPitch, row, 0, 0);
-    uint8* dst = rowAt(job.dst, job.dstPitch, i, 0, 0);
-    uint32 x = job.startX;
-    for (uint32 j = 0; j < job.width; ++j) {
-      const uint32 column = x < job.xLimit() ? x >> 16 : job.srcWidth - 1;
-      memcpy(dst + j * size, src + column * size, size);
-      if (x < job.xLimit()) x += job.stepX;
+      averageRows<kBytes>(dst, rowsOfStep(cache, y, job.stepY), job.stepY, job.width);
     }
   }
 }
+
+/// 24-bit pixels from a row of 32-bit ones. Deliberate: the walk takes every fourth pixel (16 bytes
+/// a step), zeros once the row is used up, and the last pixel of the destination stays as it was.
+void storeSparseRow(uint8* dst, const uint32* row, uint32 width, size_t bytesPerPixel) {
+  for (uint32 i = 0; i + 1 < width; ++i, dst += bytesPerPixel)
+    storePixel<3>(dst, size_t{4} * i < width ? row[size_t{4} * i] : 0);
+}
+
+/// One destination row from one source row without mixing.
+void storePlainRow(const ScaleJob& job, uint8* dst, const uint32* row) {
+  if (job.depthsDiffer && job.dstBytesPerPixel == 2) {
+    storeRow565(dst, row, job.width);
+  } else if (job.depthsDiffer) {
+    for (uint32 i = 0; i < job.width; ++i, dst += job.dstBytesPerPixel)
+      storePixel<2>(dst, to565(row[i]));
+  } else if (job.sizesDiffer) {
+    storeSparseRow(dst, row, job.width, job.dstBytesPerPixel);
+  } else if (job.dstBytesPerPixel == 4) {
+    storeRow<4>(dst, row, job.width);
+  } else if (job.dstBytesPerPixel == 3) {
+    storeRow<3>(dst, row, job.width);
+  } else {
+    for (uint32 i = 0; i < job.width; ++i)
+      memcpy(dst + size_t{i} * job.dstBytesPerPixel, row + i, job.dstBytesPerPixel);
+  }
+}
+
+/// Destination rows that are one source row each. Rows that show the same one are copied.
+void drawPlainRows(const ScaleJob& job, const Columns& columns, RowCache& cache) {
+  const size_t bytes = size_t{job.width} * job.dstBytesPerPixel;
+  const bool fillsPixels = job.depthsDiffer ? job.dstBytesPerPixel == 2 : !job.sizesDiffer;
+  const bool samples =
+      !job.smoothColumns() && !job.depthsDiffer && !job.sizesDiffer && job.dstBytesPerPixel == 4;
+  uint32 y = job.startY;
+  uint32 shown = 0;
+  uint8* dst = job.dst;
+  for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
+    const uint32 row = job.rowOf(y);
+    if (i != 0 && row == shown && fillsPixels) {
+      memcpy(dst, rowAt(dst, -job.dstPitch, 1, 0, 0), bytes);
+    } else if (samples) {
+      columns.sample(job.srcRow(row), dst);
+    } else {
+      storePlainRow(job, dst, cache.at(y));
+    }
+    shown = row;
+  }
+}
+
+/// Nearest sampling of pixels of any size.
+void drawWidePixels(const ScaleJob& job) {
+  const size_t size = job.srcBytesPerPixel;
+  uint8* dst = job.dst;
+  uint32 y = job.startY;
+  for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
+    const uint8* row = job.srcRow(job.rowOf(y));
+    uint32 x = job.startX;
+    for (uint32 j = 0; j < job.width; ++j) {
+      const bool inside = x < job.xLimit();
+      memcpy(dst + j * size, row + (inside ? x >> 16 : job.srcWidth - 1) * size, size);
+      if (inside) x += job.stepX;
+    }
+  }
+}
+
+void drawScaled(const ScaleJob& job) {
+  if (job.srcBytesPerPixel == 0) return;
+  if (job.srcBytesPerPixel > 4) return drawWidePixels(job);
+  ScaleMemory memory(Columns::memoryFor(job) + RowCache::memoryFor(job));
+  const Columns columns(job, memory);
+  RowCache cache(job, columns, memory);
+  if (!job.smoothRows()) {
+    drawPlainRows(job, columns, cache);
+  } else if (job.dstBytesPerPixel == 4) {
+    drawSmoothRows<4>(job, cache);
+  } else {
+    drawSmoothRows<3>(job, cache);
+  }
+}
+
+constexpr ScaleKernels kKernels = {drawScaled};
 
 }  // namespace
 
-void scaleCore(const ScaleJob& job) {
-  if (job.srcBytesPerPixel > 4) {
-    copyWidePixels(job);
-  } else if (job.dstBytesPerPixel != 0) {
-    Scaler(job).draw();
-  }
-}
+const ScaleKernels* scaleKernels() { return &kKernels; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
+#include "kernelChoice.h"
+
+namespace raster {
+namespace {
+
+HWY_EXPORT(scaleKernels);
+
+const ScaleKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(scaleKernels)(); }
+
+}  // namespace
+
+void scaleCore(const ScaleJob& job) { chosenKernels<lookUpKernels>().draw(job); }
 
 }  // namespace raster
+
+#endif

@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: MIT
+//
+// From resampled rows of 4-byte pixels to a row of the destination: as they are, mixed, or
+// averaged. Included once per instruction set.
+
+#if defined(RASTER_SCALE_ROWS_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef RASTER_SCALE_ROWS_INL_H
+#undef RASTER_SCALE_ROWS_INL_H
+#else
+#define RASTER_SCALE_ROWS_INL_H
+#endif
+
+#include "rasterScaleColumns-inl.h"
+#include "rasterScaleInternal.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+#if HWY_TARGET == HWY_SCALAR
+
+/// Calls pixel(i) for a row of `width` pixels and stores what it returns in pixels of kBytes.
+template <unsigned kBytes, class Pixel> void makeRow(uint8* dst, uint32 width, const Pixel& pixel) {
+  for (uint32 i = 0; i < width; ++i) storePixel<kBytes>(dst + size_t{i} * kBytes, pixel(i));
+}
+
+template <unsigned kBytes> void storeRow(uint8* dst, const uint32* row, uint32 width) {
+  makeRow<kBytes>(dst, width, [=](uint32 i) { return row[i]; });
+}
+
+void storeRow565(uint8* dst, const uint32* row, uint32 width) {
+  makeRow<2>(dst, width, [=](uint32 i) { return to565(row[i]); });
+}
+
+template <unsigned kBytes>
+void mixRows(uint8* dst, const uint32* upper, const uint32* lower, MixWeights weights,
+             uint32 width) {
+  makeRow<kBytes>(dst, width, [=](uint32 i) { return mixPixels(upper[i], lower[i], weights); });
+}
+
+template <unsigned kBytes>
+void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width) {
+  makeRow<kBytes>(dst, width, [&](uint32 i) {
+    ChannelSums sums;
+    for (uint32 r = 0; r < rows.count; ++r) sums.add(rows.row[r][i], rows.weight[r]);
+    return sums.average(step);
+  });
+}
+
+#else
+
+/// The three low bytes of each pixel, packed into the first 3 * kBlock bytes.
+HWY_INLINE PixelVec packThreeBytes(PixelVec pixels) {
+  const Pixels d;
+  const hn::Repartition<uint8, Pixels> d8;
+  alignas(64) static constexpr uint8 kPack[64] = {
+      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
+      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
+      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
+      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
+  alignas(64) static constexpr uint32 kClose8[8] = {0, 1, 2, 4, 5, 6, 7, 7};
+  alignas(64) static constexpr uint32 kClose16[16] = {0,  1,  2,  4,  5,  6,  8,  9,
+                                                      10, 12, 13, 14, 15, 15, 15, 15};
+  auto v = hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, pixels), hn::Load(d8, kPack)));
+  if constexpr (kBlock == 8) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kClose8));
+  if constexpr (kBlock == 16) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kClose16));
+  return v;
+}
+
+/// Calls pixels(i) for each block of a row and stores the `width` results in pixels of kBytes.
+template <unsigned kBytes, class Block>
+HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
+  static_assert(kBytes == 3 || kBytes == 4);
+  const Pixels d;
+  size_t i = 0;
+  if constexpr (kBytes == 4) {
+    for (; width - i >= kBlock; i += kBlock) storeLanes(d, block(i), dst + 4 * i);
+    if (i != width) storeSome(block(i), width - i, dst + 4 * i);
+  } else {
+    // A whole vector is stored while its excess lies within the row, and is then overwritten.
+    for (; width - i >= 2 * kBlock; i += kBlock)
+      storeLanes(d, packThreeBytes(block(i)), dst + 3 * i);
+    for (; i < width; i += kBlock) {
+      uint32 packed[kBlock];
+      hn::StoreU(packThreeBytes(block(i)), d, packed);
+      memcpy(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
+    }
+  }
+}
+
+template <unsigned kBytes> void storeRow(uint8* dst, const uint32* row, uint32 width) {
+  makeRow<kBytes>(dst, width, [=](size_t i) { return hn::LoadU(Pixels(), row + i); });
+}
+
+void storeRow565(uint8* dst, const uint32* row, uint32 width) {
+  const Pixels d;
+  const hn::Rebind<uint16, Pixels> d16;
+  const auto field = [&](PixelVec v, uint32 mask) { return hn::And(v, hn::Set(d, mask)); };
+  uint32 i = 0;
+  for (; width - i >= kBlock; i += kBlock) {
+    const PixelVec v = hn::LoadU(d, row + i);
+    const PixelVec packed =
+        hn::Or(hn::ShiftRight<3>(field(v, 0xF8)),
+               hn::Or(hn::ShiftRight<5>(field(v, 0xFC00)), hn::ShiftRight<8>(field(v, 0xF80000))));
+    storeLanes(d16, hn::TruncateTo(d16, packed), dst + size_t{2} * i);
+  }
+  for (; i < width; ++i) storePixel<2>(dst + size_t{2} * i, to565(row[i]));
+}
+
+template <unsigned kBytes>
+void mixRows(uint8* dst, const uint32* upper, const uint32* lower, MixWeights weights,
+             uint32 width) {
+  const HalvesVec w0 = hn::Set(Halves(), static_cast<uint16>(weights.first));
+  const HalvesVec w1 = hn::Set(Halves(), static_cast<uint16>(weights.second));
+  makeRow<kBytes>(dst, width, [&](size_t i) {
+    return mixLanes(hn::LoadU(Pixels(), upper + i), hn::LoadU(Pixels(), lower + i), w0, w1);
+  });
+}
+
+template <unsigned kBytes>
+void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width) {
+  withDivider(step, rows.count, [&](const auto& divider) {
+    makeRow<kBytes>(dst, width, [&](size_t i) {
+      LaneSums sums = noSums();
+      for (uint32 r = 0; r < rows.count; ++r) {
+        sums.add(hn::LoadU(Pixels(), rows.row[r] + i),
+                 hn::Set(Halves(), static_cast<uint16>(rows.weight[r])));
+      }
+      return divider.average(sums.br, sums.ga);
+    });
+  });
+}
+
+#endif
+
+}  // namespace
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif
