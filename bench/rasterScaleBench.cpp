@@ -115,19 +115,16 @@ __attribute__((target("avx2")))
 uint64
 readAll(const uint8* bytes, size_t count) {
   using Vector = uint64 __attribute__((vector_size(32)));
-  const auto at = [bytes](size_t i) {
-    Vector v;
-    memcpy(&v, bytes + i, sizeof v);
-    return v;
-  };
-  Vector a = {}, b = {}, c = {}, d = {};
-  for (size_t i = 0; i + 128 <= count; i += 128) {
-    a ^= at(i);
-    b ^= at(i + 32);
-    c ^= at(i + 64);
-    d ^= at(i + 96);
+  Vector sums[4] = {};
+  for (size_t i = 0; i + sizeof sums <= count; i += sizeof sums) {
+    Vector at[4];
+    memcpy(at, bytes + i, sizeof at);
+    sums[0] ^= at[0];
+    sums[1] ^= at[1];
+    sums[2] ^= at[2];
+    sums[3] ^= at[3];
   }
-  const Vector all = a ^ b ^ c ^ d;
+  const Vector all = sums[0] ^ sums[1] ^ sums[2] ^ sums[3];
   return all[0] ^ all[1] ^ all[2] ^ all[3];
 }
 
