@@ -1,11 +1,210 @@
 // SPDX-License-Identifier: MIT
 //
 // YUV video frames to packed RGB.
+//
+// Each source layout says where a group's luma and chroma are, each packing (yuvColour-inl.h) what
+// becomes of a colour; one loop runs all of them.
 
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/rasterYuv.cpp"
+#include "hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include "frameBuffer.h"
+#include "rasterYuvInternal.h"
+#include "videoColour.h"
+#include "yuvColour-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+/// One set of rows of a packed layout: a luma byte and a chroma byte alternate.
+/// Deliberate: a group's first chroma byte is the red-difference, its second the blue-difference.
+template <bool kLumaFirst> struct PackedRows {
+  static constexpr size_t kRows = 1;
+  const uint8* bytes;
+
+  PackedRows(const YuvFrame& frame, uint32 set) : bytes(frame.luma.first + set * frame.luma.step) {}
+
+#if HWY_TARGET == HWY_SCALAR
+  uint8 luma(size_t pixel, size_t /*row*/) const { return bytes[2 * pixel + (kLumaFirst ? 0 : 1)]; }
+  uint8 cr(size_t group) const { return bytes[4 * group + (kLumaFirst ? 1 : 0)]; }
+  uint8 cb(size_t group) const { return bytes[4 * group + (kLumaFirst ? 3 : 2)]; }
+#else
+  explicit PackedRows(const uint8* first) : bytes(first) {}
+
+  template <class P, class D>
+  HWY_INLINE Unsigned16<D> luma(P /*packing*/, D d, size_t group, size_t /*row*/) const {
+    const auto v = load<P>(d, group);
+    return kLumaFirst ? hn::And(v, hn::Set(hn::RebindToUnsigned<D>(), uint16{0xFF}))
+                      : hn::ShiftRight<8>(v);
+  }
+  template <class P, class D> HWY_INLINE Chroma<D> chroma(P /*packing*/, D d, size_t group) const {
+    const hn::RebindToUnsigned<D> du;
+    const auto v = load<P>(d, group);
+    if (kLumaFirst) return {hn::And(v, hn::Set(du, uint16{0xFF00})), hn::ShiftRight<8>(v)};
+    return {hn::ShiftLeft<8>(v), hn::And(v, hn::Set(du, uint16{0xFF}))};
+  }
+
+  /// Calls `body` with a copy of the groups from `group` on that has as many as a block.
+  template <class Body> void padded(size_t group, size_t groups, const Body& body) const {
+    uint8 copy[16] = {};
+    memcpy(copy, bytes + 4 * group, 4 * groups);
+    body(PackedRows(copy));
+  }
+
+ private:
+  template <class P, class D> HWY_INLINE Unsigned16<D> load(D /*d*/, size_t group) const {
+    const hn::RebindToUnsigned<D> du;
+    return P::arrange(du, loadLanes(du, bytes + 4 * group));
+  }
+#endif
+};
+
+/// A pair of rows of the planar layout.
+struct PlanarRows {
+  static constexpr size_t kRows = 2;
+  const uint8* lumas;
+  size_t lumaPitch;
+  const uint8* cbs;
+  const uint8* crs;
+
+  PlanarRows(const YuvFrame& frame, uint32 set)
+      : lumas(frame.luma.first + set * frame.luma.step),
+        lumaPitch(frame.lumaPitch),
+        cbs(frame.cb.first + set * frame.cb.step),
+        crs(frame.cr.first + set * frame.cr.step) {}
+
+#if HWY_TARGET == HWY_SCALAR
+  uint8 luma(size_t pixel, size_t row) const { return lumas[row * lumaPitch + pixel]; }
+  uint8 cr(size_t group) const { return crs[group]; }
+  uint8 cb(size_t group) const { return cbs[group]; }
+#else
+  PlanarRows(const uint8* luma, size_t pitch, const uint8* cb, const uint8* cr)
+      : lumas(luma), lumaPitch(pitch), cbs(cb), crs(cr) {}
+
+  template <class P, class D>
+  HWY_INLINE Unsigned16<D> luma(P /*packing*/, D /*d*/, size_t group, size_t row) const {
+    const hn::RebindToUnsigned<D> du;
+    const hn::Rebind<uint8, D> bytes;
+    return P::arrange(du, hn::PromoteTo(du, hn::LoadU(bytes, lumas + row * lumaPitch + 2 * group)));
+  }
+  template <class P, class D>
+  HWY_INLINE Chroma<D> chroma(P /*packing*/, D /*d*/, size_t group) const {
+    const hn::RebindToUnsigned<D> du;
+    const hn::RepartitionToWide<decltype(du)> wide;
+    const hn::Rebind<uint8, decltype(wide)> bytes;
+    const auto cr = hn::PromoteTo(wide, hn::LoadU(bytes, crs + group));
+    const auto cb = hn::PromoteTo(wide, hn::LoadU(bytes, cbs + group));
+    const auto lower = P::arrange(du, hn::BitCast(du, hn::Or(cr, hn::ShiftLeft<16>(cb))));
+    return {hn::ShiftLeft<8>(lower), lower};
+  }
+
+  template <class Body> void padded(size_t group, size_t groups, const Body& body) const {
+    uint8 copy[4][8] = {};
+    memcpy(copy[0], lumas + 2 * group, 2 * groups);
+    memcpy(copy[1], lumas + lumaPitch + 2 * group, 2 * groups);
+    memcpy(copy[2], cbs + group, groups);
+    memcpy(copy[3], crs + group, groups);
+    body(PlanarRows(copy[0], sizeof copy[0], copy[2], copy[3]));
+  }
+#endif
+};
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <class Rows, class P>
+void convertRows(const Rows& rows, uint8* dst, size_t dstPitch, size_t groups) {
+  for (size_t row = 0; row < Rows::kRows; ++row, dst += dstPitch) {
+    for (size_t pixel = 0; pixel < 2 * groups; ++pixel) {
+      const Rgb c = colourOf(rows.luma(pixel, row), rows.cb(pixel / 2), rows.cr(pixel / 2), 128);
+      storePixel<P::kBytes>(dst + pixel * P::kBytes, P::pack(c.r, c.g, c.b));
+    }
+  }
+}
+
+#else
+
+/// Converts the groups of one vector.
+template <class P, class Rows, class D>
+HWY_INLINE void convertBlock(D d, const Rows& rows, size_t group, uint8* dst, size_t dstPitch) {
+  const auto chroma = chromaTerms(d, rows.chroma(P(), d, group));
+  for (size_t row = 0; row < Rows::kRows; ++row)
+    P::store(d, colourSums(d, rows.luma(P(), d, group, row), chroma), dst + row * dstPitch);
+}
+
+/// Converts less than a block of 16 bytes: as such a block, from and to a copy.
+template <class Rows, class P>
+HWY_INLINE void convertRest(const Rows& rows, size_t group, size_t groups, uint8* dst,
+                            size_t dstPitch) {
+  const hn::Full128<int16> d;
+  constexpr size_t kBlockBytes = 8 * P::kBytes;
+  rows.padded(group, groups, [&](const Rows& copy) HWY_ATTR {
+    uint8 pixels[Rows::kRows * kBlockBytes];
+    convertBlock<P>(d, copy, 0, pixels, kBlockBytes);
+    for (size_t row = 0; row < Rows::kRows; ++row)
+      memcpy(dst + row * dstPitch, pixels + row * kBlockBytes, groups * 2 * P::kBytes);
+  });
+}
+
+/// Whole vectors, then smaller ones, down to the rest.
+template <class Rows, class P, class D>
+HWY_INLINE void convertFrom(D d, const Rows& rows, size_t group, size_t groups, uint8* dst,
+                            size_t dstPitch) {
+  constexpr size_t kStep = kLanes<D> / 2;
+  constexpr size_t kGroupBytes = 2 * P::kBytes;
+  for (; groups - group >= kStep; group += kStep)
+    convertBlock<P>(d, rows, group, dst + group * kGroupBytes, dstPitch);
+  if (group == groups) return;
+  if constexpr (kLanes < D >> 8) {
+    convertFrom<Rows, P>(hn::Half<D>(), rows, group, groups, dst, dstPitch);
+  } else {
+    convertRest<Rows, P>(rows, group, groups - group, dst + group * kGroupBytes, dstPitch);
+  }
+}
+
+template <class Rows, class P>
+void convertRows(const Rows& rows, uint8* dst, size_t dstPitch, size_t groups) {
+  convertFrom<Rows, P>(Lanes16(), rows, 0, groups, dst, dstPitch);
+}
+
+#endif
+
+template <class Rows, class P> void convertFrame(const YuvFrame& frame) {
+  for (uint32 set = 0; set < frame.rowSets; ++set)
+    convertRows<Rows, P>(Rows(frame, set), frame.dst + set * frame.dstStep, frame.dstPitch,
+                         frame.groups);
+}
+
+using Yuy2 = PackedRows<true>;
+using Uyvy = PackedRows<false>;
+using Yv12 = PlanarRows;
+
+constexpr YuvKernels kKernels = {{
+    {convertFrame<Yuy2, Packing15>, convertFrame<Yuy2, Packing16>, convertFrame<Yuy2, Packing24>,
+     convertFrame<Yuy2, Packing32>},
+    {convertFrame<Uyvy, Packing15>, convertFrame<Uyvy, Packing16>, convertFrame<Uyvy, Packing24>,
+     convertFrame<Uyvy, Packing32>},
+    {convertFrame<Yv12, Packing15>, convertFrame<Yv12, Packing16>, convertFrame<Yv12, Packing24>,
+     convertFrame<Yv12, Packing32>},
+}};
+
+}  // namespace
+
+const YuvKernels* yuvKernels() { return &kKernels; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
+#include <atomic>
 #include <cassert>
 
 #include "firstTime.h"
-#include "frameBuffer.h"
+#include "kernelChoice.h"
 #include "message.h"
 #include "raster.h"
 #include "videoAttributes.h"
@@ -13,80 +212,66 @@
 namespace raster {
 namespace {
 
-struct Rgb {
-  uint32 r, g, b;
+HWY_EXPORT(yuvKernels);
+
+const YuvKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(yuvKernels)(); }
+
+/// An output format: its place in the kernel table and its pixel size.
+struct Output {
+  uint32 index;
+  uint32 bytes;
 };
+constexpr Output kNoOutput = {4, 0};
 
-uint32 clampToByte(int32 v) { return static_cast<uint32>(v < 0 ? 0 : v > 255 ? 255 : v); }
-
-/// BT.601, limited range, in 8 bits of fraction; `rounding` is added before they are dropped.
-Rgb toRgb(int32 y, int32 cb, int32 cr, int32 rounding) {
-  const int32 luma = 298 * (y - 16) + rounding;
-  return {clampToByte((luma + 409 * (cr - 128)) >> 8),
-          clampToByte((luma - 100 * (cb - 128) - 208 * (cr - 128)) >> 8),
-          clampToByte((luma + 516 * (cb - 128)) >> 8)};
-}
-
-template <unsigned kSize, unsigned kRs, unsigned kGs, unsigned kGw, unsigned kBw, unsigned kFs>
-struct Packing {
-  static constexpr unsigned kBytes = kSize;
-  static uint32 pack(Rgb c) {
-    return ((((c.r >> kRs) << kGw | c.g >> kGs) << kBw) | c.b >> kRs) << kFs;
-  }
-};
-using Packing15 = Packing<2, 3, 3, 5, 5, 1>;
-using Packing16 = Packing<2, 3, 2, 6, 5, 0>;
-using Packing24 = Packing<3, 0, 0, 8, 8, 0>;
-using Packing32 = Packing<4, 0, 0, 8, 8, 0>;
-
-template <class P> void convertPixel(uint8* dst, uint8 y, uint8 cb, uint8 cr) {
-  storePixel<P::kBytes>(dst, P::pack(toRgb(y, cb, cr, 128)));
-}
-
-template <class P, unsigned kLuma> void packedGroups(const uint8* src, uint8* dst, size_t groups) {
-  for (; groups != 0; --groups, src += 4, dst += 2 * P::kBytes) {
-    const uint8 cr = src[1 - kLuma];
-    const uint8 cb = src[3 - kLuma];
-    convertPixel<P>(dst, src[kLuma], cb, cr);
-    convertPixel<P>(dst + P::kBytes, src[kLuma + 2], cb, cr);
+constexpr Output outputOf(int32 bppdepth) {
+  switch (bppdepth) {
+    case 15:
+      return {0, 2};
+    case 16:
+      return {1, 2};
+    case 24:
+      return {2, 3};
+    case 32:
+      return {3, 4};
+    default:
+      return kNoOutput;
   }
 }
 
-template <class P>
-void planarRows(const uint8* src, uint8* dst, uint32 width, uint32 height, const uint32* pitches,
-                const uint32* offsets) {
-  const uint8* luma = src;
-  const uint8* cb = src + offsets[1];
-  const uint8* cr = src + offsets[2];
-  const size_t dstPitch = size_t{width} * P::kBytes;
-  for (uint32 rows = height / 2; rows != 0; --rows) {
-    for (uint32 i = 0; i < width / 2; ++i) {
-      for (uint32 x = 2 * i; x < 2 * i + 2; ++x) {
-        convertPixel<P>(dst + size_t{x} * P::kBytes, luma[x], cb[i], cr[i]);
-        convertPixel<P>(dst + dstPitch + size_t{x} * P::kBytes, luma[pitches[0] + x], cb[i], cr[i]);
-      }
-    }
-    luma += 2 * size_t{pitches[0]};
-    cb += pitches[1];
-    cr += pitches[2];
-    dst += dstPitch + size_t{width / 2 * 2} * P::kBytes;
-  }
+YuvFrame packedFrame(const uint8* src, uint8* dst, uint32 width, uint32 height) {
+  const size_t groups = static_cast<size_t>(uint64{width} * height / 2);
+  return {.luma = {src, 0}, .groups = groups, .rowSets = 1, .dst = dst};
 }
 
-template <class P>
-void convertFrame(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 format) {
+/// Deliberate: with an odd width the output of every row pair begins one pixel earlier than its
+/// row does, as the pairs before it moved on by whole groups.
+YuvFrame planarFrame(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 bytes) {
   uint32 size = 0;
   uint32 pitches[3];
   uint32 offsets[3];
-  const size_t groups = size_t{width} * height / 2;
+  RasterComputeVideoAttributes(kFormatYv12, width, height, &size, pitches, offsets);
+  const size_t dstPitch = size_t{width} * bytes;
+  return {.luma = {src + offsets[0], 2 * size_t{pitches[0]}},
+          .cb = {src + offsets[1], pitches[1]},
+          .cr = {src + offsets[2], pitches[2]},
+          .lumaPitch = pitches[0],
+          .groups = width / 2,
+          .rowSets = height / 2,
+          .dst = dst,
+          .dstPitch = dstPitch,
+          .dstStep = dstPitch + size_t{width / 2 * 2} * bytes};
+}
+
+void yuvToRgb(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 format,
+              Output output) {
+  const YuvKernels& kernels = chosenKernels<lookUpKernels>();
   switch (format) {
     case kFormatYuy2:
-      return packedGroups<P, 0>(src, dst, groups);
+      return kernels.convert[0][output.index](packedFrame(src, dst, width, height));
     case kFormatUyvy:
-      return packedGroups<P, 1>(src, dst, groups);
+      return kernels.convert[1][output.index](packedFrame(src, dst, width, height));
     case kFormatYv12:
-      RasterComputeVideoAttributes(format, width, height, &size, pitches, offsets);
-      return planarRows<P>(src, dst, width, height, pitches, offsets);
+      return kernels.convert[2][output.index](planarFrame(src, dst, width, height, output.bytes));
     default:
       break;
   }
@@ -102,36 +287,25 @@ extern "C" {
 void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 format,
                      int32 bppdepth) {
   using namespace raster;
-  switch (bppdepth) {
-    case 15:
-      return convertFrame<Packing15>(src, dst, width, height, format);
-    case 16:
-      return convertFrame<Packing16>(src, dst, width, height, format);
-    case 24:
-      return convertFrame<Packing24>(src, dst, width, height, format);
-    case 32:
-      return convertFrame<Packing32>(src, dst, width, height, format);
-    default:
-      break;
-  }
+  const Output output = outputOf(bppdepth);
+  if (output.bytes != 0) return yuvToRgb(src, dst, width, height, format, output);
   static constinit std::atomic<bool> said{false};
   if (firstTime(said)) Log("%s: bppdepth:%d not supported.\n", "Raster_YUVtoRGB", bppdepth);
 }
 
 uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v) {
-  return raster::Packing32::pack(raster::toRgb(y, u, v, 0));
+  const raster::Rgb c = raster::colourOf(y, u, v, 0);
+  return c.r << 16 | c.g << 8 | c.b;
 }
 
 uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask) {
-  assert(bits != 0 && mask != 0);
-  const int32 low = __builtin_ctz(mask);
+  assert(bits != 0 && bits <= 32 && mask != 0);
+  const uint32 low = static_cast<uint32>(__builtin_ctz(mask));
   const uint32 field = mask >> low;
-  const int32 run = ~field == 0 ? 32 : __builtin_ctz(~field);
-  const int32 step = static_cast<int32>(bits);
-  const int32 total = (run + step - 1) / step * step;
-  // Up to 2^63: a total of more than 63 bits comes of components over 32 bits wide.
+  const uint32 run = field == ~0u ? 32 : static_cast<uint32>(__builtin_ctz(~field));
+  const uint32 total = (run + bits - 1) / bits * bits;  // at most 62
   const uint64 multiplier = ((uint64{1} << total) - 1) / ((uint64{1} << bits) - 1);
-  const int32 shift = total - run - low;
+  const int32 shift = static_cast<int32>(total - run) - static_cast<int32>(low);
   param->multiplier = static_cast<uint32>(shift < 0 ? multiplier << -shift : multiplier);
   param->shift = static_cast<uint32>(shift < 0 ? 0 : shift);
   param->mask = mask;
@@ -139,3 +313,5 @@ uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask) {
 }
 
 }  // extern "C"
+
+#endif

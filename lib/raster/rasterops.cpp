@@ -11,6 +11,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "pixelPattern-inl.h"
 #include "rasteropsInternal.h"
 #include "rows-inl.h"
 
@@ -39,22 +40,6 @@ void copyRows(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, 
 using Bytes = hn::ScalableTag<uint8>;
 using Words = hn::ScalableTag<uint32>;
 
-/// Constant pixels in memory: the start of a row, over three vectors long.
-struct Pattern {
-  uint8 bytes[4 * kLanes<Bytes>];
-};
-
-Pattern patternOf(PixelWords pixels) {
-  const Words d;
-  uint32 words[4 * kLanes<Words>];
-  hn::StoreInterleaved3(hn::Set(d, pixels.word[0]), hn::Set(d, pixels.word[1]),
-                        hn::Set(d, pixels.word[2]), d, words);
-  hn::StoreU(hn::LoadU(d, words), d, words + 3 * hn::Lanes(d));
-  Pattern pattern;
-  memcpy(&pattern, words, sizeof pattern);
-  return pattern;
-}
-
 /// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
 /// The end of a row is stored as one vector that overlaps what is there already.
 template <class V>
@@ -76,7 +61,7 @@ HWY_INLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 hei
 }
 
 void fillShortRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
-  const Pattern pattern = patternOf(pixels);
+  const PixelPattern pattern = patternOf(pixels);
   for (; height != 0; --height, row = nextRow(row, step)) {
     forLanes(Bytes(), bytes,
              [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, pattern.bytes + i), d, row + i); });
@@ -92,7 +77,7 @@ void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords
     const auto same = hn::BitCast(d, hn::Set(Words(), pixels.word[0]));
     fillLongRows(row, step, bytes, height, same, same, same, same);
   } else {
-    const Pattern pattern = patternOf(pixels);
+    const PixelPattern pattern = patternOf(pixels);
     const size_t lastPhase = (bytes - n) % sizeof pixels;
     fillLongRows(row, step, bytes, height, hn::LoadU(d, pattern.bytes),
                  hn::LoadU(d, pattern.bytes + n), hn::LoadU(d, pattern.bytes + 2 * n),

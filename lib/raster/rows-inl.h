@@ -71,6 +71,28 @@ template <class D, class Body> HWY_INLINE void forLanes(D d, size_t count, const
   }
 }
 
+/// forLanesFromRight for the rest of a row, [0, count), that is shorter than two blocks of `d`.
+template <class D, class Body>
+HWY_INLINE void forRestOfLanesFromRight(D d, size_t count, const Body& body) {
+  if (count >= hn::Lanes(d)) {
+    count -= hn::Lanes(d);
+    body(d, count);
+  }
+  if constexpr (kLanes < D >> 1) {
+    if (count != 0) forRestOfLanesFromRight(hn::Half<D>(), count, body);
+  }
+}
+
+/// As forLanes, from right to left: the smaller blocks are at the start of the row.
+template <class D, class Body>
+HWY_INLINE void forLanesFromRight(D d, size_t count, const Body& body) {
+  const size_t step = hn::Lanes(d);
+  for (; count >= step; count -= step) body(d, count - step);
+  if constexpr (kLanes < D >> 1) {
+    if (count != 0) forRestOfLanesFromRight(hn::Half<D>(), count, body);
+  }
+}
+
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 

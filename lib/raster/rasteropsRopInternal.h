@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+//
+// Raster operations on rows, for the modules that have found their rows already.
+
+#ifndef RASTER_RASTEROPS_ROP_INTERNAL_H
+#define RASTER_RASTEROPS_ROP_INTERNAL_H
+
+#include "frameBuffer.h"
+
+namespace raster {
+
+inline constexpr uint32 kRopCount = 16;
+inline constexpr uint32 kRopCopy = 3;
+inline constexpr uint32 kRopNoop = 5;
+
+/// Source rows and destination rows: the leftmost byte of the first row to be processed, the signed
+/// step to the next one, and the size of both.
+struct RopRows {
+  uint8* dst;
+  intptr_t dstStep;
+  const uint8* src;
+  intptr_t srcStep;
+  size_t bytes;
+  uint32 height;
+};
+
+/// Runs over rows of one instruction-set level, from the first row to the last one.
+using RopRowsKernel = void (*)(const RopRows& rows);
+
+/// What the kernels of one instruction-set level offer.
+struct RopKernels {
+  /// A kernel handles at most so many bytes of a row before it stores them.
+  size_t stepBytes;
+  /// d = d & keep ^ flip.
+  void (*fillRows)(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords keep,
+                   PixelWords flip);
+  /// By operation. Rows are walked to the right, or to the left.
+  const RopRowsKernel* toRight;
+  const RopRowsKernel* toLeft;
+};
+
+/// The order of the pixels in a row.
+enum class RopWalk { kToRight, kToLeft };
+
+/// Applies operation `rop` (0 to 15) to rows of pixels of `bytesPerPixel` (1 to 4) bytes. The
+/// result is that of reading, combining and storing one pixel after the other (one byte after the
+/// other in pixels of three), wherever source and destination lie.
+void ropRows(const RopRows& rows, uint32 bytesPerPixel, uint32 rop, RopWalk walk);
+
+}  // namespace raster
+
+#endif
