@@ -100,8 +100,6 @@ void decompress(const uint8* block, uint8** data) {
 
 size_t bytesOf(const Pixels& pixels) { return pixels.size() * 4; }
 
-const char* charsOf(const void* bytes) { return static_cast<const char*>(bytes); }
-
 /// Memory as the compressors return it: allocated, written by `write`, released.
 template <class Write> void inFreshMemory(size_t bytes, Write write) {
   void* memory = malloc(bytes);
@@ -131,6 +129,8 @@ void decompressLimit(const Pixels& pixels, const Block& block) {
 }
 
 #ifdef HAVE_LZ4
+const char* charsOf(const void* bytes) { return static_cast<const char*>(bytes); }
+
 int lz4Bound(const Pixels& pixels) { return LZ4_compressBound(static_cast<int>(bytesOf(pixels))); }
 
 int lz4Compress(const Pixels& pixels, char* to, int acceleration) {
