@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
+#include <initializer_list>
 
 namespace {
 
@@ -19,6 +20,18 @@ size_t grownAllocation(size_t allocated, size_t needed) {
   return grown < kFirstAllocation ? kFirstAllocation : grown;
 }
 
+/// Makes room for `needed` bytes, more than there are: with room to grow, or just for them.
+bool grow(DynBuf* buffer, size_t needed) {
+  for (const size_t allocated : {grownAllocation(buffer->allocated, needed), needed}) {
+    void* grown = realloc(buffer->data, allocated);
+    if (grown == nullptr) continue;
+    buffer->data = static_cast<uint8*>(grown);
+    buffer->allocated = allocated;
+    return true;
+  }
+  return false;
+}
+
 }  // namespace
 
 extern "C" {
@@ -29,13 +42,7 @@ bool DynBuf_Append(DynBuf* buffer, const void* bytes, size_t length) {
   if (length == 0) return true;
   if (length > SIZE_MAX - buffer->size) return false;
   const size_t needed = buffer->size + length;
-  if (needed > buffer->allocated) {
-    const size_t allocated = grownAllocation(buffer->allocated, needed);
-    void* grown = realloc(buffer->data, allocated);
-    if (grown == nullptr) return false;
-    buffer->data = static_cast<uint8*>(grown);
-    buffer->allocated = allocated;
-  }
+  if (needed > buffer->allocated && !grow(buffer, needed)) return false;
   memcpy(buffer->data + buffer->size, bytes, length);
   buffer->size = needed;
   return true;

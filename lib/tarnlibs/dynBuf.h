@@ -25,8 +25,9 @@ typedef struct DynBuf {
 /// Makes `buffer` empty without looking at what it held. Nothing is allocated.
 TARNLIBS_EXPORT void DynBuf_Init(DynBuf* buffer);
 
-/// Appends `length` bytes. The allocation at least doubles when it must grow. Returns false, with
-/// the buffer as it was, when memory is exhausted or the size would not fit size_t.
+/// Appends `length` bytes, which must not lie in the buffer itself. The allocation at least doubles
+/// when it must grow, unless there is no memory for that much. Returns false, with the buffer as it
+/// was, when memory is exhausted or the size would not fit size_t.
 TARNLIBS_EXPORT bool DynBuf_Append(DynBuf* buffer, const void* bytes, size_t length);
 
 /// Releases the bytes and leaves an empty buffer, so that a second call does nothing.
