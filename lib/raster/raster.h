@@ -348,6 +348,7 @@ TARNLIBS_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst,
 
 // NOLINTBEGIN(modernize-use-using)
 
+/// How a component is put into a channel: ((component * multiplier) >> shift) & mask.
 typedef struct RasterRGBParam {
   uint32 multiplier;
   uint32 shift;
@@ -356,15 +357,92 @@ typedef struct RasterRGBParam {
 
 // NOLINTEND(modernize-use-using)
 
+/// Converts a video frame to packed RGB by the BT.601 equation with limited range:
+///
+///   R = (298 (Y - 16) + 409 (Cr - 128) + 128) >> 8
+///   G = (298 (Y - 16) - 100 (Cb - 128) - 208 (Cr - 128) + 128) >> 8
+///   B = (298 (Y - 16) + 516 (Cb - 128) + 128) >> 8
+///
+/// with an arithmetic shift, each limited to 0..255. `width` and `height` are in pixels.
+///
+/// `format` is a four-character code, its first character in the low byte:
+/// - "YUY2" (0x32595559) and "UYVY" (0x59565955): width x height / 2 groups of four bytes, one
+/// after
+///   the other without row padding: Y0 Cr Y1 Cb, and Cr Y0 Cb Y1. With an odd number of pixels the
+///   last one is not written.
+/// - "YV12" (0x32315659): a plane of Y, one of Cb and one of Cr, each right after the other. Rows
+/// of
+///   Y are `width` rounded up to even bytes apart and their number is `height` rounded up to even;
+///   the other planes have half of both. A last odd row or column is not written.
+///
+/// Deliberate: in the packed formats the first chroma byte of a group is the red-difference, and in
+/// the planar one the plane after Y is the blue-difference. Standard frames of these names have
+/// them the other way round: docs/video.md.
+///
+/// `bppdepth` is the output format; rows of width x bytes per pixel follow each other without a
+/// gap:
+/// - 15: 2 bytes, R in bits 11-15, G in 6-10, B in 1-5. Deliberate: one bit higher than the 15-bit
+///   pixels of the rest of the library; bit 0 is 0.
+/// - 16: 2 bytes, R in bits 11-15, G in 5-10, B in 0-4.
+/// - 24: 3 bytes, B, G, R. 32: 4 bytes, B, G, R, 0.
+///
+/// Deliberate: with "YV12" and an odd width, each pair of output rows begins one pixel earlier than
+/// in a picture, once more for every pair before it.
+///
+/// Any other `bppdepth` (looked at first) or format leaves `dst` untouched and logs, the first time
+/// in the process, Log("Raster_YUVtoRGB: bppdepth:%d not supported.\n") or
+/// Log("Raster_YUVtoRGB: format:%u not supported.\n"). Source and destination must not overlap, and
+/// may have any alignment. The size of the source is trusted.
 TARNLIBS_EXPORT void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height,
                                      uint32 format, int32 bppdepth);
+
+/// One pixel 0x00RRGGBB of a luma, blue-difference `u` and red-difference `v`, by the equation of
+/// Raster_YUVtoRGB. Deliberate: without the rounding term 128, so that white (235, 128, 128) is
+/// 0x00FEFEFE.
 TARNLIBS_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
+
+/// Fills `param` so that a component of `bits` bits is put into the lowest run of set bits of
+/// `mask`: a narrower field gets its top bits, a wider one the component repeated. Returns the
+/// multiplier. With a total (the length of the run rounded up to a multiple of `bits`):
+/// multiplier = (2^total - 1) / (2^bits - 1), cut to 32 bits; shift = total - length - position of
+/// the run; where that is negative, the multiplier is shifted left by as much and the shift is 0.
+///
+/// `bits` must be 1 to 32 and `mask` not 0: debug builds assert it.
 TARNLIBS_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask);
 
 // ---- Compression -------------------------------------------------------------------------------
 
+/// Packs an image into a new block: five 32-bit words (width, height, pitch in bytes, bits per
+/// pixel, number of code words; in the machine's byte order) and a payload. docs/compression.md has
+/// the code.
+///
+/// `src` is one flat run of height x pitch bytes of any alignment; `pitch` is in bytes, 0 stands
+/// for width x pixel size. Images of 32 bits per pixel are run-length coded if that is shorter,
+/// counted in whole pixels (height x pitch / 4, rounded down); otherwise, and for 8, 16 and 24
+/// bits, the number of code words is 0 and the payload is the pixels as they are.
+///
+/// `outBlock` receives the block and `outSize` its length in bytes. The block comes from
+/// UtilSafeMalloc0, which never fails; the caller releases it with free. `outBlock` is set before
+/// the pixels are looked at.
+///
+/// Any other `bpp` ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCompress" and
+/// 114.
 TARNLIBS_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width,
                                      uint32 height, uint8** outBlock, uint32* outSize);
+
+/// Unpacks a block: stores the pitch in bytes, bits per pixel, width and height of its header, and
+/// in `outData` a new buffer of height x pitch bytes from UtilSafeMalloc0, which the caller
+/// releases with free. Bytes of the buffer that the code does not write are zero.
+///
+/// Deliberate: the pixels of a block without code words are copied to the place where `outData`
+/// points, height x pitch bytes over the caller's pointer and what follows it, and not to the new
+/// buffer, which stays as allocated and can no longer be reached through `outData`. A caller that
+/// meets such blocks (word 4 of the header is 0) takes the pixels from the block, at byte 20.
+///
+/// A code with 8, 16 or 24 bits per pixel ends in Panic("NOT_IMPLEMENTED %s:%d\n") with
+/// "lib/raster/rasterCompress" and 187; with any other number but 32 the buffer is returned as
+/// allocated. The block is trusted: a code that claims more pixels than the header runs over the
+/// buffer's end.
 TARNLIBS_EXPORT void Raster_Decompress(const uint8* block, uint8** outData, uint32* outPitch,
                                        uint32* outBpp, uint32* outWidth, uint32* outHeight);
 

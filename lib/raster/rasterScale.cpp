@@ -7,6 +7,7 @@
 #include <cmath>
 #include <limits>
 
+#include "firstTime.h"
 #include "message.h"
 #include "raster.h"
 #include "rasterScaleInternal.h"
@@ -18,9 +19,6 @@ constexpr char kFunction[] = "Raster_Scale";
 
 constexpr uint32 kSizeEnd = 32768;
 constexpr double kScaleLimit = 1.0 / 32767;
-
-/// Whether this is the first time that `flag` is met in this process.
-bool firstTime(std::atomic<bool>& flag) { return !flag.exchange(true, std::memory_order_relaxed); }
 
 struct Format {
   uint32 depth;
