@@ -55,9 +55,14 @@ inline RowRun joinRows(intptr_t step, size_t bytes, uint32 rows) {
 
 /// One pixel of kBytes bytes, at any alignment.
 template <unsigned kBytes> inline uint32 loadPixel(const uint8* at) {
-  uint32 pixel = 0;
-  memcpy(&pixel, at, kBytes);
-  return pixel;
+  if constexpr (kBytes == 3) {
+    // Not through memory: reading four bytes where two and one were just stored stalls.
+    return loadPixel<2>(at) | static_cast<uint32>(at[2]) << 16;
+  } else {
+    uint32 pixel = 0;
+    memcpy(&pixel, at, kBytes);
+    return pixel;
+  }
 }
 template <unsigned kBytes> inline void storePixel(uint8* at, uint32 pixel) {
   memcpy(at, &pixel, kBytes);

@@ -44,23 +44,32 @@ template <int kRight> constexpr uint32 shiftedRight(uint32 value) {
   }
 }
 
-/// One channel of a pixel, moved from its place in one format to that in another. Narrowing keeps
-/// the top bits; widening repeats them in the new low bits.
-template <class From, class To> constexpr uint32 moveChannel(uint32 pixel) {
-  if constexpr (To::kBits <= From::kBits) {
-    return shiftedRight<From::kTop - To::kTop>(pixel) & To::kMask;
-  } else {
-    static_assert(To::kBits <= 2 * From::kBits);
-    const uint32 top = shiftedRight<From::kTop - To::kTop>(pixel & From::kMask);
-    return top | (top >> From::kBits & To::kMask);
+/// How a channel gets from its place in one format to that in another. Narrowing keeps the top
+/// bits; widening repeats them in the new low bits.
+template <class From, class To> struct ChannelMove {
+  static constexpr int kRight = From::kTop - To::kTop;
+  static constexpr uint32 kTopMask = shiftedRight<kRight>(From::kMask) & To::kMask;
+  static constexpr int kRepeatRight = From::kBits;
+  static constexpr uint32 kRepeatMask = To::kMask & ~kTopMask;
+  static_assert(To::kBits <= 2 * From::kBits);
+
+  static constexpr uint32 apply(uint32 pixel) {
+    const uint32 top = shiftedRight<kRight>(pixel) & kTopMask;
+    return top | (top >> kRepeatRight & kRepeatMask);
   }
-}
+};
+
+/// The moves of the three channels.
+template <class From, class To> struct ColorMove {
+  using Red = ChannelMove<typename From::Red, typename To::Red>;
+  using Green = ChannelMove<typename From::Green, typename To::Green>;
+  using Blue = ChannelMove<typename From::Blue, typename To::Blue>;
+};
 
 /// The colour of a pixel of one format in another; bits outside the fields are 0.
 template <class From, class To> constexpr uint32 convertColor(uint32 pixel) {
-  return moveChannel<typename From::Red, typename To::Red>(pixel) |
-         moveChannel<typename From::Green, typename To::Green>(pixel) |
-         moveChannel<typename From::Blue, typename To::Blue>(pixel);
+  using Move = ColorMove<From, To>;
+  return Move::Red::apply(pixel) | Move::Green::apply(pixel) | Move::Blue::apply(pixel);
 }
 static_assert(convertColor<Code16, Code32>(0x8410) == 0x00848284);
 static_assert(convertColor<Code15, Code16>(0x0200) == 0x0420);

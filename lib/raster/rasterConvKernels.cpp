@@ -11,6 +11,7 @@
 #include <type_traits>
 #include <utility>
 
+#include "pixelLanes-inl.h"
 #include "rasterConvInternal.h"
 #include "rows-inl.h"
 
@@ -25,7 +26,8 @@ struct Palette {
 
 constexpr uint32 kOpaque = 0xFF000000;
 
-template <class From, class To> uint32 loadConverted(const uint8* at, const uint8* palette) {
+template <class From, class To>
+uint32 loadConverted(const uint8* at, [[maybe_unused]] const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
     const uint32 color = loadPixel<4>(entryAt(palette, *at));
     return std::is_same_v<To, Code32> ? color : convertColor<Code32, To>(color);
@@ -35,17 +37,74 @@ template <class From, class To> uint32 loadConverted(const uint8* at, const uint
   }
 }
 
-template <class From, class To> void convertRows(const ConvertJob& job) {
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  for (uint32 y = 0; y < job.height; ++y) {
-    for (size_t x = 0; x < job.pixels; ++x)
+/// Pixel after pixel.
+template <class From, class To> void convertRowsPlainly(const ConvertJob& job) {
+  const size_t pixels = job.pixels;
+  const uint8* const palette = job.palette;
+  uint8* HWY_RESTRICT dst = job.dst;
+  const uint8* HWY_RESTRICT src = job.src;
+  for (uint32 y = job.height; y != 0; --y) {
+    for (size_t x = 0; x < pixels; ++x)
       storePixel<To::kBytes>(dst + x * To::kBytes,
-                             loadConverted<From, To>(src + x * From::kBytes, job.palette));
+                             loadConverted<From, To>(src + x * From::kBytes, palette));
     dst = nextRow(dst, job.dstStep);
     src = nextRow(src, job.srcStep);
   }
 }
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <class From, class To> void convertRows(const ConvertJob& job) {
+  convertRowsPlainly<From, To>(job);
+}
+
+#else
+
+template <class From, class To, class D>
+HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
+  Block<D> block = loadBlock<From::kBytes>(d, src);
+  for (auto& lanes : block.v) {
+    if constexpr (From::kBytes < 3 || To::kBytes < 3) lanes = convertLanes<From, To>(d, lanes);
+    if constexpr (std::is_same_v<To, Code32>) lanes = hn::Or(lanes, hn::Set(d, kOpaque));
+  }
+  storeBlock<To::kBytes>(d, block, dst);
+}
+
+/// Block after block; the last one ends with the row and may do some pixels again. Rows that are
+/// shorter than a block take smaller ones.
+template <class From, class To, class D> void convertRowsByBlocks(D d, const ConvertJob& job) {
+  constexpr size_t kPixels = kBlockPixels<D>;
+  if (job.pixels < kPixels) {
+    if constexpr (kPixels > 16) {
+      convertRowsByBlocks<From, To>(hn::Half<D>(), job);
+    } else {
+      convertRowsPlainly<From, To>(job);
+    }
+    return;
+  }
+  const size_t last = job.pixels - kPixels;
+  uint8* dst = job.dst;
+  const uint8* src = job.src;
+  for (uint32 y = job.height; y != 0; --y) {
+    for (size_t x = 0; x < last; x += kPixels)
+      convertBlock<From, To>(d, dst + x * To::kBytes, src + x * From::kBytes);
+    convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes);
+    dst = nextRow(dst, job.dstStep);
+    src = nextRow(src, job.srcStep);
+  }
+}
+
+template <class From, class To> void convertRows(const ConvertJob& job) {
+  if constexpr (std::is_same_v<From, Palette>) {
+    convertRowsPlainly<From, To>(job);
+  } else {
+    constexpr bool kShort = From::kBytes <= 2 && To::kBytes <= 2;
+    using Lane = std::conditional_t<kShort, uint16, uint32>;
+    convertRowsByBlocks<From, To>(hn::ScalableTag<Lane>(), job);
+  }
+}
+
+#endif
 
 template <class From, class To> constexpr ConvertKernel kernel() {
   if constexpr (std::is_same_v<From, To>) {
