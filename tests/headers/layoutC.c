@@ -89,6 +89,16 @@ AT(ImageUtilMemOps, free, 2 * PTR);
 AT(ImageUtilMemOps, realloc, 3 * PTR);
 SIZE(ImageUtilMemOps, 4 * PTR);
 
+AT(ImageUtilReadPngCtx, start, 0);
+AT(ImageUtilReadPngCtx, consumed, PTR);
+SIZE(ImageUtilReadPngCtx, 2 * PTR);
+
+AT(ImageUtilBufferWriteCtx, buffer, 0);
+AT(ImageUtilBufferWriteCtx, used, PTR);
+AT(ImageUtilBufferWriteCtx, capacity, PTR + 4);
+AT(ImageUtilBufferWriteCtx, memops, PTR + 8);
+SIZE(ImageUtilBufferWriteCtx, 2 * PTR + 8);
+
 AT(DynBuf, data, 0);
 AT(DynBuf, size, PTR);
 AT(DynBuf, allocated, 2 * PTR);

@@ -79,6 +79,7 @@ struct Picture {
   void turnOver() {
     const Bytes upright = pixels.bytes();
     const uint32 pitch = image.bytesPerLine;
+    if (upright.empty()) return;
     for (uint32 y = 0; y < image.height; ++y)
       memcpy(pixels.data() + size_t{y} * pitch,
              upright.data() + size_t{image.height - 1 - y} * pitch, pitch);
@@ -231,6 +232,18 @@ TEST_F(ImageUtil_ConstructBMPBuffer, AppendsHeadersPaletteAndPixelsInOrder) {
   picture.image.numColors = 0;
   encode(picture.image);
   EXPECT_EQ(interposed.appends, (std::vector<size_t>{14, 40, 24}));
+}
+
+TEST_F(ImageUtil_ConstructBMPBuffer, RefusesPixelsThatNoBlockOfMemoryHolds) {
+  if (sizeof(size_t) > 4) GTEST_SKIP() << "64-bit memory holds whatever a file can";
+  Picture picture(1, 1, 24, 32, 4);
+  picture.image.width = 30000;
+  picture.image.height = 30000;
+  picture.pixels.forbid();  // not read
+  DynBuf out = {nullptr, 123, 456};
+  EXPECT_FALSE(::ImageUtil_ConstructBMPBuffer(&picture.image, &out));
+  EXPECT_EQ(out.size, 123u);
+  EXPECT_TRUE(interposed.appends.empty());
 }
 
 TEST_F(ImageUtil_ConstructBMPBuffer, TouchesNothingWithoutImageOrOutput) {
