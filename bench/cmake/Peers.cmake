@@ -14,7 +14,6 @@ raster_peer(SWSCALE libswscale libavutil)
 raster_peer(LZ4 liblz4)
 raster_peer(SPNG spng)
 raster_peer(ZLIB zlib)
-raster_peer(PNG libpng)
 
 find_path(LIBYUV_INCLUDE libyuv.h)
 find_library(LIBYUV_LIBRARY yuv)
