@@ -109,23 +109,20 @@ Work workOf(const Job& job, Extent larger, bool large) {
           job.scale > 1 ? other : larger, job.scale > 1 ? larger : other};
 }
 
-#ifdef __x86_64__
-__attribute__((target("avx2")))
-#endif
-uint64
-readAll(const uint8* bytes, size_t count) {
-  using Vector = uint64 __attribute__((vector_size(32)));
-  Vector sums[4] = {};
-  for (size_t i = 0; i + sizeof sums <= count; i += sizeof sums) {
-    Vector at[4];
-    memcpy(at, bytes + i, sizeof at);
-    sums[0] ^= at[0];
-    sums[1] ^= at[1];
-    sums[2] ^= at[2];
-    sums[3] ^= at[3];
+/// 32 bytes anywhere in memory.
+using Lump = uint64 __attribute__((vector_size(32), aligned(1), may_alias));
+
+__attribute__((target("avx2"))) uint64 readAll(const uint8* bytes, size_t count) {
+  const auto* at = reinterpret_cast<const Lump*>(bytes);
+  Lump a = {}, b = {}, c = {}, d = {};
+  for (size_t i = 0; i + 4 <= count / sizeof(Lump); i += 4) {
+    a ^= at[i];
+    b ^= at[i + 1];
+    c ^= at[i + 2];
+    d ^= at[i + 3];
   }
-  const Vector all = sums[0] ^ sums[1] ^ sums[2] ^ sums[3];
-  return all[0] ^ all[1] ^ all[2] ^ all[3];
+  a ^= b ^ c ^ d;
+  return a[0] ^ a[1] ^ a[2] ^ a[3];
 }
 
 /// What memory allows: as many bytes as the job writes, and as many as it has to read.

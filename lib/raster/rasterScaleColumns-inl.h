@@ -65,10 +65,13 @@ class Columns {
 
   Columns(const ScaleJob& job, ScaleMemory&) : job_(job) {}
 
-  /// Resamples a source row of 1- to 4-byte pixels.
+  /// Resamples a source row of 3- or 4-byte pixels.
   void resample(const uint8* row, uint32* out) const {
-    withPixelSize(job_.srcBytesPerPixel,
-                  [&](auto bytes) { resampleAs<decltype(bytes)::value>(row, out); });
+    if (job_.srcBytesPerPixel == 4) {
+      resampleAs<4>(row, out);
+    } else {
+      resampleAs<3>(row, out);
+    }
   }
 
   /// Nearest sampling of a row of 4-byte pixels, written where it belongs: not a byte beyond.
@@ -161,8 +164,8 @@ HWY_INLINE PixelVec mixLanes(PixelVec p0, PixelVec p1, HalvesVec w0, HalvesVec w
   return hn::BitCast(Pixels(), hn::Or(hn::ShiftRight<8>(low), hn::AndNot(even, high)));
 }
 
-/// Pixels of 3 bytes as pixels of 4, the fourth being 0. Reads exactly the row.
-HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
+/// A vector of 3-byte pixels as 4-byte ones, the fourth byte being 0. Reads 4 * kBlock bytes.
+HWY_INLINE PixelVec widenPixels(const uint8* at) {
   const Pixels d;
   const hn::Repartition<uint8, Pixels> d8;
   alignas(64) static constexpr uint8 kWiden[64] = {
@@ -172,13 +175,16 @@ HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
       0, 1, 2, 0x80, 3, 4, 5, 0x80, 6, 7, 8, 0x80, 9, 10, 11, 0x80};
   alignas(64) static constexpr uint32 kSpread[16] = {0, 1, 2, 3, 3, 4,  5,  6,
                                                      6, 7, 8, 9, 9, 10, 11, 12};
-  const auto widen = hn::Load(d8, kWiden);
+  auto v = loadLanes(d, at);
+  if constexpr (kBlock > 4) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kSpread));
+  return hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::Load(d8, kWiden)));
+}
+
+/// The same for a row; reads exactly that.
+HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
   uint32 i = 0;
-  for (; size_t{3} * (count - i) >= 4 * kBlock; i += kBlock) {
-    auto v = loadLanes(d, row + size_t{3} * i);
-    if constexpr (kBlock > 4) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kSpread));
-    hn::StoreU(hn::TableLookupBytesOr0(hn::BitCast(d8, v), widen), d8, out + size_t{4} * i);
-  }
+  for (; size_t{3} * (count - i) >= 4 * kBlock; i += kBlock)
+    storeLanes(Pixels(), widenPixels(row + size_t{3} * i), out + size_t{4} * i);
   for (; i < count; ++i) storePixel<4>(out + size_t{4} * i, loadPixel<3>(row + size_t{3} * i));
 }
 
@@ -224,7 +230,7 @@ class Columns {
     }
   }
 
-  /// Resamples a source row of 1- to 4-byte pixels. `out` has room for whole vectors.
+  /// Resamples a source row of 3- or 4-byte pixels. `out` has room for whole vectors.
   void resample(const uint8* row, uint32* out) const {
     const uint8* pixels = stage(row);
     auto* to = reinterpret_cast<uint8*>(out);
@@ -273,19 +279,10 @@ class Columns {
   const uint8* stage(const uint8* row) const {
     if (staged_ == nullptr) return row;
     auto* to = reinterpret_cast<uint8*>(staged_);
-    const uint32 width = job_.srcWidth;
-    switch (job_.srcBytesPerPixel) {
-      case 1:
-        for (uint32 i = 0; i < width; ++i) staged_[i] = row[i];
-        break;
-      case 2:
-        for (uint32 i = 0; i < width; ++i) staged_[i] = loadPixel<2>(row + size_t{2} * i);
-        break;
-      case 3:
-        widenRow(row, width, to);
-        break;
-      default:
-        memcpy(to, row, size_t{4} * width);
+    if (job_.srcBytesPerPixel == 3) {
+      widenRow(row, job_.srcWidth, to);
+    } else {
+      memcpy(to, row, size_t{4} * job_.srcWidth);
     }
     return to;
   }

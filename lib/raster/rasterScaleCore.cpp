@@ -13,6 +13,8 @@
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
 #include "rasterScaleRows-inl.h"
+#include "rasterScaleShort-inl.h"
+#include "rasterScaleWhole-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -117,34 +119,35 @@ void storePlainRow(const ScaleJob& job, uint8* dst, const uint32* row) {
     storeSparseRow(dst, row, job.width, job.dstBytesPerPixel);
   } else if (job.dstBytesPerPixel == 4) {
     storeRow<4>(dst, row, job.width);
-  } else if (job.dstBytesPerPixel == 3) {
-    storeRow<3>(dst, row, job.width);
   } else {
-    for (uint32 i = 0; i < job.width; ++i)
-      memcpy(dst + size_t{i} * job.dstBytesPerPixel, row + i, job.dstBytesPerPixel);
+    storeRow<3>(dst, row, job.width);
   }
 }
 
-/// Destination rows that are one source row each. Rows that show the same one are copied.
-void drawPlainRows(const ScaleJob& job, const Columns& columns, RowCache& cache) {
+/// Destination rows that are one source row each, made by drawRow(dst, row number, position). Rows
+/// that show the same one are copied where they are whole pixels.
+template <class DrawRow>
+HWY_INLINE void drawPlainRows(const ScaleJob& job, bool wholePixels, const DrawRow& drawRow) {
   const size_t bytes = size_t{job.width} * job.dstBytesPerPixel;
-  const bool fillsPixels = job.depthsDiffer ? job.dstBytesPerPixel == 2 : !job.sizesDiffer;
-  const bool samples =
-      !job.smoothColumns() && !job.depthsDiffer && !job.sizesDiffer && job.dstBytesPerPixel == 4;
   uint32 y = job.startY;
   uint32 shown = 0;
   uint8* dst = job.dst;
   for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
     const uint32 row = job.rowOf(y);
-    if (i != 0 && row == shown && fillsPixels) {
-      memcpy(dst, rowAt(dst, -job.dstPitch, 1, 0, 0), bytes);
-    } else if (samples) {
-      columns.sample(job.srcRow(row), dst);
+    if (wholePixels && i != 0 && row == shown) {
+      memcpy(dst, nextRow(dst, -job.dstPitch), bytes);
     } else {
-      storePlainRow(job, dst, cache.at(y));
+      drawRow(dst, row, y);
     }
     shown = row;
   }
+}
+
+template <unsigned kBytes> void drawShortPixels(const ScaleJob& job) {
+  ScaleMemory memory(ShortColumns<kBytes>::memoryFor(job));
+  const ShortColumns<kBytes> columns(job, memory);
+  drawPlainRows(job, true,
+                [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
 }
 
 /// Nearest sampling of pixels of any size.
@@ -166,15 +169,22 @@ void drawWidePixels(const ScaleJob& job) {
 void drawScaled(const ScaleJob& job) {
   if (job.srcBytesPerPixel == 0) return;
   if (job.srcBytesPerPixel > 4) return drawWidePixels(job);
+  if (job.srcBytesPerPixel == 1) return drawShortPixels<1>(job);
+  if (job.srcBytesPerPixel == 2) return drawShortPixels<2>(job);
+  if (drawWholeSteps(job)) return;
   ScaleMemory memory(Columns::memoryFor(job) + RowCache::memoryFor(job));
   const Columns columns(job, memory);
   RowCache cache(job, columns, memory);
-  if (!job.smoothRows()) {
-    drawPlainRows(job, columns, cache);
-  } else if (job.dstBytesPerPixel == 4) {
-    drawSmoothRows<4>(job, cache);
+  const bool converts = job.depthsDiffer || job.sizesDiffer;
+  if (job.smoothRows()) {
+    job.dstBytesPerPixel == 4 ? drawSmoothRows<4>(job, cache) : drawSmoothRows<3>(job, cache);
+  } else if (!converts && !job.smoothColumns() && job.dstBytesPerPixel == 4) {
+    drawPlainRows(job, true,
+                  [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
   } else {
-    drawSmoothRows<3>(job, cache);
+    const bool wholePixels = !converts || (job.depthsDiffer && job.dstBytesPerPixel == 2);
+    drawPlainRows(job, wholePixels,
+                  [&](uint8* dst, uint32, uint32 y) { storePlainRow(job, dst, cache.at(y)); });
   }
 }
 

@@ -146,6 +146,8 @@ void checkRandomCalls(uint64 seed, int rounds, int32 smooth) {
     c.srcHeight = someSize(random, 50);
     c.scaleX = someScale(random);
     c.scaleY = someScale(random);
+    if (random.below(4) == 0) c.scaleY = c.scaleX;
+    if (random.below(6) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25});
     if (random.below(4) == 0) c.scaleX = double{1} * c.dstWidth / c.srcWidth;
     if (random.below(4) == 0) c.scaleY = double{1} * c.dstHeight / c.srcHeight;
     c.smooth = smooth;
