@@ -57,6 +57,8 @@ inline uint32 positionsBelow(uint32 end, uint32 start, uint32 step, uint32 most)
 
 #if HWY_TARGET == HWY_SCALAR
 
+inline void copyBytes(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
+
 /// The horizontal resampler of one call.
 class Columns {
  public:
@@ -180,12 +182,27 @@ HWY_INLINE PixelVec widenPixels(const uint8* at) {
   return hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::Load(d8, kWiden)));
 }
 
-/// The same for a row; reads exactly that.
+/// Copies bytes. Short runs, of which small rectangles have many, do without a call.
+HWY_INLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
+  if (bytes > 16 * kBlock) {
+    memcpy(dst, src, bytes);
+  } else {
+    forLanes(hn::Repartition<uint8, Pixels>(), bytes,
+             [=](auto d, size_t i) { hn::StoreU(hn::LoadU(d, src + i), d, dst + i); });
+  }
+}
+
+/// The same for a row; reads exactly that. `out` has room for a vector more.
 HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
+  const Pixels d;
   uint32 i = 0;
   for (; size_t{3} * (count - i) >= 4 * kBlock; i += kBlock)
-    storeLanes(Pixels(), widenPixels(row + size_t{3} * i), out + size_t{4} * i);
-  for (; i < count; ++i) storePixel<4>(out + size_t{4} * i, loadPixel<3>(row + size_t{3} * i));
+    storeLanes(d, widenPixels(row + size_t{3} * i), out + size_t{4} * i);
+  for (; i < count; i += kBlock) {
+    uint8 rest[4 * kBlock] = {};
+    copyBytes(rest, row + size_t{3} * i, size_t{3} * std::min<size_t>(count - i, kBlock));
+    storeLanes(d, widenPixels(rest), out + size_t{4} * i);
+  }
 }
 
 /// Stores the first `count` lanes.
@@ -194,9 +211,14 @@ HWY_INLINE void storeSome(PixelVec pixels, size_t count, uint8* at) {
   if (count == kBlock) {
     storeLanes(d, pixels, at);
   } else {
-    uint32 all[kBlock];
-    hn::StoreU(pixels, d, all);
-    memcpy(at, all, 4 * count);
+#if HWY_TARGET <= HWY_AVX2
+    void* to = at;
+    hn::BlendedStore(pixels, hn::FirstN(d, count), d, static_cast<uint32*>(to));
+#else
+    uint8 all[4 * kBlock];
+    storeLanes(d, pixels, all);
+    copyBytes(at, all, 4 * count);
+#endif
   }
 }
 
@@ -208,7 +230,9 @@ class Columns {
            ScaleMemory::sizeOf<uint32>(stagedPixels(job));
   }
   /// The room of a resampled row: whole vectors.
-  static size_t rowPixels(const ScaleJob& job) { return (job.width / kBlock + 1) * kBlock; }
+  static size_t rowPixels(const ScaleJob& job) {
+    return (job.width + kBlock - 1) / kBlock * kBlock;
+  }
 
   Columns(const ScaleJob& job, ScaleMemory& memory) : job_(job) {
     taps_ = tapsOf(job);
@@ -282,9 +306,19 @@ class Columns {
     if (job_.srcBytesPerPixel == 3) {
       widenRow(row, job_.srcWidth, to);
     } else {
-      memcpy(to, row, size_t{4} * job_.srcWidth);
+      copyBytes(to, row, size_t{4} * job_.srcWidth);
     }
     return to;
+  }
+
+  /// The distances of a block's pixels from its first one, at most 2^32 - 1.
+  PixelVec laneSteps() const {
+    const Pixels d;
+    if (job_.stepX < 0xFFFFFFFF / kBlock) return hn::Mul(hn::Iota(d, 0), hn::Set(d, job_.stepX));
+    uint32 steps[kBlock];
+    for (size_t i = 0; i < kBlock; ++i)
+      steps[i] = static_cast<uint32>(std::min<uint64>(uint64{job_.stepX} * i, 0xFFFFFFFF));
+    return hn::LoadU(d, steps);
   }
 
   /// Calls body(block, positions) for the blocks of the first `count` columns, from the position
@@ -294,10 +328,7 @@ class Columns {
   HWY_INLINE void forBlocks(int64 start, size_t count, const Body& body) const {
     constexpr int64 kLow = -(int64{1} << 30);
     const Pixels d;
-    uint32 lanes[kBlock];
-    for (size_t i = 0; i < kBlock; ++i)
-      lanes[i] = static_cast<uint32>(std::min<uint64>(uint64{job_.stepX} * i, 0xFFFFFFFF));
-    const PixelVec steps = hn::LoadU(d, lanes);
+    const PixelVec steps = laneSteps();
     const auto limit = int64{job_.xLimit()};
     const int64 blockStep = int64{job_.stepX} * static_cast<int64>(kBlock);
     for (size_t block = 0; block < count; block += kBlock, start += blockStep) {

@@ -81,9 +81,9 @@ HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
     for (; width - i >= 2 * kBlock; i += kBlock)
       storeLanes(d, packThreeBytes(block(i)), dst + 3 * i);
     for (; i < width; i += kBlock) {
-      uint32 packed[kBlock];
-      hn::StoreU(packThreeBytes(block(i)), d, packed);
-      memcpy(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
+      uint8 packed[4 * kBlock];
+      storeLanes(d, packThreeBytes(block(i)), packed);
+      copyBytes(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
     }
   }
 }

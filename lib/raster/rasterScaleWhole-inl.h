@@ -66,51 +66,70 @@ HWY_INLINE hn::Vec<D> averageSquares(D d, std::integral_constant<unsigned, 4>, c
   return hn::BitCast(d, hn::Or(hn::ShiftRight<2>(br), hn::ShiftLeft<8>(hn::ShiftRight<2>(ga))));
 }
 
-/// Averages `count` squares, at least a vector of them; the last vector overlaps the one before.
-template <unsigned kSide, class D>
-HWY_INLINE void averageRun(D d, const SquareRows<kSide>& rows, size_t column, size_t count,
-                           uint8* dst) {
-  const size_t lanes = hn::Lanes(d);
-  const auto averageAt = [&](size_t at) {
-    const auto load = [&](unsigned row, size_t part) {
-      return loadLanes(d, rows[row] + 4 * (column + kSide * at + part * lanes));
-    };
-    storeLanes(d, averageSquares(d, std::integral_constant<unsigned, kSide>(), load), dst + 4 * at);
-  };
-  size_t i = 0;
-  for (; count - i >= lanes; i += lanes) averageAt(i);
-  if (i != count) averageAt(count - lanes);
+/// Pixels of source columns, `first` and following, without those from `end` on.
+template <class D>
+HWY_INLINE hn::Vec<D> columnsBelow(D d, hn::Vec<D> pixels, size_t first, size_t end) {
+  const hn::RebindToSigned<D> di;
+  const auto lane = hn::Iota(di, 0);
+  const auto count = hn::Set(di, static_cast<int32>(end) - static_cast<int32>(first));
+  return hn::IfThenElseZero(hn::RebindMask(d, hn::Lt(lane, count)), pixels);
 }
 
-/// The same for pixels of 3 bytes and whole vectors. The last one averages a copy, because loads
-/// reach past its pixels.
+/// A run of squares: its first source column, the column where averages end, and the number.
+struct Run {
+  size_t column;
+  size_t end;
+  size_t count;
+};
+
+/// Averages a run of at least a vector of squares. The last vector overlaps the one before; it may
+/// reach the last column, which counts as 0.
+template <unsigned kSide, class D>
+HWY_INLINE void averageRun(D d, const SquareRows<kSide>& rows, const Run& run, uint8* dst) {
+  const size_t lanes = hn::Lanes(d);
+  const std::integral_constant<unsigned, kSide> side;
+  const auto load = [&](size_t at, unsigned row, size_t part) {
+    return loadLanes(d, rows[row] + 4 * (run.column + kSide * at + part * lanes));
+  };
+  for (size_t i = 0; run.count - i > lanes; i += lanes) {
+    const auto squares = [&](unsigned row, size_t part) { return load(i, row, part); };
+    storeLanes(d, averageSquares(d, side, squares), dst + 4 * i);
+  }
+  const size_t last = run.count - lanes;
+  const auto squares = [&](unsigned row, size_t part) {
+    return columnsBelow(d, load(last, row, part), run.column + kSide * last + part * lanes,
+                        run.end);
+  };
+  storeLanes(d, averageSquares(d, side, squares), dst + 4 * last);
+}
+
+/// The same for pixels of 3 bytes and any number of squares. The end of the run is averaged from a
+/// copy, because loads reach past its pixels.
 template <unsigned kSide>
-HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, size_t column, size_t count,
-                             uint8* dst) {
-  constexpr size_t kRunBytes = 3 * kSide * kBlock;
-  const auto averageAt = [&](const auto& rowAt, size_t at) {
-    const auto load = [&](unsigned row, size_t part) {
-      return widenPixels(rowAt(row) + 3 * (kSide * at + part * kBlock));
-    };
-    return packThreeBytes(
-        averageSquares(Pixels(), std::integral_constant<unsigned, kSide>(), load));
-  };
-  const auto inPlace = [&](unsigned row) { return rows[row] + 3 * column; };
+HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, const Run& run, uint8* dst) {
+  const Pixels d;
+  const std::integral_constant<unsigned, kSide> side;
   size_t i = 0;
-  for (; count - i >= 2 * kBlock; i += kBlock)
-    storeLanes(Pixels(), averageAt(inPlace, i), dst + 3 * i);
-  const auto last = [&](size_t at) {
-    uint8 copies[kSide][kRunBytes + kBlock];
-    for (unsigned row = 0; row < kSide; ++row) {
-      memcpy(copies[row], inPlace(row) + 3 * kSide * at, kRunBytes);
-      memset(copies[row] + kRunBytes, 0, kBlock);
-    }
-    uint32 packed[kBlock];
-    hn::StoreU(averageAt([&](unsigned row) { return copies[row]; }, 0), Pixels(), packed);
-    memcpy(dst + 3 * at, packed, 3 * kBlock);
-  };
-  last(i);
-  if (i + kBlock != count) last(count - kBlock);
+  for (; run.count - i >= 2 * kBlock; i += kBlock) {
+    const auto squares = [&](unsigned row, size_t part) {
+      return widenPixels(rows[row] + 3 * (run.column + kSide * i + part * kBlock));
+    };
+    storeLanes(d, packThreeBytes(averageSquares(d, side, squares)), dst + 3 * i);
+  }
+  for (; i < run.count; i += kBlock) {
+    const size_t count = std::min(run.count - i, kBlock);
+    const size_t column = run.column + kSide * i;
+    uint8 copies[kSide][(3 * kSide + 1) * kBlock] = {};
+    for (unsigned row = 0; row < kSide; ++row)
+      copyBytes(copies[row], rows[row] + 3 * column, 3 * kSide * count);
+    const auto squares = [&](unsigned row, size_t part) {
+      return columnsBelow(d, widenPixels(copies[row] + 3 * part * kBlock), column + part * kBlock,
+                          run.end);
+    };
+    uint8 packed[4 * kBlock];
+    storeLanes(d, packThreeBytes(averageSquares(d, side, squares)), packed);
+    copyBytes(dst + 3 * i, packed, 3 * count);
+  }
 }
 
 /// Draws a job whose steps are kSide whole pixels both ways, in pixels of kBytes.
@@ -122,10 +141,11 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
   }
 
   explicit WholeSteps(const ScaleJob& job) : job_(job) {
-    // Squares that end before the last column, which no average reaches.
-    squares_ = positionsBelow(job.xLimit(), job.startX, kStep, job.width);
-    if (squares_ != 0 && job.startX + uint64{squares_} * kStep > job.xLimit()) --squares_;
-    if (squares_ < (kBytes == 3 ? kBlock : 4)) squares_ = 0;
+    // Squares that lie within the source row.
+    const uint32 column = std::min(job.startX >> 16, job.srcWidth);
+    squares_ = std::min(positionsBelow(job.xLimit(), job.startX, kStep, job.width),
+                        (job.srcWidth - column) / kSide);
+    if (kBytes == 4 && squares_ < 4) squares_ = 0;
   }
 
   void draw() const {
@@ -143,21 +163,21 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
   static constexpr uint32 kStep = kSide * kOnePixel;
 
   void drawSquares(const SquareRows<kSide>& rows, uint8* dst) const {
-    const size_t column = job_.startX >> 16;
+    const Run run = {job_.startX >> 16, job_.srcWidth - 1, squares_};
     if constexpr (kBytes == 3) {
-      if (squares_ != 0) averageRun24<kSide>(rows, column, squares_, dst);
+      averageRun24<kSide>(rows, run, dst);
     } else {
-      averageRunOf(Pixels(), rows, column, dst);
+      averageRunOf(Pixels(), rows, run, dst);
     }
   }
   /// Takes vectors as wide as the run.
   template <class D>
-  HWY_INLINE void averageRunOf(D d, const SquareRows<kSide>& rows, size_t column,
-                               uint8* dst) const {
-    if (squares_ >= hn::Lanes(d)) {
-      averageRun<kSide>(d, rows, column, squares_, dst);
+  HWY_INLINE static void averageRunOf(D d, const SquareRows<kSide>& rows, const Run& run,
+                                      uint8* dst) {
+    if (run.count >= hn::Lanes(d)) {
+      averageRun<kSide>(d, rows, run, dst);
     } else if constexpr (kLanes<D> > 4) {
-      averageRunOf(hn::Half<D>(), rows, column, dst);
+      averageRunOf(hn::Half<D>(), rows, run, dst);
     }
   }
 
