@@ -12,7 +12,8 @@
 // - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
 //   the lowest address.
 // - Fatal errors go through Warning and Panic (message.h); Panic does not return.
-// - No function keeps state or takes a lock; calls on disjoint memory may run on several threads.
+// - No function keeps state (but for flags of messages that are logged once) or takes a lock; calls
+//   on disjoint memory may run on several threads.
 
 #ifndef RASTER_RASTER_H
 #define RASTER_RASTER_H
@@ -262,14 +263,74 @@ TARNLIBS_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY,
 
 // ---- Scaling -----------------------------------------------------------------------------------
 
+/// Always true. Nothing needs to be set up before Raster_Scale.
 TARNLIBS_EXPORT bool Raster_ScaleInit(void);
+
+/// Does nothing.
 TARNLIBS_EXPORT void Raster_ScaleExit(void);
+
+/// Draws a rectangle of a scaled picture: the destination rectangle (x1, y1)-(x2, y2), x2 and y2
+/// exclusive, of the source enlarged or reduced by `scaleX` and `scaleY` (destination pixels per
+/// source pixel). The rectangle is placed as in the whole scaled picture, so drawing a part gives the
+/// same pixels as drawing everything. Beyond the source its last row and column go on.
+///
+/// `dstBits` and `srcBits` are frame buffers of `dstWidth` x `dstHeight` and `srcWidth` x `srcHeight`
+/// pixels with pitches in bytes; a source pitch may be negative. They must not overlap. The formats
+/// must be equal, with a depth and a number of bits per pixel (bpp) that are multiples of 8; or the
+/// source is depth 24 in 32 bpp, and the destination depth is 24 or 16. The three ignored arguments
+/// may have any value.
+///
+/// Positions are 16.16 fixed-point source pixels; the steps are 65536 / scale, truncated. Without
+/// `smooth`, or for destination depths below 24 and pixels of more than 4 bytes, a destination pixel
+/// is the source pixel at its position. Any non-zero `smooth` interpolates linearly in the direction
+/// that is enlarged and averages in the one that is reduced:
+/// - Enlarging starts half a source pixel back and mixes neighbours with weights of 1/256.
+/// - Reducing averages the source pixels that the step covers, in a row first and then over at most
+///   32 rows, with weights of 1/256.
+///
+/// Deliberate:
+/// - The weights of a mix add up to 255/256, and a whole row weighs 255/256 in an average (a whole
+///   column 256/256), so smoothed pixels are a shade darker.
+/// - The last source column is no part of an average, and an average is divided by the whole step: a
+///   pixel that reaches past the right edge is darker. Pixels beyond it are the last column's.
+/// - When enlarging, pixels of the left and right edge are copied while rows of the upper and lower
+///   edge are mixed with themselves.
+/// - A vertical step of exactly one pixel takes rows as they are, smoothing or not. From 32 to 24 bpp
+///   such rows (and all rows without smoothing) take every fourth pixel of the resampled row, then
+///   zeros, and leave the last pixel of each destination row unchanged.
+/// - Sums of channels wrap at 32 bits, and so do start positions (step x coordinate); a vertical
+///   position past 2^31 means row 0.
+///
+/// Returns true when the rectangle was drawn or there was nothing to draw (an empty rectangle, a size
+/// of 0). Returns false, and draws nothing, in this order:
+/// - when x1 or y1 is negative, or x2 or y2 beyond the destination;
+/// - when dstBpp < dstDepth, with
+///   Log("%s: Dest color format (depth %d, BPP %d) is not supported.\n");
+/// - when the formats are no pair from above, with
+///   Log("%s: Color depth conversion from D%dB%d to D%dB%d is not supported.\n");
+/// - when dstBpp is no multiple of 8;
+/// - when dstDepth is no multiple of 8 (so depth 15 is refused), with
+///   Log("Raster_Scale: Dest depth %d is not supported.\n");
+/// - when a size is 32768 or more;
+/// - when a factor is not greater than 1/32767.
+/// %s is "Raster_Scale". Each message is logged at most once per process (a race of threads cannot
+/// repeat it); that is all the state there is. Working memory comes from UtilSafeMalloc0.
 TARNLIBS_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth,
                                   uint32 dstWidth, uint32 dstHeight, uint32 dstIgnored, int32 x1,
                                   int32 y1, int32 x2, int32 y2, const void* srcBits, int32 srcPitch,
                                   uint32 srcBpp, int32 srcDepth, uint32 srcIgnored, uint32 srcWidth,
                                   uint32 srcHeight, uint32 ignored, double scaleX, double scaleY,
                                   int32 smooth);
+
+/// Maps a rectangle of a scaled picture, in place, to the rectangle of the unscaled picture that
+/// contributes to it, and returns its new bottom.
+///
+/// `width` and `height` are the size of the whole scaled picture; `invScaleX` and `invScaleY` are
+/// unscaled pixels per scaled pixel. With m = max(1, invScale) the near side becomes
+/// side * invScale - m, truncated, and 0 when that is negative; the far side becomes
+/// ceil(side * invScale + m), at most the truncated size * invScale. So there is a margin of one
+/// source pixel (of one step when reducing) for what smoothing mixes in. Only the near sides are
+/// bounded below and only the far sides above. Numbers beyond 32 bits saturate.
 TARNLIBS_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 height,
                                                  double invScaleX, double invScaleY);
 
