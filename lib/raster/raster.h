@@ -271,19 +271,19 @@ TARNLIBS_EXPORT void Raster_ScaleExit(void);
 
 /// Draws a rectangle of a scaled picture: the destination rectangle (x1, y1)-(x2, y2), x2 and y2
 /// exclusive, of the source enlarged or reduced by `scaleX` and `scaleY` (destination pixels per
-/// source pixel). The rectangle is placed as in the whole scaled picture, so drawing a part gives the
-/// same pixels as drawing everything. Beyond the source its last row and column go on.
+/// source pixel). The rectangle is placed as in the whole scaled picture, so drawing a part gives
+/// the same pixels as drawing everything. Beyond the source its last row and column go on.
 ///
-/// `dstBits` and `srcBits` are frame buffers of `dstWidth` x `dstHeight` and `srcWidth` x `srcHeight`
-/// pixels with pitches in bytes; a source pitch may be negative. They must not overlap. The formats
-/// must be equal, with a depth and a number of bits per pixel (bpp) that are multiples of 8; or the
-/// source is depth 24 in 32 bpp, and the destination depth is 24 or 16. The three ignored arguments
-/// may have any value.
+/// `dstBits` and `srcBits` are frame buffers of `dstWidth` x `dstHeight` and `srcWidth` x
+/// `srcHeight` pixels with pitches in bytes; a source pitch may be negative. They must not overlap.
+/// The formats must be equal, with a depth and a number of bits per pixel (bpp) that are multiples
+/// of 8; or the source is depth 24 in 32 bpp, and the destination depth is 24 or 16. The three
+/// ignored arguments may have any value.
 ///
 /// Positions are 16.16 fixed-point source pixels; the steps are 65536 / scale, truncated. Without
-/// `smooth`, or for destination depths below 24 and pixels of more than 4 bytes, a destination pixel
-/// is the source pixel at its position. Any non-zero `smooth` interpolates linearly in the direction
-/// that is enlarged and averages in the one that is reduced:
+/// `smooth`, or for destination depths below 24 and pixels of more than 4 bytes, a destination
+/// pixel is the source pixel at its position. Any non-zero `smooth` interpolates linearly in the
+/// direction that is enlarged and averages in the one that is reduced:
 /// - Enlarging starts half a source pixel back and mixes neighbours with weights of 1/256.
 /// - Reducing averages the source pixels that the step covers, in a row first and then over at most
 ///   32 rows, with weights of 1/256.
@@ -291,18 +291,18 @@ TARNLIBS_EXPORT void Raster_ScaleExit(void);
 /// Deliberate:
 /// - The weights of a mix add up to 255/256, and a whole row weighs 255/256 in an average (a whole
 ///   column 256/256), so smoothed pixels are a shade darker.
-/// - The last source column is no part of an average, and an average is divided by the whole step: a
-///   pixel that reaches past the right edge is darker. Pixels beyond it are the last column's.
+/// - The last source column is no part of an average, and an average is divided by the whole step,
+///   so a pixel that reaches past the right edge is darker. Pixels beyond are the last column's.
 /// - When enlarging, pixels of the left and right edge are copied while rows of the upper and lower
 ///   edge are mixed with themselves.
-/// - A vertical step of exactly one pixel takes rows as they are, smoothing or not. From 32 to 24 bpp
-///   such rows (and all rows without smoothing) take every fourth pixel of the resampled row, then
-///   zeros, and leave the last pixel of each destination row unchanged.
+/// - A vertical step of exactly one pixel takes rows as they are, smoothing or not. From 32 to 24
+///   bpp such rows (and all rows without smoothing) take every fourth pixel of the resampled row,
+///   then zeros, and leave the last pixel of each destination row unchanged.
 /// - Sums of channels wrap at 32 bits, and so do start positions (step x coordinate); a vertical
 ///   position past 2^31 means row 0.
 ///
-/// Returns true when the rectangle was drawn or there was nothing to draw (an empty rectangle, a size
-/// of 0). Returns false, and draws nothing, in this order:
+/// Returns true when the rectangle was drawn or there was nothing to draw (an empty rectangle, a
+/// size of 0). Returns false, and draws nothing, in this order:
 /// - when x1 or y1 is negative, or x2 or y2 beyond the destination;
 /// - when dstBpp < dstDepth, with
 ///   Log("%s: Dest color format (depth %d, BPP %d) is not supported.\n");

@@ -47,9 +47,9 @@ template <unsigned kBytes> class ShortColumns {
                  out + 16 * block);
     }
 #endif
-    uint64 x = job_.startX + uint64{job_.stepX} * kPixels * blocks_;
+    uint64 x = job_.startX + uint64{job_.stepX} * kPixels * uint64{blocks_};
     for (size_t i = blocks_ * kPixels; i < job_.width; ++i, x += job_.stepX) {
-      const size_t column = std::min<uint64>(x, job_.xLimit()) >> 16;
+      const auto column = static_cast<size_t>(std::min<uint64>(x, job_.xLimit()) >> 16);
       storePixel<kBytes>(out + kBytes * i, loadPixel<kBytes>(row + kBytes * column));
     }
   }
