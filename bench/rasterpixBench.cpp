@@ -1,0 +1,108 @@
+// SPDX-License-Identifier: MIT
+//
+// Tiling against memset and the public libraries that repeat a picture.
+
+#include <cstring>
+
+#include "raster.h"
+#include "support/jobs.h"
+
+#ifdef HAVE_PIXMAN
+#include <pixman.h>
+#endif
+#ifdef HAVE_QT6
+#include <QBrush>
+#include <QImage>
+#include <QPainter>
+#include <memory>
+#endif
+
+namespace {
+
+using bench::Contenders;
+using bench::Extent;
+
+constexpr uint32 kCopy = 3;
+constexpr uint32 kXor = 6;
+constexpr uint32 kTileX = 3;
+constexpr uint32 kTileY = 5;
+
+/// The bytes of a tile's row; a multiple of 4, as the peers want it.
+uint32 tilePitch(uint32 size, uint32 bytes) { return (size * bytes + 3) / 4 * 4; }
+
+#ifdef HAVE_PIXMAN
+void addPixman(Contenders& c, uint8* dst, uint8* tile, uint32 bytes, uint32 size, Extent e) {
+  static constexpr pixman_format_code_t kFormats[] = {PIXMAN_a8, PIXMAN_a8, PIXMAN_r5g6b5,
+                                                      PIXMAN_r8g8b8, PIXMAN_a8r8g8b8};
+  const int w = static_cast<int>(e.width);
+  const int h = static_cast<int>(e.height);
+  const int side = static_cast<int>(size);
+  auto* to = pixman_image_create_bits(kFormats[bytes], w, h, bench::words(dst),
+                                      static_cast<int>(e.width * bytes));
+  auto* from = pixman_image_create_bits(kFormats[bytes], side, side, bench::words(tile),
+                                        static_cast<int>(tilePitch(size, bytes)));
+  pixman_image_set_repeat(from, PIXMAN_REPEAT_NORMAL);
+  c.add("pixman", [=] {
+    pixman_image_composite32(PIXMAN_OP_SRC, from, nullptr, to, kTileX, kTileY, 0, 0, 0, 0, w, h);
+  });
+}
+#endif
+
+#ifdef HAVE_QT6
+/// A picture with an open painter. The engine sets the top byte of a 4-byte pixel, hence "~x".
+struct Canvas {
+  Canvas(const QImage& of, const QImage& tile) : picture(of), painter(&picture), brush(tile) {
+    painter.setBrushOrigin(-static_cast<int>(kTileX), -static_cast<int>(kTileY));
+  }
+  QImage picture;
+  QPainter painter;
+  QBrush brush;
+};
+
+void addQt(Contenders& c, uint8* dst, uint8* tile, uint32 bytes, uint32 size, uint32 rop,
+           Extent e) {
+  const auto format = bytes == 4 ? QImage::Format_RGB32 : QImage::Format_RGB16;
+  const int side = static_cast<int>(size);
+  const auto canvas = std::make_shared<Canvas>(
+      QImage(dst, static_cast<int>(e.width), static_cast<int>(e.height),
+             static_cast<qsizetype>(e.width * bytes), format),
+      QImage(tile, side, side, static_cast<qsizetype>(tilePitch(size, bytes)), format));
+  canvas->painter.setCompositionMode(rop == kXor ? QPainter::RasterOp_SourceXorDestination
+                                                 : QPainter::CompositionMode_Source);
+  c.add("Qt6~x", [=] { canvas->painter.fillRect(canvas->picture.rect(), canvas->brush); });
+}
+#endif
+
+void tileJob(const std::string& name, uint32 bytes, uint32 size, uint32 rop) {
+  bench::job("tile/" + name, [=](Contenders& c, Extent e) {
+    uint8* dst = bench::buffer(0);
+    uint8* tile = bench::buffer(1);
+    const uint32 pitch = e.width * bytes;
+    c.add("raster", [=] {
+      Raster_RectPixmapROPcopy(dst, pitch, tile, tilePitch(size, bytes), static_cast<int32>(bytes),
+                               kTileX, kTileY, size, size, rop, 0, 0, e.width, e.height);
+    });
+    c.add("limit", [=] { memset(dst, 0x5A, size_t{pitch} * e.height); });
+#ifdef HAVE_PIXMAN
+    if (rop == kCopy) addPixman(c, dst, tile, bytes, size, e);
+#endif
+#ifdef HAVE_QT6
+    if (bytes == 4 || (bytes == 2 && rop == kCopy)) addQt(c, dst, tile, bytes, size, rop, e);
+#endif
+  });
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  tileJob("32-copy-64x64", 4, 64, kCopy);
+  tileJob("32-copy-8x8", 4, 8, kCopy);
+  tileJob("24-copy-16x16", 3, 16, kCopy);
+  tileJob("16-copy-8x8", 2, 8, kCopy);
+  tileJob("8-copy-8x8", 1, 8, kCopy);
+  tileJob("32-xor-64x64", 4, 64, kXor);
+  tileJob("32-xor-8x8", 4, 8, kXor);
+  tileJob("24-xor-16x16", 3, 16, kXor);
+  tileJob("16-xor-8x8", 2, 8, kXor);
+  return bench::run(argc, argv);
+}
