@@ -53,6 +53,28 @@ inline RowRun joinRows(intptr_t step, size_t bytes, uint32 rows) {
   return gapless ? RowRun{bytes * rows, 1} : RowRun{bytes, rows};
 }
 
+/// The memory from the first to the last byte of some rows, gaps included. Rows that wrap around
+/// the end of the address space count as everywhere.
+struct RowSpan {
+  uintptr_t first;
+  uintptr_t last;
+
+  RowSpan(const uint8* row, intptr_t step, size_t bytes, uint32 rows)
+      : first(reinterpret_cast<uintptr_t>(row)), last(first) {
+    if (bytes == 0 || rows == 0) return;
+    const uintptr_t distance =
+        step < 0 ? 0 - static_cast<uintptr_t>(step) : static_cast<uintptr_t>(step);
+    uintptr_t extent = 0;
+    bool wraps = __builtin_mul_overflow(distance, uintptr_t{rows} - 1, &extent);
+    wraps |= step < 0 ? __builtin_sub_overflow(first, extent, &first)
+                      : __builtin_add_overflow(last, extent, &last);
+    wraps |= __builtin_add_overflow(last, uintptr_t{bytes} - 1, &last);
+    if (wraps) first = 0, last = UINTPTR_MAX;
+  }
+
+  bool isApartFrom(const RowSpan& other) const { return last < other.first || other.last < first; }
+};
+
 /// One pixel of kBytes bytes, at any alignment.
 template <unsigned kBytes> inline uint32 loadPixel(const uint8* at) {
   if constexpr (kBytes == 3) {

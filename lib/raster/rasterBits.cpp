@@ -2,53 +2,174 @@
 //
 // Expansion of bit planes to pixels: two colours, or one colour through a stencil.
 
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/rasterBits.cpp"
+#include "hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include "pixelPattern-inl.h"
+#include "rasterBitsInternal.h"
+#include "rows-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+/// The last pixels of a row, or all of them: each from its own bit, without a branch.
+template <unsigned kBytes, bool kStencil>
+HWY_INLINE void expandOneByOne(const uint8* bits, uint8* dst, size_t first, size_t width,
+                               const BitColors& colors) {
+  for (size_t x = first; x < width; ++x) {
+    const uint32 set = 0 - (uint32{bits[x / 8]} >> (7 - x % 8) & 1);
+    const uint32 clear = kStencil ? loadPixel<kBytes>(dst + x * kBytes) : colors.background;
+    storePixel<kBytes>(dst + x * kBytes, (colors.foreground & set) | (clear & ~set));
+  }
+}
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <unsigned kBytes, bool kStencil>
+void expandRows(const Expansion& e, const BitColors& colors) {
+  const uint8* bits = e.bits;
+  uint8* dst = e.dst;
+  for (uint32 y = e.height; y != 0;
+       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch))
+    expandOneByOne<kBytes, kStencil>(bits, dst, 0, e.width, colors);
+}
+
+#else
+
+using Bytes = hn::ScalableTag<uint8>;
+
+/// For every byte of a run of pixels: which byte of the plane, and which bit there, decides on it.
+template <unsigned kBytes> struct BitOfByte {
+  uint8 byte[kBytes * kLanes<Bytes>];
+  uint8 bit[kBytes * kLanes<Bytes>];
+
+  constexpr BitOfByte() : byte(), bit() {
+    for (size_t i = 0; i < sizeof byte; ++i) {
+      byte[i] = static_cast<uint8>(i / kBytes / 8);
+      bit[i] = static_cast<uint8>(0x80 >> i / kBytes % 8);
+    }
+  }
+};
+template <unsigned kBytes> inline constexpr BitOfByte<kBytes> kBitOfByte;
+
+/// The constant pixels of a call, in memory.
+struct Patterns {
+  PixelPattern foreground;
+  PixelPattern background;
+};
+
+/// Expands as many pixels as `d` has lanes, which takes kBytes vectors.
+template <unsigned kBytes, bool kStencil, class D>
+HWY_INLINE void expandGroup(D d, const uint8* bits, uint8* dst, const Patterns& patterns) {
+  const hn::Repartition<uint64, D> d64;
+  uint64 plane = 0;
+  memcpy(&plane, bits, kLanes<D> / 8);
+  const auto everywhere = hn::BitCast(d, hn::Set(d64, plane));
+  for (size_t i = 0; i < kBytes * kLanes<D>; i += kLanes<D>) {
+    const auto bit = hn::LoadU(d, kBitOfByte<kBytes>.bit + i);
+    const auto byte = hn::TableLookupBytes(everywhere, hn::LoadU(d, kBitOfByte<kBytes>.byte + i));
+    const auto clear = hn::LoadU(d, kStencil ? dst + i : patterns.background.bytes + i);
+    const auto set = hn::LoadU(d, patterns.foreground.bytes + i);
+    hn::StoreU(hn::IfThenElse(hn::TestBit(byte, bit), set, clear), d, dst + i);
+  }
+}
+
+/// Expands the pixels of a row from `x` on in groups of the lanes of `d` and then of smaller ones;
+/// returns the first pixel that is left.
+template <unsigned kBytes, bool kStencil, class D>
+HWY_INLINE size_t expandGroups(D d, const uint8* bits, uint8* dst, size_t x, size_t width,
+                               const Patterns& patterns) {
+  for (; width - x >= kLanes<D>; x += kLanes<D>)
+    expandGroup<kBytes, kStencil>(d, bits + x / 8, dst + x * kBytes, patterns);
+  if constexpr (kLanes < D >> 8) {
+    if (width - x >= 8)
+      x = expandGroups<kBytes, kStencil>(hn::Half<D>(), bits, dst, x, width, patterns);
+  }
+  return x;
+}
+
+template <unsigned kBytes, bool kStencil>
+void expandRows(const Expansion& e, const BitColors& colors) {
+  const Patterns patterns = {patternOf(repeatPixel(colors.foreground, kBytes)),
+                             patternOf(repeatPixel(colors.background, kBytes))};
+  const uint8* bits = e.bits;
+  uint8* dst = e.dst;
+  for (uint32 y = e.height; y != 0;
+       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch)) {
+    const size_t x = expandGroups<kBytes, kStencil>(Bytes(), bits, dst, 0, e.width, patterns);
+    expandOneByOne<kBytes, kStencil>(bits, dst, x, e.width, colors);
+  }
+}
+
+#endif
+
+constexpr BitsKernels kKernels = {
+    {expandRows<1, false>, expandRows<2, false>, expandRows<3, false>, expandRows<4, false>},
+    {expandRows<1, true>, expandRows<2, true>, expandRows<3, true>, expandRows<4, true>}};
+
+}  // namespace
+
+const BitsKernels* bitsKernels() { return &kKernels; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
 #include <algorithm>
 
-#include "frameBuffer.h"
+#include "kernelChoice.h"
 #include "raster.h"
 
 namespace raster {
 namespace {
 
-/// A bit plane, where its pixels go, and their number.
-struct Expansion {
-  const uint8* bits;
-  intptr_t bitsPitch;
-  uint8* dst;
-  intptr_t dstPitch;
-  int32 width;
-  int32 height;
-};
+HWY_EXPORT(bitsKernels);
 
-/// What becomes of set and of clear bits. A stencil leaves the pixels of clear bits alone.
-struct BitColors {
-  uint32 foreground;
-  uint32 background;
-  bool stencil;
-};
+const BitsKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(bitsKernels)(); }
+const BitsKernels& kernels() { return chosenKernels<lookUpKernels>(); }
 
-constexpr int32 kNibble = 4;
+constexpr size_t kNibble = 4;
 
-template <unsigned kBytes>
-void expandNibble(uint8* dst, uint32 nibble, int32 count, const BitColors& colors) {
-  for (int32 k = 0; k < count; ++k, dst += kBytes) {
-    const bool set = (nibble >> (kNibble - 1 - k) & 1) != 0;
-    if (set || !colors.stencil)
-      storePixel<kBytes>(dst, set ? colors.foreground : colors.background);
+/// Sizes that are not positive mean that there is nothing to do.
+Expansion expansionOf(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch, int32 width,
+                      int32 height) {
+  return {bits,
+          pitchOf(bitsPitch),
+          dst,
+          pitchOf(dstPitch),
+          static_cast<size_t>(std::max(width, 0)),
+          static_cast<uint32>(std::max(height, 0))};
+}
+
+/// Four pixels after each look at the plane, which may lie in the rectangle.
+template <unsigned kBytes> void walk(const Expansion& e, const BitColors& colors, bool stencil) {
+  const uint8* bits = e.bits;
+  uint8* dst = e.dst;
+  for (uint32 y = e.height; y != 0;
+       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch)) {
+    uint32 byte = 0;
+    for (size_t x = 0; x < e.width; ++x) {
+      if (x % kNibble == 0) byte = bits[x / 8];
+      const bool set = (byte >> (7 - x % 8) & 1) != 0;
+      if (set || !stencil)
+        storePixel<kBytes>(dst + x * kBytes, set ? colors.foreground : colors.background);
+    }
   }
 }
 
-/// The expansion as it is defined, four pixels after each look at the plane.
-template <unsigned kBytes> void expand(const Expansion& e, const BitColors& colors) {
-  const uint8* bits = e.bits;
-  uint8* dst = e.dst;
-  for (int32 y = 0; y < e.height;
-       ++y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch)) {
-    for (int32 x = 0; x < e.width; x += std::min(e.width - x, kNibble)) {
-      const uint32 byte = bits[x / 8];
-      expandNibble<kBytes>(dst + static_cast<size_t>(x) * kBytes, x % 8 == 0 ? byte >> 4 : byte,
-                           std::min(e.width - x, kNibble), colors);
-    }
+template <unsigned kBytes> void expand(const Expansion& e, const BitColors& colors, bool stencil) {
+  const RowSpan plane(e.bits, e.bitsPitch, (e.width + 7) / 8, e.height);
+  const RowSpan pixels(e.dst, e.dstPitch, e.width * kBytes, e.height);
+  if (e.width == 0 || e.height == 0) return;
+  if (plane.isApartFrom(pixels)) {
+    (stencil ? kernels().stencil : kernels().twoColors)[kBytes - 1](e, colors);
+  } else {
+    walk<kBytes>(e, colors, stencil);
   }
 }
 
@@ -56,7 +177,7 @@ template <unsigned kBytes> void expand(const Expansion& e, const BitColors& colo
 }  // namespace raster
 
 using raster::expand;
-using raster::pitchOf;
+using raster::expansionOf;
 
 extern "C" {
 
@@ -64,65 +185,63 @@ void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32
                          int32 bytesPerPixel, int32 width, int32 height, uint32 foreground,
                          uint32 background) {
   raster::withPixelSize(static_cast<uint32>(bytesPerPixel), [&](auto bytes) {
-    expand<bytes>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-                  {foreground, background, false});
+    expand<bytes>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height),
+                  {foreground, background}, false);
   });
 }
 
 void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                                 int32 bytesPerPixel, int32 width, int32 height, uint32 foreground) {
   raster::withPixelSize(static_cast<uint32>(bytesPerPixel), [&](auto bytes) {
-    expand<bytes>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-                  {foreground, 0, true});
+    expand<bytes>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, 0},
+                  true);
   });
 }
 
 void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                          int32 width, int32 height, uint32 foreground, uint32 background) {
-  expand<1>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, background, false});
+  expand<1>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, background},
+            false);
 }
 
 void RasterBitsToPixels16(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                           int32 width, int32 height, uint32 foreground, uint32 background) {
-  expand<2>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, background, false});
+  expand<2>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, background},
+            false);
 }
 
 void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                           int32 width, int32 height, uint32 foreground, uint32 background) {
-  expand<3>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, background, false});
+  expand<3>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, background},
+            false);
 }
 
 void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                           int32 width, int32 height, uint32 foreground, uint32 background) {
-  expand<4>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, background, false});
+  expand<4>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, background},
+            false);
 }
 
 void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                                 int32 width, int32 height, uint32 foreground) {
-  expand<1>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, 0, true});
+  expand<1>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, 0}, true);
 }
 
 void RasterBitsToPixelsStencil16(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                                  int32 width, int32 height, uint32 foreground) {
-  expand<2>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, 0, true});
+  expand<2>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, 0}, true);
 }
 
 void RasterBitsToPixelsStencil24(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                                  int32 width, int32 height, uint32 foreground) {
-  expand<3>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, 0, true});
+  expand<3>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, 0}, true);
 }
 
 void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                                  int32 width, int32 height, uint32 foreground) {
-  expand<4>({bits, pitchOf(bitsPitch), dst, pitchOf(dstPitch), width, height},
-            {foreground, 0, true});
+  expand<4>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height), {foreground, 0}, true);
 }
 
 }  // extern "C"
+
+#endif
