@@ -23,21 +23,12 @@ namespace {
 
 using Bytes = hn::ScalableTag<uint8>;
 
-/// Combines one block of lanes; reads only what the operation depends on.
-template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uint8* dst) {
-  auto s = hn::Zero(d);
-  auto t = hn::Zero(d);
-  if constexpr (kReadsSrc<Rop>) s = loadLanes(d, src);
-  if constexpr (kReadsDst<Rop>) t = loadLanes(d, dst);
-  storeLanes(d, Rop{}(s, t), dst);
-}
-
 template <class Rop> void rowsToRight(const RopRows& rows) {
   uint8* dst = rows.dst;
   const uint8* src = rows.src;
   for (uint32 y = rows.height; y != 0;
        --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep)) {
-    forLanes(Bytes(), rows.bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
+    combineToRight<Rop>(dst, src, rows.bytes);
   }
 }
 

@@ -13,6 +13,9 @@ inline constexpr uint32 kRopCount = 16;
 inline constexpr uint32 kRopCopy = 3;
 inline constexpr uint32 kRopNoop = 5;
 
+/// Whether an operation (0 to 15) depends on the source. A code is the operation's truth table.
+constexpr bool ropReadsSource(uint32 rop) { return (rop & 3) != rop >> 2; }
+
 /// Source rows and destination rows: the leftmost byte of the first row to be processed, the signed
 /// step to the next one, and the size of both.
 struct RopRows {

@@ -16,6 +16,7 @@
 
 #include "baseTypes.h"
 #include "hwy/highway.h"
+#include "rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -61,6 +62,21 @@ template <class Rop>
 inline constexpr bool kReadsSrc = (kTruthTable<Rop> & 3) != kTruthTable<Rop> >> 2;
 template <class Rop>
 inline constexpr bool kReadsDst = (kTruthTable<Rop> & 5) != (kTruthTable<Rop> >> 1 & 5);
+
+/// Combines one block of lanes; reads only what the operation depends on.
+template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uint8* dst) {
+  auto s = hn::Zero(d);
+  auto t = hn::Zero(d);
+  if constexpr (kReadsSrc<Rop>) s = loadLanes(d, src);
+  if constexpr (kReadsDst<Rop>) t = loadLanes(d, dst);
+  storeLanes(d, Rop{}(s, t), dst);
+}
+
+/// Combines a row from left to right, a vector at a time.
+template <class Rop> HWY_INLINE void combineToRight(uint8* dst, const uint8* src, size_t bytes) {
+  forLanes(hn::ScalableTag<uint8>(), bytes,
+           [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
+}
 
 /// A table by code of what `entry` makes of each operation.
 template <class Entry> constexpr auto ropTable(Entry entry) {

@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: MIT
+//
+// What the tiling kernels of the instruction-set levels and their caller share.
+
+#ifndef RASTER_RASTERPIX_INTERNAL_H
+#define RASTER_RASTERPIX_INTERNAL_H
+
+#include "frameBuffer.h"
+
+namespace raster {
+
+/// Destination rows, and the pixmap rows that repeat in them: the row `srcY` of `srcRows` falls on
+/// the first destination row, and the byte `phase` of `period` on its first byte.
+struct TileRows {
+  uint8* dst;
+  intptr_t dstStep;
+  size_t bytes;
+  uint32 height;
+  const uint8* src;
+  intptr_t srcStep;
+  uint32 srcRows;
+  uint32 srcY;
+  size_t period;
+  size_t phase;
+};
+
+/// What the kernels of one instruction-set level offer.
+struct TileKernels {
+  /// By operation. The order of the pixels must not matter.
+  using Tile = void (*)(const TileRows& rows);
+  const Tile* tile;
+  /// Writes the pixmap rows for the first min(height, srcRows) destination rows to `wide`, each
+  /// from its phase on and repeated up to `wideBytes`.
+  void (*widen)(const TileRows& rows, uint8* wide, size_t wideBytes);
+};
+
+}  // namespace raster
+
+#endif
