@@ -2,15 +2,16 @@
 //
 // Alpha blending: fourteen operators onto six destination formats, in place and staged.
 
+#include "alphaBlendInternal.h"
+
 #include <algorithm>
 #include <array>
-#include <cstring>
-#include <tuple>
+#include <csignal>
 #include <utility>
 
-#include "alphaBlendInternal.h"
 #include "panicPlace.h"
 #include "raster.h"
+#include "rasteropsInternal.h"
 
 namespace raster {
 namespace {
@@ -19,136 +20,185 @@ constexpr char kSource[] = "lib/raster/alphaBlend";
 constexpr int kBadFormatLine = 205;  // part of the message, whatever line the call stands on
 constexpr int kBadFormatBug = 19864;
 
-constexpr uint32 kFlagSrcAlpha = 1;
-constexpr uint32 kFlagDstAlpha = 2;
+constexpr uint32 kSaturate = 13;
 
-constexpr uint32 mul(uint32 a, uint32 b) { return a * b / 255; }
-constexpr uint32 inv(uint32 a) { return 255 - a; }
-constexpr uint32 add(uint32 a, uint32 b) { return a + b < 255 ? a + b : 255; }
+/// A destination format: its pixel size and where its kernels are.
+struct Format {
+  uint32 bytes;
+  const FormatKernels& (*kernels)();
+};
+constexpr Format kFormats[] = {{1, blendKernels6},  {1, blendKernels8},  {2, blendKernels15},
+                               {2, blendKernels16}, {3, blendKernels24}, {4, blendKernels32}};
 
-/// One channel with both alphas, and the factor of Saturate.
-struct Channel {
-  uint32 s, d, sa, da, f;
+/// The arguments of a call that reach the kernels.
+struct Call {
+  uint8* dst;
+  uint32 dstX, dstY, dstPitch;
+  const uint8* src;
+  uint32 srcX, srcY, srcPitch;
+  uint32 width, height;
+  uint32 flags, srcAlpha, dstAlpha;
 };
 
-// The operators (Porter and Duff, 1984), by number.
-constexpr auto kOperators =
-    std::make_tuple([](const Channel&) { return 0u; }, [](const Channel& c) { return c.s; },
-                    [](const Channel& c) { return c.d; },
-                    [](const Channel& c) { return add(c.s, mul(c.d, inv(c.sa))); },
-                    [](const Channel& c) { return add(c.d, mul(c.s, inv(c.da))); },
-                    [](const Channel& c) { return mul(c.s, c.da); },
-                    [](const Channel& c) { return mul(c.d, c.sa); },
-                    [](const Channel& c) { return mul(c.s, inv(c.da)); },
-                    [](const Channel& c) { return mul(c.d, inv(c.sa)); },
-                    [](const Channel& c) { return add(mul(c.s, c.da), mul(c.d, inv(c.sa))); },
-                    [](const Channel& c) { return add(mul(c.d, c.sa), mul(c.s, inv(c.da))); },
-                    [](const Channel& c) { return add(mul(c.d, c.sa), mul(c.s, inv(c.da))); },
-                    [](const Channel& c) { return add(c.s, c.d); },
-                    [](const Channel& c) { return add(c.d, mul(c.s, c.f)); });
-
-/// Where a channel lies in a pixel; 3-bit fields repeat their low bits, all others their high ones.
-template <unsigned kShift, unsigned kBits> struct Field {
-  static constexpr uint32 widen(uint32 pixel) {
-    const uint32 c = pixel >> kShift & ((1u << kBits) - 1);
-    if constexpr (kBits == 2) return c * 0x55;
-    if constexpr (kBits == 3) return c << 5 | c << 2 | (c & 3);
-    return c << (8 - kBits) | c >> (kBits >= 4 ? 2 * kBits - 8 : 0);
+/// (255 - da) / da, at most 255. Deliberate: a destination alpha of 0 faults as the division does.
+uint8 saturateShare(uint32 da) {
+  if (da == 0) {
+    static_cast<void>(raise(SIGFPE));
+    __builtin_trap();
   }
-  static constexpr uint32 narrow(uint32 c) { return c >> (8 - kBits) << kShift; }
+  return static_cast<uint8>(std::min(255u, (255 - da) / da));
+}
+
+BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
+  const bool scalesSrc = (call.flags & kFlagSrcAlpha) != 0;
+  const bool scalesDst = (call.flags & kFlagDstAlpha) != 0;
+  const auto dstAlpha = static_cast<uint8>(scalesDst ? call.dstAlpha : 255);
+  BlendRect rect{};
+  rect.dstStep = pitchOf(call.dstPitch);
+  rect.dst = rowAt(call.dst, rect.dstStep, call.dstY, call.dstX, bytes);
+  rect.srcStep = pitchOf(call.srcPitch);
+  rect.src = rowAt(call.src, rect.srcStep, call.srcY, call.srcX, 4);
+  rect.width = call.width;
+  rect.height = call.height;
+  rect.srcAlpha = static_cast<uint8>(scalesSrc ? call.srcAlpha : 255);
+  rect.dstAlpha = dstAlpha;
+  rect.saturateShare = op == kSaturate ? saturateShare(dstAlpha) : uint8{0};
+  return rect;
+}
+
+/// The kernel for the constants of a call: those of 255 change nothing.
+BlendKernel kernelFor(const FormatKernels& kernels, uint32 op, const BlendRect& rect) {
+  const uint32 flags =
+      (rect.srcAlpha != 255 ? kFlagSrcAlpha : 0) | (rect.dstAlpha != 255 ? kFlagDstAlpha : 0);
+  return kernels[op][flags];
+}
+
+/// The addresses [first, end) of all rows of a rectangle and between them.
+struct Span {
+  uintptr_t first, end;
 };
+Span spanOf(const uint8* row, intptr_t step, size_t bytes, uint32 height) {
+  const auto first = reinterpret_cast<uintptr_t>(row);
+  const auto last = reinterpret_cast<uintptr_t>(rowAt(row, step, height - 1, 0, 0));
+  return {std::min(first, last), std::max(first, last) + bytes};
+}
+bool overlap(const Span& a, const Span& b) { return a.first < b.end && b.first < a.end; }
 
-template <unsigned kSize, class C0, class C1, class C2> struct Format {
-  static constexpr unsigned kBytes = kSize;
-  static constexpr unsigned kColorBytes = kSize < 4 ? kSize : 3;  // byte 3 is never touched
-  static void load(const uint8* at, uint32* c) {
-    const uint32 pixel = loadPixel<kColorBytes>(at);
-    c[0] = C0::widen(pixel), c[1] = C1::widen(pixel), c[2] = C2::widen(pixel);
-  }
-  static void store(uint8* at, const uint32* c) {
-    storePixel<kColorBytes>(at, C0::narrow(c[0]) | C1::narrow(c[1]) | C2::narrow(c[2]));
-  }
-};
-using Formats = std::tuple<Format<1, Field<0, 2>, Field<2, 2>, Field<4, 2>>,
-                           Format<1, Field<6, 2>, Field<3, 3>, Field<0, 3>>,
-                           Format<2, Field<0, 5>, Field<5, 5>, Field<10, 5>>,
-                           Format<2, Field<0, 5>, Field<5, 6>, Field<11, 5>>,
-                           Format<3, Field<0, 8>, Field<8, 8>, Field<16, 8>>,
-                           Format<4, Field<0, 8>, Field<8, 8>, Field<16, 8>>>;
+/// Whether a kernel, which reads some pixels ahead of those that it has written, gives what the
+/// walk from pixel to pixel gives.
+bool mayReadAhead(const BlendRect& r, uint32 bytes) {
+  const Span dst = spanOf(r.dst, r.dstStep, r.width * bytes, r.height);
+  const Span src = spanOf(r.src, r.srcStep, r.width * 4, r.height);
+  return !overlap(dst, src) || (bytes == 4 && r.height == 1 && dst.first <= src.first);
+}
 
-template <class Format, size_t kOp>
-void blendPixels(uint8* dst, const uint8* src, size_t count, const BlendConstants& constants) {
-  for (; count != 0; --count, dst += Format::kBytes, src += 4) {
-    Channel channel{};
-    uint32 c[3] = {};
-    Format::load(dst, c);
-    channel.sa = mul(src[3], constants.srcAlpha);
-    channel.da = constants.dstAlpha;
-    if constexpr (kOp == 13) channel.f = std::min(255u, inv(channel.da) / channel.da);
-    for (unsigned i = 0; i < 3; ++i) {
-      channel.s = mul(src[i], constants.srcAlpha);
-      channel.d = mul(c[i], constants.dstAlpha);
-      c[i] = std::get<kOp>(kOperators)(channel);
+/// Blends rows that overlap their sources, one by one and pixel by pixel where it matters.
+void blendOverlapping(const BlendRect& all, uint32 bytes, BlendKernel kernel) {
+  BlendRect row = all;
+  row.height = 1;
+  for (uint32 y = 0; y < all.height; ++y) {
+    row.dst = rowAt(all.dst, all.dstStep, y, 0, 0);
+    row.src = rowAt(all.src, all.srcStep, y, 0, 0);
+    row.width = all.width;
+    if (mayReadAhead(row, bytes)) {
+      kernel(row);
+      continue;
     }
-    Format::store(dst, c);
+    row.width = 1;
+    for (size_t x = 0; x < all.width; ++x, row.dst += bytes, row.src += 4) kernel(row);
   }
 }
 
-template <size_t kFormat, size_t kOp, bool kStaged>
-void blendRect(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src, uint32 srcX,
-               uint32 srcY, uint32 srcPitch, uint32 width, uint32 height, uint32 flags,
-               uint32 srcAlpha, uint32 dstAlpha) {
-  using F = std::tuple_element_t<kFormat, Formats>;
-  const BlendConstants constants{(flags & kFlagSrcAlpha) != 0 ? srcAlpha & 255 : 255,
-                                 (flags & kFlagDstAlpha) != 0 ? dstAlpha & 255 : 255};
-  uint8* dstRow = rowAt(dst, pitchOf(dstPitch), dstY, dstX, F::kBytes);
-  const uint8* srcRow = rowAt(src, pitchOf(srcPitch), srcY, srcX, 4);
-  for (; height != 0; --height) {
-    if constexpr (kStaged) {
-      uint8 stage[kStageBytes];
-      constexpr size_t kPixels = kStageBytes / F::kBytes;
-      for (size_t x = 0; x < width; x += kPixels) {
-        const size_t count = std::min<size_t>(kPixels, width - x);
-        memcpy(stage, dstRow + x * F::kBytes, count * F::kBytes);
-        blendPixels<F, kOp>(stage, srcRow + x * 4, count, constants);
-        memcpy(dstRow + x * F::kBytes, stage, count * F::kBytes);
-      }
-    } else {
-      blendPixels<F, kOp>(dstRow, srcRow, width, constants);
+void blendInPlace(BlendRect rect, uint32 bytes, BlendKernel kernel) {
+  if (!mayReadAhead(rect, bytes)) {
+    blendOverlapping(rect, bytes, kernel);
+    return;
+  }
+  const bool gapless = rect.dstStep == static_cast<intptr_t>(rect.width * bytes) &&
+                       rect.srcStep == static_cast<intptr_t>(rect.width * 4);
+  if (gapless) {
+    rect.width *= rect.height;
+    rect.height = 1;
+  }
+  kernel(rect);
+}
+
+/// Blends rows through a buffer that holds them.
+void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, BlendKernel kernel) {
+  uint8* const dst = rect.dst;
+  const intptr_t dstStep = rect.dstStep;
+  const auto span = static_cast<uint32>(rect.width * bytes);
+  rectCopy(stage, static_cast<intptr_t>(span), dst, dstStep, 1, 0, 0, 0, 0, span, rect.height);
+  rect.dst = stage;
+  rect.dstStep = static_cast<intptr_t>(span);
+  blendInPlace(rect, bytes, kernel);
+  rectCopy(dst, dstStep, stage, rect.dstStep, 1, 0, 0, 0, 0, span, rect.height);
+}
+
+/// How many rows the buffer may hold at once: one where a row depends on those before it.
+uint32 rowsAtOnce(const BlendRect& rect, uint32 bytes) {
+  const size_t span = rect.width * bytes;
+  const Span dst = spanOf(rect.dst, rect.dstStep, span, rect.height);
+  const Span src = spanOf(rect.src, rect.srcStep, rect.width * 4, rect.height);
+  const auto step = static_cast<size_t>(rect.dstStep < 0 ? -rect.dstStep : rect.dstStep);
+  if (span > kStageBytes || step < span || overlap(dst, src)) return 1;
+  return static_cast<uint32>(kStageBytes / span);
+}
+
+/// Moves the destination through a buffer, so that frame-buffer memory is touched by block copies
+/// only, of at most kStageBytes each.
+void blendStaged(BlendRect all, uint32 bytes, BlendKernel kernel) {
+  alignas(64) uint8 stage[kStageBytes];
+  const size_t pixels = kStageBytes / bytes;
+  const uint32 rows = rowsAtOnce(all, bytes);
+  for (uint32 y = 0; y < all.height; y += rows) {
+    BlendRect part = all;
+    part.height = std::min(rows, all.height - y);
+    for (size_t x = 0; x < all.width; x += pixels) {
+      part.dst = rowAt(all.dst, all.dstStep, y, 0, 0) + x * bytes;
+      part.src = rowAt(all.src, all.srcStep, y, 0, 0) + x * 4;
+      part.width = std::min(pixels, all.width - x);
+      blendThrough(stage, part, bytes, kernel);
     }
-    dstRow = nextRow(dstRow, pitchOf(dstPitch));
-    srcRow = nextRow(srcRow, pitchOf(srcPitch));
   }
 }
+
+void blend(const Call& call, const Format& format, uint32 op, bool staged) {
+  if (call.width == 0 || call.height == 0) return;
+  const BlendRect rect = rowsOf(call, op, format.bytes);
+  const BlendKernel kernel = kernelFor(format.kernels(), op, rect);
+  (staged ? blendStaged : blendInPlace)(rect, format.bytes, kernel);
+}
+
+template <size_t kFormat, uint32 kOp, bool kStaged> void blendWith(const Call& call) {
+  blend(call, kFormats[kFormat], kOp, kStaged);
+}
+
+/// The blends of one operator onto one format.
+struct Pair {
+  void (*inPlace)(const Call& call);
+  void (*staged)(const Call& call);
+};
+using Row = std::array<Pair, 16>;
 
 template <size_t kFormat, size_t... kOps>
-constexpr BlendRow blendRow(std::index_sequence<kOps...>) {
-  return {BlendPair{blendRect<kFormat, kOps, false>, blendRect<kFormat, kOps, true>}...,
-          BlendPair{nullptr, nullptr}, BlendPair{nullptr, nullptr}};
+constexpr Row tableRow(std::index_sequence<kOps...> /*operators*/) {
+  return {Pair{blendWith<kFormat, kOps, false>, blendWith<kFormat, kOps, true>}..., Pair{}, Pair{}};
 }
-template <size_t... kFormats> constexpr auto blendTable(std::index_sequence<kFormats...>) {
-  return std::array<BlendRow, sizeof...(kFormats)>{
-      blendRow<kFormats>(std::make_index_sequence<14>())...};
+template <size_t... kIndex>
+constexpr std::array<Row, sizeof...(kIndex)> tableOf(std::index_sequence<kIndex...> /*formats*/) {
+  return {tableRow<kIndex>(std::make_index_sequence<kBlendOperators>())...};
 }
-constexpr auto kTable = blendTable(std::make_index_sequence<6>());
+constexpr auto kTable = tableOf(std::make_index_sequence<std::size(kFormats)>());
 
-size_t tableRow(uint32 depth, uint32 bpp) {
-  switch (depth) {
-    case 6:
-      return 0;
-    case 8:
-      return 1;
-    case 15:
-      return 2;
-    case 16:
-      return 3;
-    case 24:
-      if (bpp == 24) return 4;
-      if (bpp == 32) return 5;
-      break;
-    default:
-      break;
-  }
+/// Deliberate: bits per pixel decide for depth 24 only.
+const Row& rowFor(uint32 depth, uint32 bpp) {
+  if (depth == 6) return kTable[0];
+  if (depth == 8) return kTable[1];
+  if (depth == 15) return kTable[2];
+  if (depth == 16) return kTable[3];
+  if (depth == 24 && bpp == 24) return kTable[4];
+  if (depth == 24 && bpp == 32) return kTable[5];
   assertFailed({kSource, kBadFormatLine}, kBadFormatBug);
 }
 
@@ -158,9 +208,9 @@ void alphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uin
                 uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
                 uint32 depth, uint32 bpp, uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
                 uint8 staged) {
-  const BlendPair& pair = kTable[tableRow(depth, bpp)][op];
-  (staged != 0 ? pair.staged : pair.inPlace)(dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch,
-                                             width, height, flags, srcAlpha, dstAlpha);
+  const Pair& pair = rowFor(depth, bpp)[op];
+  (staged != 0 ? pair.staged : pair.inPlace)({dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch,
+                                              width, height, flags, srcAlpha, dstAlpha});
 }
 
 }  // namespace raster

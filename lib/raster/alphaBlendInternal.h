@@ -11,27 +11,45 @@
 
 namespace raster {
 
+inline constexpr size_t kBlendOperators = 14;
+inline constexpr uint32 kBlendOver = 3;
+
 /// The most bytes that the staged variant moves at once: whole pixels of every format.
 inline constexpr size_t kStageBytes = 3072;
 
-inline constexpr uint32 kBlendOver = 3;
+/// The flags of a blend that the kernels know.
+inline constexpr uint32 kFlagSrcAlpha = 1;
+inline constexpr uint32 kFlagDstAlpha = 2;
 
-/// The constant alphas of a call, 255 where there is none.
-struct BlendConstants {
-  uint32 srcAlpha;
-  uint32 dstAlpha;
+/// A rectangle to blend, as rows.
+struct BlendRect {
+  uint8* dst;
+  intptr_t dstStep;
+  const uint8* src;
+  intptr_t srcStep;
+  size_t width;
+  uint32 height;
+  uint8 srcAlpha;       ///< 255 without kFlagSrcAlpha
+  uint8 dstAlpha;       ///< 255 without kFlagDstAlpha
+  uint8 saturateShare;  ///< the source's share of Saturate
 };
 
-/// A kernel: blends one rectangle with one operator onto one format.
-using BlendKernel = void (*)(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
-                             const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
-                             uint32 width, uint32 height, uint32 flags, uint32 srcAlpha,
-                             uint32 dstAlpha);
-struct BlendPair {
-  BlendKernel inPlace;
-  BlendKernel staged;
-};
-using BlendRow = std::array<BlendPair, 16>;
+/// Blends a rectangle whose pixels do not overlap their sources.
+using BlendKernel = void (*)(const BlendRect& rect);
+
+/// By the two flags.
+using BlendVariants = std::array<BlendKernel, 4>;
+
+/// By operator.
+using FormatKernels = std::array<BlendVariants, kBlendOperators>;
+
+/// The kernels of the formats, for the processor.
+const FormatKernels& blendKernels6();
+const FormatKernels& blendKernels8();
+const FormatKernels& blendKernels15();
+const FormatKernels& blendKernels16();
+const FormatKernels& blendKernels24();
+const FormatKernels& blendKernels32();
 
 /// As Raster_AlphaBlend.
 void alphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src,

@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: MIT
+//
+// Blending onto pixels of two bytes.
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/alphaBlend16.cpp"
+#include "hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include "blendKernels-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+using Bgr555 = Packed<uint16, Field<0, 5>, Field<5, 5>, Field<10, 5>>;
+using Bgr565 = Packed<uint16, Field<0, 5>, Field<5, 6>, Field<11, 5>>;
+
+}  // namespace
+
+const FormatKernels* kernels15() { return &kKernelsOf<Bgr555>; }
+const FormatKernels* kernels16() { return &kKernelsOf<Bgr565>; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
+namespace raster {
+
+namespace {
+HWY_EXPORT(kernels15);
+HWY_EXPORT(kernels16);
+}  // namespace
+
+const FormatKernels& blendKernels15() { return *HWY_DYNAMIC_DISPATCH(kernels15)(); }
+const FormatKernels& blendKernels16() { return *HWY_DYNAMIC_DISPATCH(kernels16)(); }
+
+}  // namespace raster
+
+#endif

@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: MIT
+//
+// Blending onto pixels of one byte.
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/alphaBlend8.cpp"
+#include "hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include "blendKernels-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+using Bgr222 = Packed<uint8, Field<0, 2>, Field<2, 2>, Field<4, 2>>;
+using Bgr233 = Packed<uint8, Field<6, 2>, Field<3, 3>, Field<0, 3>>;
+
+}  // namespace
+
+const FormatKernels* kernels6() { return &kKernelsOf<Bgr222>; }
+const FormatKernels* kernels8() { return &kKernelsOf<Bgr233>; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
+namespace raster {
+
+namespace {
+HWY_EXPORT(kernels6);
+HWY_EXPORT(kernels8);
+}  // namespace
+
+const FormatKernels& blendKernels6() { return *HWY_DYNAMIC_DISPATCH(kernels6)(); }
+const FormatKernels& blendKernels8() { return *HWY_DYNAMIC_DISPATCH(kernels8)(); }
+
+}  // namespace raster
+
+#endif
