@@ -8,7 +8,7 @@
 
 #include <algorithm>
 #include <bit>
-#include <cstring>
+#include <cstdint>
 
 #include "panicPlace.h"
 #include "raster.h"
@@ -36,12 +36,8 @@ uint32 areaOf(const RectListEntry& r) {
   return static_cast<uint32>(r.width) * static_cast<uint32>(r.height);
 }
 
-/// The entries before the one that ends the list. Only the width counts.
-uint32 usedEntries(const RectList& list) {
-  uint32 count = 0;
-  while (count < kListSize && list.rects[count].width > 0) ++count;
-  return count;
-}
+/// Whether the list ends before entry `i`. Only the width counts.
+bool endsAt(const RectList& list, uint32 i) { return i == kListSize || list.rects[i].width <= 0; }
 
 /// The first entry of a list, unlike the others, is unused by its height too.
 bool isCleared(const RectList& list) {
@@ -56,206 +52,214 @@ constexpr Rects kNone = 0;
 /// The bit of the rectangle that is subtracted.
 constexpr Rects kCut = Rects{1} << kListSize;
 
-/// A scanline where rectangles begin or end.
-struct Edge {
-  int32 y;
-  Rects changes;
-};
-
-/// The edges of all rectangles, ascending, each y once.
+/// The scanlines where rectangles begin or end, ascending; one may come several times.
+///
+/// The fields of an entry lie in arrays of their own, here and in the spans: values that were just
+/// stored are soon loaded again, and processors are slow where a load spans several stores.
 class EdgeTable {
  public:
+  /// Before the first edge stands one that stops every insertion.
+  EdgeTable() { y_[0] = INT32_MIN; }
+
   /// Adds the top and the bottom of a rectangle.
-  void add(int32 top, int32 bottom, Rects rect) {
-    const Rects changes = top < bottom ? rect : kNone;
-    insert({top, changes});
-    insert({bottom, changes});
+  void add(const RectListEntry& r, Rects rect) {
+    const int32 bottom = bottomOf(r);
+    const Rects changes = r.y < bottom ? rect : kNone;
+    insert(r.y, changes);
+    insert(bottom, changes);
   }
 
   /// Lets a rectangle whose own edges are not in the table begin and end at the next ones that are.
-  void addBetween(int32 top, int32 bottom, Rects rect) {
-    if (top >= bottom) return;
-    changeFrom(top, rect);
-    changeFrom(bottom, rect);
+  void addBetween(const RectListEntry& r, Rects rect) {
+    if (r.y >= bottomOf(r)) return;
+    changeFrom(r.y, rect);
+    changeFrom(bottomOf(r), rect);
   }
 
-  const Edge* begin() const { return edges_; }
-  const Edge* end() const { return edges_ + count_; }
+  uint32 count() const { return count_; }
+  int32 y(uint32 edge) const { return y_[edge + 1]; }
+  Rects changes(uint32 edge) const { return changes_[edge + 1]; }
 
  private:
-  void insert(Edge edge) {
-    uint32 at = count_;
-    while (at != 0 && edges_[at - 1].y > edge.y) --at;
-    if (at != 0 && edges_[at - 1].y == edge.y) {
-      edges_[at - 1].changes ^= edge.changes;
-      return;
+  void insert(int32 y, Rects changes) {
+    uint32 at = ++count_;
+    for (; y_[at - 1] > y; --at) {
+      y_[at] = y_[at - 1];
+      changes_[at] = changes_[at - 1];
     }
-    for (uint32 i = count_++; i != at; --i) edges_[i] = edges_[i - 1];
-    edges_[at] = edge;
+    y_[at] = y;
+    changes_[at] = changes;
   }
 
   void changeFrom(int32 y, Rects rect) {
-    uint32 at = 0;
-    while (at != count_ && edges_[at].y < y) ++at;
-    if (at != count_) edges_[at].changes ^= rect;
+    uint32 at = 1;
+    while (at <= count_ && y_[at] < y) ++at;
+    if (at <= count_) changes_[at] ^= rect;
   }
 
   uint32 count_ = 0;
-  Edge edges_[2 * kListSize];
+  int32 y_[1 + 2 * kListSize];
+  Rects changes_[1 + 2 * kListSize];
 };
 
 // ---- Spans -------------------------------------------------------------------------------------
 
-/// The pixels [start, end) of a scanline.
-struct Span {
-  int32 start;
-  int32 end;
-};
+/// The region on one scanline: spans [start, end) from left to right that neither overlap nor
+/// touch.
+struct SpanTable {
+  uint32 count = 0;
+  int32 start[kListSize];
+  int32 end[kListSize];
+  uint32 rect[kListSize];  ///< the rectangle of the result that the span belongs to
 
-/// The region on one scanline: spans from left to right that neither overlap nor touch.
-class SpanTable {
- public:
-  /// Joins [start, end) with the spans that it overlaps or touches.
-  void merge(Span span) {
-    uint32 first = 0;
-    while (first != count_ && spans_[first].end < span.start) ++first;
-    uint32 last = first;
-    for (; last != count_ && spans_[last].start <= span.end; ++last) {
-      span.start = std::min(span.start, spans_[last].start);
-      span.end = std::max(span.end, spans_[last].end);
-    }
-    replace(first, last, 1);
-    spans_[first] = span;
+  /// Puts a span in its place by its start; `join` must follow.
+  void insert(int32 first, int32 last) {
+    uint32 at = count++;
+    for (; at != 0 && start[at - 1] > first; --at) copy(at - 1, at);
+    start[at] = first;
+    end[at] = last;
   }
 
-  /// Takes [start, end) out of the spans. Deliberate: nothing is done about an end before the
-  /// start, which leaves the two sides of a span overlapping.
-  void cut(Span hole) {
-    uint32 at = 0;
-    while (at != count_ && spans_[at].end <= hole.start) ++at;
-    while (at != count_ && spans_[at].start < hole.end) {
-      const bool keepsLeft = spans_[at].start < hole.start;
-      const bool keepsRight = spans_[at].end > hole.end;
-      if (keepsLeft && keepsRight) return split(at, hole);
-      if (keepsRight) {
-        spans_[at].start = hole.end;
-        return;
-      }
-      if (keepsLeft) {
-        spans_[at++].end = hole.start;
+  /// Joins spans that overlap or touch.
+  void join() {
+    uint32 last = 0;
+    for (uint32 i = 1; i < count; ++i) {
+      if (start[i] > end[last]) {
+        copy(i, ++last);
       } else {
-        replace(at, at + 1, 0);
+        end[last] = std::max(end[last], end[i]);
+      }
+    }
+    count = std::min(count, last + 1);
+  }
+
+  /// Takes [first, last) out of the spans. Deliberate: nothing is done about a last before the
+  /// first, which leaves the two sides of a span overlapping.
+  void cut(int32 first, int32 last) {
+    uint32 at = 0;
+    while (at != count && end[at] <= first) ++at;
+    while (at != count && start[at] < last) {
+      const bool keepsLeft = start[at] < first;
+      const bool keepsRight = end[at] > last;
+      if (keepsLeft && keepsRight) return split(at, first, last);
+      if (keepsRight) {
+        start[at] = last;
+      } else if (keepsLeft) {
+        end[at++] = first;
+      } else {
+        remove(at);
       }
     }
   }
-
-  const Span* begin() const { return spans_; }
-  const Span* end() const { return spans_ + count_; }
 
  private:
-  void split(uint32 at, Span hole) {
-    if (count_ == kListSize) notImplemented(kSource);
-    replace(at, at + 1, 2);
-    spans_[at + 1] = {hole.end, spans_[at].end};
-    spans_[at].end = hole.start;
+  void split(uint32 at, int32 first, int32 last) {
+    if (count == kListSize) notImplemented(kSource);
+    for (uint32 i = count++; i != at; --i) copy(i - 1, i);
+    end[at] = first;
+    start[at + 1] = last;
   }
 
-  /// Makes room for `count` spans in place of those of [first, last).
-  void replace(uint32 first, uint32 last, uint32 count) {
-    memmove(spans_ + first + count, spans_ + last, (count_ - last) * sizeof(Span));
-    count_ = count_ - (last - first) + count;
+  void remove(uint32 at) {
+    --count;
+    for (; at != count; ++at) copy(at + 1, at);
   }
 
-  uint32 count_ = 0;
-  Span spans_[kListSize];
+  void copy(uint32 from, uint32 to) {
+    start[to] = start[from];
+    end[to] = end[from];
+  }
 };
 
 // ---- Bands -------------------------------------------------------------------------------------
 
-/// The rectangles of the result, in the order in which they begin. One that still grows downwards
-/// is open and has the height 0.
+/// The rectangles of the result, in the order in which they begin. Those of the last scanline's
+/// spans are open: they still grow downwards and have the height 0.
 class BandTable {
  public:
-  /// Keeps the open rectangles that have their span on scanline `y` too, closes the others, and
-  /// opens one for every other span. False when that would be too many.
-  bool update(int32 y, const SpanTable& spans) {
-    OpenRect still[kListSize];
-    uint32 stillCount = 0;
-    uint32 before = 0;
-    for (const Span& span : spans) {
-      while (before != openCount_ && open_[before].span.start < span.start) close(before++, y);
-      const bool stays = before != openCount_ && open_[before].span.start == span.start &&
-                         open_[before].span.end == span.end;
+  /// Begins with the first `settled` rectangles of a list.
+  BandTable(const RectList& list, uint32 settled) : count_(settled) {
+    std::copy_n(list.rects, settled, rects_);
+    for (uint32 i = 0; i != settled; ++i) area_ += areaOf(rects_[i]);
+  }
+
+  /// Goes on to scanline `y`: spans that were on the last scanline too keep their rectangle; the
+  /// rectangles of the others that were there are closed, and new spans open one. False when there
+  /// are too many.
+  bool update(int32 y, const SpanTable& before, SpanTable& now) {
+    uint32 old = 0;
+    for (uint32 i = 0; i != now.count; ++i) {
+      while (old != before.count && before.start[old] < now.start[i]) close(before.rect[old++], y);
+      const bool stays =
+          old != before.count && before.start[old] == now.start[i] && before.end[old] == now.end[i];
       if (stays) {
-        still[stillCount++] = open_[before++];
-      } else if (opens(span, y)) {
-        still[stillCount++] = {span, count_ - 1};
+        now.rect[i] = before.rect[old++];
+      } else {
+        open(now, i, y);
         if (count_ > kMaxResult) return false;
       }
     }
-    while (before != openCount_) close(before++, y);
-    std::copy_n(still, stillCount, open_);
-    openCount_ = stillCount;
+    while (old != before.count) close(before.rect[old++], y);
     return true;
   }
 
-  const RectList& result() const { return result_; }
+  uint32 area() const { return area_; }
+  void copyTo(RectList* list) const { std::copy_n(rects_, kListSize, list->rects); }
 
  private:
-  struct OpenRect {
-    Span span;
-    uint32 index;
-  };
-
-  /// Stores a new rectangle. Deliberate: a span too wide for a signed width is written behind the
-  /// others but does not count as a rectangle.
-  bool opens(const Span& span, int32 y) {
-    const int32 width = subWrap(span.end, span.start);
-    result_.rects[count_] = {span.start, y, width, 0};
-    if (width <= 0) return false;
-    ++count_;
-    return true;
+  /// Deliberate: a span too wide for a signed width is written behind the others, but does not
+  /// count as a rectangle. It becomes one that no span of the next scanline equals.
+  void open(SpanTable& spans, uint32 i, int32 y) {
+    const int32 width = subWrap(spans.end[i], spans.start[i]);
+    rects_[count_] = {spans.start[i], y, width, 0};
+    if (width > 0) {
+      spans.rect[i] = count_++;
+    } else {
+      spans.end[i] = spans.start[i];
+      spans.rect[i] = kNowhere;
+    }
   }
 
   void close(uint32 which, int32 y) {
-    RectListEntry& rect = result_.rects[open_[which].index];
+    RectListEntry& rect = rects_[which];
     rect.height = subWrap(y, rect.y);
+    area_ += areaOf(rect);
   }
 
-  uint32 count_ = 0;
-  uint32 openCount_ = 0;
-  OpenRect open_[kListSize];
-  RectList result_ = {};
+  static constexpr uint32 kNowhere = kListSize;
+  uint32 count_;
+  uint32 area_ = 0;
+  RectListEntry rects_[kListSize + 1] = {};
 };
 
 // ---- The sweep ---------------------------------------------------------------------------------
 
-/// The spans that the rectangles of `active` leave on a scanline.
-SpanTable spansOf(const RectList& list, Rects active, const Span& hole) {
-  SpanTable spans;
+/// Fills `spans` with what the rectangles of `active` leave on a scanline.
+void findSpans(const RectList& list, Rects active, const RectListEntry& hole, SpanTable& spans) {
+  spans.count = 0;
   for (Rects rest = active & ~kCut; rest != kNone; rest &= rest - 1) {
     const RectListEntry& rect = list.rects[std::countr_zero(rest)];
-    const Span span = {rect.x, rightOf(rect)};
-    if (span.start < span.end) spans.merge(span);
+    if (rect.x < rightOf(rect)) spans.insert(rect.x, rightOf(rect));
   }
-  if ((active & kCut) != kNone) spans.cut(hole);
-  return spans;
+  spans.join();
+  if ((active & kCut) != kNone) spans.cut(hole.x, rightOf(hole));
 }
 
 /// Rebuilds the region from edge to edge. False when it takes too many rectangles.
-bool sweep(const RectList& list, const EdgeTable& edges, const Span& hole, BandTable* bands) {
+bool sweep(const RectList& list, const EdgeTable& edges, const RectListEntry& hole,
+           BandTable& bands) {
+  SpanTable tables[2];
+  SpanTable* before = &tables[0];
+  SpanTable* now = &tables[1];
   Rects active = kNone;
-  for (const Edge& edge : edges) {
-    active ^= edge.changes;
-    if (!bands->update(edge.y, spansOf(list, active, hole))) return false;
+  for (uint32 edge = 0; edge != edges.count();) {
+    const int32 y = edges.y(edge);
+    for (; edge != edges.count() && edges.y(edge) == y; ++edge) active ^= edges.changes(edge);
+    findSpans(list, active, hole, *now);
+    if (!bands.update(y, *before, *now)) return false;
+    std::swap(before, now);
   }
   return true;
-}
-
-uint32 totalArea(const RectList& list) {
-  uint32 area = 0;
-  for (const RectListEntry& rect : list.rects) area += areaOf(rect);
-  return area;
 }
 
 RectListEntry boundingBox(const RectList& list) {
@@ -263,7 +267,7 @@ RectListEntry boundingBox(const RectList& list) {
   int32 top = list.rects[0].y;
   int32 right = rightOf(list.rects[0]);
   int32 bottom = bottomOf(list.rects[0]);
-  for (uint32 i = 1; i != usedEntries(list); ++i) {
+  for (uint32 i = 1; !endsAt(list, i); ++i) {
     left = std::min(left, list.rects[i].x);
     top = std::min(top, list.rects[i].y);
     right = std::max(right, rightOf(list.rects[i]));
@@ -272,9 +276,33 @@ RectListEntry boundingBox(const RectList& list) {
   return {left, top, subWrap(right, left), subWrap(bottom, top)};
 }
 
-void addEdges(EdgeTable* edges, const RectList& list, uint32 from, uint32 to) {
-  for (uint32 i = from; i != to; ++i)
-    edges->add(list.rects[i].y, bottomOf(list.rects[i]), Rects{1} << i);
+Rects bitOf(uint32 entry) { return Rects{1} << entry; }
+
+uint32 usedEntries(const RectList& list) {
+  uint32 count = 0;
+  while (!endsAt(list, count)) ++count;
+  return count;
+}
+
+/// Whether `b` lies below all of `a` and does not continue it.
+bool isNextBand(const RectListEntry& a, const RectListEntry& b) {
+  const bool continues = bottomOf(a) == b.y && a.x == b.x && a.width == b.width;
+  const bool fits = a.y < bottomOf(a) && a.x < rightOf(a);
+  return fits && bottomOf(a) <= b.y && !continues;
+}
+
+/// The number of leading entries that every sweep gives back as they are, whatever changes from
+/// scanline `top` on: each is a band of its own, all else begins below, and the entry that comes
+/// next begins alone, above `top`.
+uint32 settledEntries(const RectList& list, uint32 count, int32 top) {
+  uint32 next = 0;
+  while (next + 1 < count && list.rects[next + 1].y < top &&
+         isNextBand(list.rects[next], list.rects[next + 1])) {
+    ++next;
+  }
+  for (uint32 i = next + 1; i < count; ++i)
+    if (list.rects[i].y <= list.rects[next].y) return 0;
+  return next;
 }
 
 uint32 addRect(RectList* list, const RectListEntry& rect) {
@@ -286,32 +314,38 @@ uint32 addRect(RectList* list, const RectListEntry& rect) {
   const uint32 used = usedEntries(*list);
   const uint32 known = std::min(used + 1, kListSize);
   if (used != kListSize) list->rects[used] = rect;
-  EdgeTable edges;
-  addEdges(&edges, *list, 0, known);
-  // Deliberate: entries behind the one that ended the list come to life, but have no edges.
   const uint32 alive = usedEntries(*list);
-  for (uint32 i = known; i < alive; ++i)
-    edges.addBetween(list->rects[i].y, bottomOf(list->rects[i]), Rects{1} << i);
+  const uint32 settled = settledEntries(*list, alive, rect.y);
 
-  BandTable bands;
-  *list = sweep(*list, edges, {}, &bands) ? bands.result() : RectList{{boundingBox(*list)}};
-  return totalArea(*list);
+  EdgeTable edges;
+  for (uint32 i = settled; i != known; ++i) edges.add(list->rects[i], bitOf(i));
+  // Deliberate: entries behind the one that ended the list come to life, but have no edges.
+  for (uint32 i = known; i != alive; ++i) edges.addBetween(list->rects[i], bitOf(i));
+
+  BandTable bands(*list, settled);
+  if (sweep(*list, edges, {}, bands)) {
+    bands.copyTo(list);
+    return bands.area();
+  }
+  *list = RectList{{boundingBox(*list)}};
+  return areaOf(list->rects[0]);
 }
 
 uint32 subRect(RectList* list, const RectListEntry& rect) {
   const uint32 used = usedEntries(*list);
+  const uint32 settled = settledEntries(*list, used, rect.y);
   EdgeTable edges;
-  addEdges(&edges, *list, 0, used);
+  for (uint32 i = settled; i != used; ++i) edges.add(list->rects[i], bitOf(i));
   if (used != kListSize) {
-    edges.add(rect.y, bottomOf(rect), kCut);
+    edges.add(rect, kCut);
   } else {
     // Deliberate: a full list is cut at its own edges only.
-    edges.addBetween(rect.y, bottomOf(rect), kCut);
+    edges.addBetween(rect, kCut);
   }
-  BandTable bands;
-  if (!sweep(*list, edges, {rect.x, rightOf(rect)}, &bands)) notImplemented(kSource);
-  *list = bands.result();
-  return totalArea(*list);
+  BandTable bands(*list, settled);
+  if (!sweep(*list, edges, rect, bands)) notImplemented(kSource);
+  bands.copyTo(list);
+  return bands.area();
 }
 
 }  // namespace
