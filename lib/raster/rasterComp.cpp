@@ -188,6 +188,7 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
+#include "kernelChoice.h"
 #include "panicPlace.h"
 #include "raster.h"
 
@@ -198,7 +199,8 @@ HWY_EXPORT(rasterCompKernels);
 
 constexpr char kSource[] = "lib/raster/rasterComp";
 
-const RasterCompKernels& kernels() { return *HWY_DYNAMIC_DISPATCH(rasterCompKernels)(); }
+const RasterCompKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(rasterCompKernels)(); }
+const RasterCompKernels& kernels() { return chosenKernels<lookUpKernels>(); }
 
 /// A frame buffer to compare.
 struct Picture {
@@ -207,18 +209,9 @@ struct Picture {
   int32 bpp;
 };
 
-int32 compareColors(const uint8* a, uint32 aPitch, const uint8* b, uint32 bPitch, uint32 width,
-                    uint32 height) {
-  const bool contiguous = aPitch == bPitch && aPitch == size_t{width} * 4;
-  if (contiguous) return kernels().compareColors(a, 0, b, 0, size_t{width} * height, 1);
-  return kernels().compareColors(a, pitchOf(aPitch), b, pitchOf(bPitch), width, height);
-}
-
-int32 compareBytes(const uint8* a, uint32 aPitch, const uint8* b, uint32 bPitch, size_t bytes,
-                   uint32 height) {
-  if (aPitch == bytes && bPitch == bytes) return memcmp(a, b, bytes * height);
-  for (; height != 0; --height, a = nextRow(a, pitchOf(aPitch)), b = nextRow(b, pitchOf(bPitch))) {
-    const int32 order = memcmp(a, b, bytes);
+int32 compareBytes(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep, RowRun run) {
+  for (; run.rows != 0; --run.rows, a = nextRow(a, aStep), b = nextRow(b, bStep)) {
+    const int32 order = memcmp(a, b, run.bytes);
     if (order != 0) return order;
   }
   return 0;
@@ -232,8 +225,12 @@ int32 comparePixels(const Picture& a, const Picture& b, uint32 aX, uint32 aY, ui
   const uint32 bytesPerPixel = static_cast<uint32>(a.bpp / 8);
   const uint8* firstA = rowAt(a.base, pitchOf(a.pitch), aY, aX, bytesPerPixel);
   const uint8* firstB = rowAt(b.base, pitchOf(b.pitch), bY, bX, bytesPerPixel);
-  if (bytesPerPixel == 4) return compareColors(firstA, a.pitch, firstB, b.pitch, width, height);
-  return compareBytes(firstA, a.pitch, firstB, b.pitch, size_t{width} * bytesPerPixel, height);
+  const intptr_t aStep = pitchOf(a.pitch);
+  const intptr_t bStep = pitchOf(b.pitch);
+  RowRun run = {size_t{width} * bytesPerPixel, height};
+  if (aStep == bStep) run = joinRows(aStep, run.bytes, run.rows);
+  if (bytesPerPixel != 4) return compareBytes(firstA, aStep, firstB, bStep, run);
+  return kernels().compareColors(firstA, aStep, firstB, bStep, run.bytes / 4, run.rows);
 }
 
 /// Deliberate: the walk ends at an empty entry and nowhere else, after the list's end too.

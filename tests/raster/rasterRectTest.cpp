@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
 #include <string>
 #include <vector>
@@ -277,6 +278,27 @@ TEST(Raster_RectList, EqualsTheModelWhereRectanglesTouchAndCoincide) {
     const RectListEntry r = {random.between(0, 5), random.between(0, 5), random.between(1, 4),
                              random.between(1, 4)};
     checkAgainstModel(before, r, random.below(2) == 0);
+    ASSERT_FALSE(HasFailure()) << "round " << round;
+  }
+}
+
+TEST(Raster_RectList, EqualsTheModelForBandsBelowOneAnother) {
+  Random random(6);
+  for (int round = 0; round < 60000; ++round) {
+    // Bands of one rectangle each, some of which touch or continue, and some that spoil the order.
+    RectList before = {};
+    const uint32 filled = 1 + random.below(16);
+    int32 y = 0;
+    for (uint32 i = 0; i < filled; ++i) {
+      const int32 height = random.between(random.below(20) == 0 ? -1 : 1, 3);
+      before.rects[i] = {random.between(0, 2), y, random.between(1, 2), height};
+      y += random.below(20) == 0 ? random.between(-9, 9) : height + random.between(0, 1);
+    }
+    if (random.below(4) == 0) before.rects[random.below(16)].width = 0;
+    const RectListEntry r = {random.between(-1, 3), random.between(-2, std::max(y, 0) + 2),
+                             random.between(1, 4), random.between(round % 8 == 0 ? -3 : 1, 9)};
+    const bool subtracts = random.below(2) == 0 || r.height < 0;
+    checkAgainstModel(before, r, subtracts);
     ASSERT_FALSE(HasFailure()) << "round " << round;
   }
 }
