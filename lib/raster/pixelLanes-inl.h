@@ -257,6 +257,63 @@ template <class D> HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, ui
   (void)d;
 }
 
+// ---- Wide channels -----------------------------------------------------------------------------
+
+/// One channel of 16-bit pixels widened to 8 bits: v of b bits, repeated, is v times
+/// (2^b + 1) * 2^(8 - 2b), rounded down.
+template <class F, class D> HWY_INLINE hn::Vec<D> widenChannel(D d, hn::Vec<D> pixels) {
+  constexpr int kLow = F::kTop - F::kBits;
+  constexpr int kAt = kLow == 0 ? 16 - F::kBits : kLow;  // so that the factor fits 16 bits
+  constexpr uint32 kFactor = ((1u << F::kBits) + 1) << (24 - 2 * F::kBits - kAt);
+  static_assert(kFactor <= 0xFFFF);
+  if constexpr (kLow == 0) {
+    return hn::MulHigh(hn::ShiftLeft<kAt>(pixels), setMask(d, kFactor));
+  } else {
+    return hn::MulHigh(hn::And(pixels, setMask(d, F::kMask)), setMask(d, kFactor));
+  }
+}
+
+/// The order of quarters that makes the lower and upper halves of a vector's parts, when
+/// interleaved with others of this order, the first and the second half of the result.
+template <class D> constexpr Words<D> orderForInterleaving() {
+  Words<D> words{};
+  const size_t parts = words.size() / 4;
+  for (size_t i = 0; i < words.size(); ++i)
+    words[i] = static_cast<int32>((i / 4 + i / 2 % 2 * parts) * 2 + i % 2);
+  return words;
+}
+template <class D16> HWY_INLINE hn::Vec<D16> inOrderForInterleaving(D16 d16, hn::Vec<D16> v) {
+  if constexpr (kLanes<D16> == 8) {
+    return v;
+  } else {
+    static constexpr Words<D16> kOrder = orderForInterleaving<D16>();
+    return chooseWords(d16, v, kOrder);
+  }
+}
+
+/// Two vectors of a block from the halves of their lanes, which are in the order above.
+template <class D, class V16>
+HWY_INLINE void interleaveHalves(D d, V16 low, V16 high, hn::Vec<D>* vectors) {
+  const hn::Repartition<uint16, D> d16;
+  vectors[0] = hn::BitCast(d, hn::InterleaveLower(d16, low, high));
+  vectors[1] = hn::BitCast(d, hn::InterleaveUpper(d16, low, high));
+}
+
+/// A block of opaque code 32 from 16-bit pixels.
+template <class From, class D> HWY_INLINE Block<D> loadWidened(D d, const uint8* at) {
+  const hn::Repartition<uint16, D> d16;
+  Block<D> block;
+  for (size_t i = 0; i < 2; ++i) {
+    const auto pixels = inOrderForInterleaving(d16, loadLanes(d16, at + i * kBlockPixels<D>));
+    const auto red = widenChannel<typename From::Red>(d16, pixels);
+    const auto green = widenChannel<typename From::Green>(d16, pixels);
+    const auto blue = widenChannel<typename From::Blue>(d16, pixels);
+    interleaveHalves(d, hn::Or(blue, hn::ShiftLeft<8>(green)), hn::Or(red, setMask(d16, 0xFF00)),
+                     block.v + 2 * i);
+  }
+  return block;
+}
+
 // ---- Blocks of any pixel size ------------------------------------------------------------------
 
 template <unsigned kBytes, class D> HWY_INLINE Block<D> loadBlock(D d, const uint8* at) {

@@ -133,25 +133,97 @@ TARNLIBS_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsP
                                                  uint32 foreground);
 
 // ---- Pixel formats and conversion --------------------------------------------------------------
+//
+// A pixel format is named by one code, the "bppdepth": the colour depth, but 32 for depth 24 stored
+// in 32 bits (Raster_GetBPPDepth).
+//
+//   code  bytes  layout of the value
+//   3     1      eight colours: red in bit 2, green in bit 5, blue in bit 7, other bits 0
+//   6     1      red in bits 5-4, green in bits 3-2, blue in bits 1-0
+//   8     1      red in bits 2-0, green in bits 5-3, blue in bits 7-6 (or an index, see below)
+//   15    2      red in bits 14-10, green in bits 9-5, blue in bits 4-0, bit 15 unused
+//   16    2      red in bits 15-11, green in bits 10-5, blue in bits 4-0
+//   24    3      blue, green, red at increasing addresses: 0x00RRGGBB
+//   32    4      0xAARRGGBB; alpha, or unused
+//
+// A pseudo-colour source holds indices into a palette, an array of 0x00RRGGBB that the caller owns;
+// its length is not checked. No conversion searches a palette: a destination of code 8 is always
+// true colour. Narrowing a channel keeps its top bits, without rounding or dithering; widening
+// repeats the top bits in the new low ones.
 
+/// Whether a frame buffer of this colour depth and these bits per pixel is one that the library can
+/// work with: pseudo-colour with 8 bits (the depth is not looked at), depth 24 with 24 or 32 bits,
+/// depth 15 or 16 with 16 bits.
+///
+/// Deliberate: depth 32 is refused; pixels with an unused byte have depth 24.
 TARNLIBS_EXPORT bool Raster_IsModeReasonable(uint32 depth, uint32 bpp, bool pseudoColor);
+
+/// The format code of a depth and a pixel size: 32 for depth 24 in 32 bits, else the depth itself,
+/// whatever it is.
 TARNLIBS_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
+
+/// Converts one pixel value. `srcDepth` (15, 16, 24, 32) and `dstDepth` (3, 6, 8, 15, 16, 24, 32)
+/// are format codes; 24 and 32 mean the same value here. With `pseudoColor`, `srcDepth` must be 8
+/// and `pixel`, all 32 bits of it, is an index into `palette`, which is read in no other case.
+///
+/// Bits 31-24 are those of the source from 24 or 32 to 24 or 32, and 0 otherwise.
+///
+/// Deliberate: a value that has the format of the destination already comes back whole, unused bits
+/// included. To code 6 other bits are taken than the top ones of each channel: the bits that the
+/// shifts of code 8 bring under its masks. From 24 or 32 that is bits 26-25 for red, 13-12 for
+/// green, 1-0 for blue. Raster_ConvertPixels does take the top bits.
+///
+/// A wrong code calls Warning with one of these texts and the code, and then
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterConv"; the source is checked first:
+/// - "Raster convert pixels invalid depth for pseudo color %d\n" (srcDepth)
+/// - "Raster convert one pixel invalid source depth %d\n" (srcDepth)
+/// - "Raster convert one pixel invalid depth %d\n" (dstDepth)
 TARNLIBS_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
                                               bool pseudoColor, const uint32* palette);
+
+/// Converts a rectangle of pixels from one frame buffer into another, which must not overlap it.
+///
+/// `srcDepth` (15, 16, 24, 32) and `dstDepth` (3, 6, 8, 15, 16, 24, 32) are format codes. With
+/// `pseudoColor` the source has one byte a pixel, an index into `palette`, and any depth up to 8.
+/// Pixels of code 32 made from true colour have 0xFF in bits 31-24; palette entries are stored
+/// there as they are. A width or height of 0 writes nothing.
+///
+/// Without `pseudoColor`, equal codes are copied by Raster_CopyPixels, with no check of the code.
+///
+/// Pitches are in bytes.
+/// Deliberate: pixels of 2 and 4 bytes are counted in whole pixels, so the pitch of such a side is
+/// rounded down to a multiple of the pixel size, for the first row too (a copy takes it in full).
+///
+/// A wrong code calls Warning with one of these texts and the code, and then
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterConv", whatever the size:
+/// - "Raster convert pixels invalid depth for pseudo color %d\n" (srcDepth)
+/// - "Raster convert pixels invalid source depth %d\n" (srcDepth)
+/// - "Raster convert pixels invalid depth %d\n" (dstDepth, after srcDepth)
 TARNLIBS_EXPORT void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth,
                                           const void* src, uint32 srcPitch, int32 srcDepth,
                                           bool pseudoColor, const uint32* palette, uint32 srcX,
                                           uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
                                           uint32 height);
+
+/// Raster_ConvertPixels with destination code 32.
 TARNLIBS_EXPORT void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src,
                                               uint32 srcPitch, int32 srcDepth, bool pseudoColor,
                                               const uint32* palette, uint32 srcX, uint32 srcY,
                                               uint32 dstX, uint32 dstY, uint32 width,
                                               uint32 height);
+
+/// Raster_ConvertPixels with source code 32 and no palette.
 TARNLIBS_EXPORT void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth,
                                                 const uint32* src, uint32 srcPitch, uint32 srcX,
                                                 uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
                                                 uint32 height);
+
+/// Copies a rectangle of pixels into another frame buffer, which must not overlap it.
+///
+/// A pixel has 2 bytes for depth 15, 1 for depths 3 and 6, and otherwise depth / 8, rounded down.
+/// Rows step by the full pitch.
+///
+/// Deliberate: the depth is not checked; one below 8 that is no format copies nothing.
 TARNLIBS_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src, uint32 srcPitch,
                                        int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
                                        uint32 dstY, uint32 width, uint32 height);

@@ -11,6 +11,7 @@
 #include <type_traits>
 #include <utility>
 
+#include "colorTable-inl.h"
 #include "pixelLanes-inl.h"
 #include "rasterConvInternal.h"
 #include "rows-inl.h"
@@ -52,22 +53,58 @@ template <class From, class To> void convertRowsPlainly(const ConvertJob& job) {
   }
 }
 
+/// The least number of pixels that make up for converting a palette.
+constexpr size_t kMinPixelsForTable = 256;
+
+template <class To> void convertRowsByTable(const ConvertJob& job) {
+  ColorTable<To> table(job.palette);
+  uint8* dst = job.dst;
+  const uint8* src = job.src;
+  for (uint32 y = job.height; y != 0; --y) {
+    table.convertRow(dst, src, job.pixels);
+    dst = nextRow(dst, job.dstStep);
+    src = nextRow(src, job.srcStep);
+  }
+}
+
+template <class To> void convertPaletteRows(const ConvertJob& job) {
+  if constexpr (ColorTable<To>::kPays) {
+    if (job.pixels >= ColorTable<To>::kMinRow && job.pixels * job.height >= kMinPixelsForTable)
+      return convertRowsByTable<To>(job);
+  }
+  convertRowsPlainly<Palette, To>(job);
+}
+
 #if HWY_TARGET == HWY_SCALAR
 
 template <class From, class To> void convertRows(const ConvertJob& job) {
-  convertRowsPlainly<From, To>(job);
+  if constexpr (std::is_same_v<From, Palette>) {
+    convertPaletteRows<To>(job);
+  } else {
+    convertRowsPlainly<From, To>(job);
+  }
 }
 
 #else
 
+/// Loads a block in the format To.
+template <class From, class To, class D>
+HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
+  if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
+    return loadWidened<From>(d, src);
+  } else {
+    Block<D> block = loadBlock<From::kBytes>(d, src);
+    for (auto& lanes : block.v) {
+      if constexpr (To::kBytes <= 2) lanes = convertLanes<From, To>(d, lanes);
+      if constexpr (To::kBytes == 4) lanes = hn::Or(lanes, hn::Set(d, kOpaque));
+    }
+    return block;
+  }
+}
+
 template <class From, class To, class D>
 HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
-  Block<D> block = loadBlock<From::kBytes>(d, src);
-  for (auto& lanes : block.v) {
-    if constexpr (From::kBytes < 3 || To::kBytes < 3) lanes = convertLanes<From, To>(d, lanes);
-    if constexpr (std::is_same_v<To, Code32>) lanes = hn::Or(lanes, hn::Set(d, kOpaque));
-  }
-  storeBlock<To::kBytes>(d, block, dst);
+  storeBlock<To::kBytes>(d, loadConvertedBlock<From, To>(d, src), dst);
 }
 
 /// Block after block; the last one ends with the row and may do some pixels again. Rows that are
@@ -96,7 +133,7 @@ template <class From, class To, class D> void convertRowsByBlocks(D d, const Con
 
 template <class From, class To> void convertRows(const ConvertJob& job) {
   if constexpr (std::is_same_v<From, Palette>) {
-    convertRowsPlainly<From, To>(job);
+    convertPaletteRows<To>(job);
   } else {
     constexpr bool kShort = From::kBytes <= 2 && To::kBytes <= 2;
     using Lane = std::conditional_t<kShort, uint16, uint32>;
