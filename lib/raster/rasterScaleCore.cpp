@@ -9,6 +9,8 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include <bit>
+
 #include "rasterScaleColumns-inl.h"
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
@@ -20,8 +22,8 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
-/// Source rows resampled to the width of the destination, as 4-byte pixels. Row numbers modulo the
-/// number of slots say where a row is kept.
+/// Source rows resampled to the width of the destination, as 4-byte pixels. There are slots for the
+/// rows that one destination row needs, in a power of two, so that a row's number tells its slot.
 class RowCache {
  public:
   static size_t memoryFor(const ScaleJob& job) {
@@ -39,7 +41,7 @@ class RowCache {
   /// The row at a vertical position.
   const uint32* at(uint32 position) {
     const uint32 row = job_.rowOf(position);
-    Slot& slot = slot_[row % slots_];
+    Slot& slot = slot_[row & (slots_ - 1)];
     if (slot.row != row) {
       slot.row = row;
       columns_.resample(job_.srcRow(row), slot.pixels);
@@ -55,7 +57,8 @@ class RowCache {
   };
 
   static uint32 slotsOf(const ScaleJob& job) {
-    return job.smooth ? std::min(((job.stepY + 65535) >> 16) + 1, kMaxRows) : 1;
+    if (!job.smooth) return 1;
+    return std::bit_ceil(std::min(((job.stepY + kOnePixel - 1) >> 16) + 1, kMaxRows));
   }
 
   const ScaleJob& job_;
