@@ -33,11 +33,11 @@ needPackages() {
 # Unpacks those libraries of the i386 architecture that have no 64-bit package for 32-bit programs
 # into the private folder .deps/i386, without touching the system's packages.
 needI386Libraries() {
-  [ -e "$i386Root/complete" ] && return
   local packages=(libpng16-16 libpng-dev libgtest-dev libbenchmark-dev libbenchmark1debian
     libxcb1 libxcb1-dev libxau6 libxdmcp6 libbsd0 libmd0
     libxcb-shm0 libxcb-shm0-dev libxcb-xfixes0 libxcb-xfixes0-dev
-    libxcb-render0 libxcb-render0-dev libxcb-shape0)
+    libxcb-render0 libxcb-render0-dev libxcb-shape0 libxcb-shape0-dev)
+  [ "$(cat "$i386Root/complete" 2>/dev/null)" = "${packages[*]}" ] && return
   local work=$root/.deps/i386-packages
   local apt=(apt-get -o "Dir::State=$work/state" -o Dir::State::status=/dev/null
     -o "Dir::Cache=$work/cache" -o APT::Architecture=i386 -o APT::Architectures=i386
@@ -49,7 +49,7 @@ needI386Libraries() {
   local file
   for file in "$work"/*.deb; do dpkg -x "$file" "$i386Root"; done
   rm -rf "$work"
-  touch "$i386Root/complete"
+  echo "${packages[*]}" >"$i386Root/complete"
 }
 
 needBuildTools() {
