@@ -1,0 +1,82 @@
+// SPDX-License-Identifier: MIT
+//
+// blend: a picture with an alpha channel composited over another.
+
+#include <memory>
+#include <optional>
+
+#include "commands.h"
+#include "drawing.h"
+#include "geometry.h"
+#include "imageOptions.h"
+#include "picture.h"
+#include "raster.h"
+
+namespace tool {
+namespace {
+
+/// By number.
+constexpr const char* kOperatorNames[] = {
+    "clear", "source",     "destination", "over",        "overReverse", "in",  "inReverse",
+    "out",   "outReverse", "atop",        "atopReverse", "xor",         "add", "saturate"};
+constexpr uint32 kSaturate = 13;
+enum BlendFlags : uint32 { kScaleSource = 1, kScaleDestination = 2 };
+
+struct BlendOptions {
+  std::string destination;
+  std::string source;
+  OutputOptions output;
+  uint32 op = 3;
+  std::optional<uint32> srcAlpha;
+  std::optional<uint32> dstAlpha;
+  Point at = {0, 0};
+  uint32 code = 32;
+  bool staged = false;
+};
+
+int blend(const BlendOptions& options) {
+  const SaveOptions saving = options.output.forSave();
+  if (options.op == kSaturate && options.dstAlpha == 0u)
+    throw CLI::ValidationError("saturate divides by the destination's alpha: --dst-alpha 0");
+  Picture picture = Picture::loadAs(options.code, options.destination);
+  Picture source = Picture::loadAs(32, options.source, true);
+  premultiply(source);
+  const Placement placed = place(source, options.at, picture);
+  const uint32 flags =
+      (options.srcAlpha ? kScaleSource : 0u) | (options.dstAlpha ? kScaleDestination : 0u);
+  Raster_AlphaBlend(picture.data(), static_cast<uint32>(placed.onTarget.left),
+                    static_cast<uint32>(placed.onTarget.top), picture.pitch(), source.data(),
+                    placed.srcX, placed.srcY, source.pitch(), widthOf(placed.onTarget),
+                    heightOf(placed.onTarget), picture.record.depth, picture.record.bpp, options.op,
+                    flags, options.srcAlpha.value_or(0), options.dstAlpha.value_or(0),
+                    options.staged ? 1 : 0);
+  save(picture, options.output.path, saving);
+  return kSuccess;
+}
+
+uint32 parseOperator(const std::string& text) { return numberOfName(text, kOperatorNames); }
+
+}  // namespace
+
+void addBlendCommand(Commands& commands) {
+  auto options = std::make_shared<BlendOptions>();
+  CLI::App* command =
+      commands.add("blend", "Composites a picture with alpha onto another, which counts as opaque.",
+                   [options] { return blend(*options); });
+  command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
+  command->add_option("SRC", options->source, "the PNG picture to draw")->required();
+  options->output.addTo(command);
+  addParsed(command, "--op", options->op, parseOperator, "NAME|0-13", "the operator (over)");
+  command->add_option("--src-alpha", options->srcAlpha, "scales the source, alpha included")
+      ->check(CLI::Range(0, 255));
+  command->add_option("--dst-alpha", options->dstAlpha, "scales the destination and is its alpha")
+      ->check(CLI::Range(0, 255));
+  addParsed(command, "--at", options->at, parsePoint, "X,Y",
+            "where the top left corner of SRC goes");
+  addDepth(command, options->code, {6, 8, 15, 16, 24, 32}, "the pixel format of the destination")
+      ->capture_default_str();
+  command->add_flag("--staged", options->staged, "blend through a small buffer; the same pixels");
+  command->footer("Operators: " + listOf(kOperatorNames));
+}
+
+}  // namespace tool

@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: MIT
+//
+// Sizes, positions, rectangles and colours on the command line.
+
+#ifndef RASTER_TOOLS_GEOMETRY_H
+#define RASTER_TOOLS_GEOMETRY_H
+
+#include <CLI/CLI.hpp>
+#include <optional>
+#include <string>
+
+#include "rect.h"
+
+namespace tool {
+
+struct Size {
+  uint32 width;
+  uint32 height;
+};
+
+// Each parser throws a usage error that quotes the text and shows the form.
+Size parseSize(const std::string& text);      // WxH
+Point parsePoint(const std::string& text);    // X,Y
+Rect parseRegion(const std::string& text);    // WxH+X+Y
+uint32 parseColour(const std::string& text);  // RRGGBB
+std::string regionText(const Rect& rect);     // WxH+X+Y
+
+/// An option whose text goes through one of the parsers. A target may be a std::optional.
+template <class Target, class Value>
+CLI::Option* addParsed(CLI::App* command, const char* name, Target& target,
+                       Value (*parse)(const std::string&), const char* form,
+                       const char* description) {
+  return command
+      ->add_option_function<std::string>(
+          name, [&target, parse](const std::string& text) { target = parse(text); }, description)
+      ->type_name(form);
+}
+
+inline uint32 widthOf(const Rect& rect) { return static_cast<uint32>(rect.right - rect.left); }
+inline uint32 heightOf(const Rect& rect) { return static_cast<uint32>(rect.bottom - rect.top); }
+
+}  // namespace tool
+
+#endif

@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: MIT
+
+#include "imageOptions.h"
+
+#include "commands.h"
+
+namespace tool {
+
+void OutputOptions::addPathTo(CLI::App* command) {
+  command->add_option("OUT", path, "the picture to write")->required();
+}
+
+void OutputOptions::addTo(CLI::App* command) {
+  addPathTo(command);
+  command->add_option("--format", format, "the kind of file, when the name does not say it")
+      ->check(CLI::IsMember({"png", "bmp"}));
+}
+
+void OutputOptions::addEncodingTo(CLI::App* command) {
+  command->add_option("--compression", compression, "effort of the PNG compression")
+      ->check(CLI::Range(0, 9));
+  command->add_flag("--keep-alpha", keepAlpha, "keep the alpha channel of the picture");
+}
+
+SaveOptions OutputOptions::forSave() const {
+  const FileType given = format == "png"   ? FileType::png
+                         : format == "bmp" ? FileType::bmp
+                                           : FileType::fromName;
+  const FileType type = typeFromName(path, given);
+  if (type == FileType::bmp && (keepAlpha || compression != -1))
+    throw CLI::ValidationError("a BMP file has neither alpha nor compression");
+  return {type, compression, keepAlpha};
+}
+
+CLI::Option* addDepth(CLI::App* command, uint32& code, const std::vector<uint32>& allowed,
+                      const std::string& description) {
+  return command->add_option("--depth", code, description)->check(CLI::IsMember(allowed));
+}
+
+}  // namespace tool

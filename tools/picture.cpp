@@ -1,0 +1,170 @@
+// SPDX-License-Identifier: MIT
+
+#include "picture.h"
+
+#include <algorithm>
+#include <array>
+#include <cctype>
+#include <cstdlib>
+#include <utility>
+
+#include "commands.h"
+#include "dynBuf.h"
+#include "outputFile.h"
+#include "pngHeader.h"
+#include "raster.h"
+#include "standardError.h"
+
+namespace tool {
+namespace {
+
+constexpr uint64 kLargestPicture = uint64{1} << 30;  // bytes
+
+struct Storage {
+  uint32 depth;
+  uint32 bpp;
+};
+
+Storage storageOf(uint32 code) {
+  switch (code) {
+    case 6:
+    case 8:
+      return {code, 8};
+    case 15:
+    case 16:
+      return {code, 16};
+    case 24:
+      return {24, 24};
+    default:
+      return {24, 32};
+  }
+}
+
+/// One channel of a one-byte colour.
+struct Field {
+  int shift;
+  int bits;
+
+  uint8 widened(uint32 value) const {
+    const uint32 field = value >> shift & ((1u << bits) - 1);
+    if (bits == 2) return static_cast<uint8>(field * 0x55);
+    return static_cast<uint8>(field << 5 | field << 2 | field >> 1);
+  }
+};
+
+std::array<uint32, 256> paletteWords(const ImageUtilImage& image) {
+  std::array<uint32, 256> words;
+  std::transform(std::begin(image.palette), std::end(image.palette), words.begin(),
+                 [](const ImageUtilColor& colour) {
+                   return 0xFF000000u | uint32{colour.red} << 16 | uint32{colour.green} << 8 |
+                          colour.blue;
+                 });
+  return words;
+}
+
+std::string lowerCaseEnding(const std::string& path) {
+  const size_t dot = path.rfind('.');
+  if (dot == std::string::npos) return {};
+  std::string ending = path.substr(dot + 1);
+  for (char& letter : ending)
+    letter = static_cast<char>(tolower(static_cast<unsigned char>(letter)));
+  return ending;
+}
+
+/// A growable buffer that releases its bytes.
+struct Buffer : DynBuf {
+  Buffer() { DynBuf_Init(this); }
+  ~Buffer() { DynBuf_Destroy(this); }
+  Buffer(const Buffer&) = delete;
+  Buffer& operator=(const Buffer&) = delete;
+};
+
+}  // namespace
+
+Picture::Picture(uint32 width, uint32 height, uint32 code) {
+  const Storage storage = storageOf(code);
+  const uint64 pitch = (uint64{width} * (storage.bpp / 8) + 3) & ~uint64{3};
+  const bool fits = height == 0 || pitch <= kLargestPicture / height;
+  if (fits) record.data = static_cast<uint8*>(calloc(static_cast<size_t>(pitch * height) + 1, 1));
+  if (record.data == nullptr)
+    throw Failure("a picture of " + std::to_string(width) + "x" + std::to_string(height) +
+                  " pixels is too large");
+  record.width = width;
+  record.height = height;
+  record.depth = storage.depth;
+  record.bpp = storage.bpp;
+  record.bytesPerLine = static_cast<uint32>(pitch);
+  if (storage.bpp == 8) describeLowDepth();
+}
+
+Picture& Picture::operator=(Picture&& from) noexcept {
+  std::swap(record, from.record);
+  return *this;
+}
+
+/// A palette that shows one-byte colours as the colours that they are.
+void Picture::describeLowDepth() {
+  const bool is222 = record.depth == 6;
+  const Field red = is222 ? Field{4, 2} : Field{0, 3};
+  const Field green = is222 ? Field{2, 2} : Field{3, 3};
+  const Field blue = is222 ? Field{0, 2} : Field{6, 2};
+  record.numColors = 256;
+  for (uint32 value = 0; value < 256; ++value)
+    record.palette[value] = {blue.widened(value), green.widened(value), red.widened(value), 0};
+}
+
+Picture Picture::load(const std::string& path, bool keepAlpha) {
+  const PngHeader header = readPngHeader(path);
+  if (header.colourType == kGrey || header.colourType == kGreyAlpha)
+    throw Failure("'" + path + "' is a grey picture; only colour and palette pictures are read");
+  if (header.bitDepth == 16)
+    throw Failure("'" + path + "' has 16 bits per sample; only 8 and fewer are read");
+  Picture picture;
+  CaughtStandardError messages;
+  const uint8 flags = keepAlpha ? IMAGE_UTIL_READ_KEEP_ALPHA : 0;
+  if (!ImageUtil_ReadPNG(&picture.record, path.c_str(), flags))
+    throw Failure("cannot read the picture '" + path + "'" + messages.remark());
+  return picture;
+}
+
+Picture Picture::loadAs(uint32 code, const std::string& path, bool keepAlpha) {
+  Picture picture = load(path, keepAlpha);
+  if (picture.code() == code && !picture.isIndexed()) return picture;
+  return picture.convertedTo(code);
+}
+
+Picture Picture::convertedTo(uint32 code) const {
+  Picture result(width(), height(), code);
+  const std::array<uint32, 256> palette = paletteWords(record);
+  Raster_ConvertPixels(result.data(), result.pitch(), static_cast<int32>(code), data(), pitch(),
+                       static_cast<int32>(this->code()), isIndexed(), palette.data(), 0, 0, 0, 0,
+                       width(), height());
+  return result;
+}
+
+uint32 Picture::code() const { return Raster_GetBPPDepth(record.depth, record.bpp); }
+
+Rect Picture::bounds() const {
+  return {0, 0, static_cast<int32>(width()), static_cast<int32>(height())};
+}
+
+FileType typeFromName(const std::string& path, FileType given) {
+  if (given != FileType::fromName) return given;
+  const std::string ending = lowerCaseEnding(path);
+  if (ending == "png") return FileType::png;
+  if (ending == "bmp") return FileType::bmp;
+  throw CLI::ValidationError("'" + path + "' ends neither in .png nor in .bmp");
+}
+
+void save(const Picture& picture, const std::string& path, const SaveOptions& options) {
+  const ImageUtilPNGWriteParams params = {options.compression, !options.keepAlpha};
+  Buffer buffer;
+  CaughtStandardError messages;
+  const bool done = typeFromName(path, options.type) == FileType::bmp
+                        ? ImageUtil_ConstructBMPBuffer(&picture.record, &buffer)
+                        : ImageUtil_ConstructPNGBuffer(&picture.record, &params, &buffer);
+  if (!done) throw Failure("cannot encode '" + path + "'" + messages.remark());
+  writeFile(path, buffer.data, buffer.size);
+}
+
+}  // namespace tool

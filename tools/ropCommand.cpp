@@ -1,0 +1,105 @@
+// SPDX-License-Identifier: MIT
+//
+// rop: a picture combined bit by bit with another, with a colour or with a tile.
+
+#include <memory>
+#include <optional>
+
+#include "commands.h"
+#include "drawing.h"
+#include "geometry.h"
+#include "imageOptions.h"
+#include "picture.h"
+#include "raster.h"
+
+namespace tool {
+namespace {
+
+/// By number.
+constexpr const char* kRopNames[] = {
+    "clear", "and",   "andReverse", "copy",      "andInverted",  "noop",       "xor",  "or",
+    "nor",   "equiv", "invert",     "orReverse", "copyInverted", "orInverted", "nand", "set"};
+
+struct RopOptions {
+  std::string destination;
+  OutputOptions output;
+  uint32 rop = 0;
+  std::string source;
+  Point at = {0, 0};
+  std::optional<uint32> colour;
+  std::string tile;
+  Point phase = {0, 0};
+  uint32 code = 24;
+};
+
+void ropWithSource(Picture& picture, const RopOptions& options) {
+  const Picture source = Picture::loadAs(options.code, options.source);
+  const Placement placed = place(source, options.at, picture);
+  Raster_RectROPcopy(picture.data(), static_cast<int32>(picture.pitch()), source.data(),
+                     static_cast<int32>(source.pitch()), picture.bytesPerPixel(), placed.srcX,
+                     placed.srcY, options.rop, static_cast<uint32>(placed.onTarget.left),
+                     static_cast<uint32>(placed.onTarget.top), widthOf(placed.onTarget),
+                     heightOf(placed.onTarget));
+}
+
+void ropWithColour(Picture& picture, const RopOptions& options) {
+  const uint32 pixel =
+      Raster_ConvertOnePixel(*options.colour, 24, static_cast<int32>(options.code), false, nullptr);
+  Raster_RectROPfill(picture.data(), static_cast<int32>(picture.pitch()), picture.bytesPerPixel(),
+                     pixel, options.rop, 0, 0, picture.width(), picture.height());
+}
+
+void ropWithTile(Picture& picture, const RopOptions& options) {
+  const Picture tile = Picture::loadAs(options.code, options.tile);
+  Raster_RectPixmapROPcopy(picture.data(), picture.pitch(), tile.data(), tile.pitch(),
+                           static_cast<int32>(picture.bytesPerPixel()),
+                           static_cast<uint32>(options.phase.x),
+                           static_cast<uint32>(options.phase.y), tile.width(), tile.height(),
+                           options.rop, 0, 0, picture.width(), picture.height());
+}
+
+int rop(const RopOptions& options) {
+  const SaveOptions saving = options.output.forSave();
+  Picture picture = Picture::loadAs(options.code, options.destination);
+  if (!options.source.empty()) ropWithSource(picture, options);
+  if (options.colour) ropWithColour(picture, options);
+  if (!options.tile.empty()) ropWithTile(picture, options);
+  save(picture, options.output.path, saving);
+  return kSuccess;
+}
+
+uint32 parseRop(const std::string& text) { return numberOfName(text, kRopNames); }
+
+Point parsePhase(const std::string& text) {
+  const Point phase = parsePoint(text);
+  if (phase.x < 0 || phase.y < 0) throw CLI::ValidationError("a phase is not negative");
+  return phase;
+}
+
+}  // namespace
+
+void addRopCommand(Commands& commands) {
+  auto options = std::make_shared<RopOptions>();
+  CLI::App* command = commands.add(
+      "rop",
+      "Combines a picture with another, with a colour or with a tile by one of the sixteen raster "
+      "operations.",
+      [options] { return rop(*options); });
+  command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
+  options->output.addTo(command);
+  addParsed(command, "--op", options->rop, parseRop, "NAME|0-15", "the operation")->required();
+  CLI::Option_group* from = command->add_option_group("source", "What is combined with it:");
+  from->add_option("--source", options->source, "a PNG picture");
+  addParsed(from, "--color,--colour", options->colour, parseColour, "RRGGBB", "one colour");
+  from->add_option("--tile", options->tile, "a PNG picture that is repeated");
+  from->require_option(1);
+  addParsed(command, "--at", options->at, parsePoint, "X,Y",
+            "where the top left corner of --source goes");
+  addParsed(command, "--phase", options->phase, parsePhase, "X,Y",
+            "the pixel of --tile that lands on the top left corner");
+  addDepth(command, options->code, {16, 24, 32}, "the pixel format to work in")
+      ->capture_default_str();
+  command->footer("Operations: " + listOf(kRopNames));
+}
+
+}  // namespace tool

@@ -1,0 +1,123 @@
+// SPDX-License-Identifier: MIT
+//
+// screenshot, watch: a live X display.
+
+#include <chrono>
+#include <cstdio>
+#include <memory>
+#include <optional>
+#include <thread>
+#include <utility>
+
+#include "changedRects.h"
+#include "commands.h"
+#include "display.h"
+#include "geometry.h"
+#include "imageOptions.h"
+#include "picture.h"
+#include "progress.h"
+
+namespace tool {
+namespace {
+
+struct ScreenOptions {
+  std::string display;
+  std::optional<Rect> region;
+
+  void addTo(CLI::App* command) {
+    command->add_option("--display", display, "the X display; without it, the one in DISPLAY");
+    addParsed(command, "--region", region, parseRegion, "WxH+X+Y", "a part of the screen");
+  }
+
+  Rect regionOf(const Display& from) const {
+    const Rect screen = from.bounds();
+    if (!region) return screen;
+    if (!Rect_ContainsRect(&screen, &*region))
+      throw Failure(regionText(*region) + " does not lie within the screen of " +
+                    regionText(screen));
+    return *region;
+  }
+};
+
+struct ScreenshotOptions {
+  ScreenOptions screen;
+  OutputOptions output;
+};
+
+int screenshot(const ScreenshotOptions& options) {
+  const SaveOptions saving = options.output.forSave();
+  Display display(options.screen.display);
+  const Rect region = options.screen.regionOf(display);
+  Picture picture = display.capture(region);
+  save(picture, options.output.path, saving);
+  printf("%s: %s of a screen with %s\n", options.output.path.c_str(), regionText(region).c_str(),
+         display.description().c_str());
+  return kSuccess;
+}
+
+void addScreenshot(Commands& commands) {
+  auto options = std::make_shared<ScreenshotOptions>();
+  CLI::App* command = commands.add("screenshot", "Saves the screen of an X display.",
+                                   [options] { return screenshot(*options); });
+  options->output.addTo(command);
+  options->screen.addTo(command);
+}
+
+struct WatchOptions {
+  ScreenOptions screen;
+  double interval = 1;
+  uint64 count = 1;
+  uint32 tileSize = 16;
+};
+
+void printChanges(uint64 number, const Picture& before, const Picture& after,
+                  const std::vector<Rect>& rects) {
+  if (rects.empty()) {
+    printf("%llu: no change\n", static_cast<unsigned long long>(number));
+  } else {
+    printf("%llu: changes within %s\n", static_cast<unsigned long long>(number),
+           regionText(boundingRect(before, after, rects)).c_str());
+  }
+  for (const Rect& rect : rects) printf("  %s\n", regionText(rect).c_str());
+  fflush(stdout);
+}
+
+int watch(const WatchOptions& options) {
+  Display display(options.screen.display);
+  const Rect region = options.screen.regionOf(display);
+  Picture before = display.capture(region);
+  Progress progress("captures", options.count);
+  for (uint64 number = 1; options.count == 0 || number <= options.count; ++number) {
+    std::this_thread::sleep_for(std::chrono::duration<double>(options.interval));
+    Picture after = display.capture(region);
+    printChanges(number, before, after, changedRects(before, after, options.tileSize));
+    progress.show(number);
+    before = std::move(after);
+  }
+  return kSuccess;
+}
+
+void addWatch(Commands& commands) {
+  auto options = std::make_shared<WatchOptions>();
+  CLI::App* command = commands.add(
+      "watch", "Prints the rectangles of a screen that change from one capture to the next.",
+      [options] { return watch(*options); });
+  options->screen.addTo(command);
+  command->add_option("--interval", options->interval, "seconds between captures")
+      ->check(CLI::Range(0.0, 86400.0))
+      ->capture_default_str();
+  command->add_option("--count", options->count, "how many times; 0 goes on until interrupted")
+      ->capture_default_str();
+  command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
+      ->check(CLI::Range(1, 4096))
+      ->capture_default_str();
+}
+
+}  // namespace
+
+void addScreenCommands(Commands& commands) {
+  addScreenshot(commands);
+  addWatch(commands);
+}
+
+}  // namespace tool
