@@ -1,0 +1,59 @@
+#!/bin/sh
+# screenshot and watch on a real X server, in every depth that it offers.
+. "$(dirname "$0")/common.sh"
+have Xvfb || { note 'skipped: no Xvfb here'; exit 77; }
+
+refused 1 "cannot connect to the display ':987'" screenshot no.png --display :987
+DISPLAY='' refused 1 'no display' screenshot no.png
+absent no.png
+
+# paint: something to see, when there is a program for it.
+paint() {
+  if have xsetroot; then xsetroot -mod 7 11 -fg '#1050a0' -bg '#f0c040'; fi
+}
+
+# matchesServer FILE MOST: the same pixels as the X server's own dump. Programs widen fields of 5 and 6
+# bits in different ways: no channel may differ by more than MOST.
+matchesServer() {
+  if have xwd && have xwdtopnm && have pngtopnm; then
+    xwd -root -silent | xwdtopnm 2>/dev/null | pamdepth 255 2>/dev/null >dump.ppm
+    most=$(pngtopnm "$1" | pamarith -difference - dump.ppm | pamsumm -max -brief)
+    [ "$most" -le "$2" ] || fail "$1 is not what the X server shows: it differs by $most"
+  else
+    note 'not compared with xwd: it or netpbm is missing'
+  fi
+}
+
+for depth in 8 15 16 24; do
+  case $depth in 15 | 16) most=4 ;; *) most=0 ;; esac
+  startServer "200x120x$depth"
+  paint
+  ok screenshot "shot$depth.png"
+  grep -q "200x120+0+0 of a screen with .*, depth $depth in " out || fail "depth $depth: $(cat out)"
+  matchesServer "shot$depth.png" $most
+  ok screenshot "part$depth.png" --region 100x50+37+21
+  ok crop "shot$depth.png" cut.png 100x50+37+21
+  ok compare "part$depth.png" cut.png
+done
+
+refused 1 'does not lie within the screen' screenshot no.png --region 200x121+0+0
+refused 2 'WxH+X+Y' screenshot no.png --region full
+absent no.png
+ok screenshot shot.bmp
+if have pngtopnm && have bmptopnm; then
+  pngtopnm shot24.png >png.ppm
+  bmptopnm shot.bmp 2>/dev/null | cmp - png.ppm || fail 'the BMP and the PNG of the screen differ'
+fi
+
+# A screen that stands still, and one that changes.
+ok watch --interval 0.1 --count 2
+says '1: no change'
+says '2: no change'
+if have xsetroot; then
+  (sleep 0.5; xsetroot -solid '#204060') &
+  ok watch --interval 1.5
+  wait $!
+  says '1: changes within 200x120+0+0'
+fi
+
+finish
