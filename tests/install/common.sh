@@ -1,3 +1,4 @@
+# shellcheck shell=sh
 # Shared by the install tests; to be sourced. In the environment, from tests/install/CMakeLists.txt:
 # CMAKE SOURCE BUILD CC CXX TOOLCHAIN LDFLAGS PNG_FOLDER
 
