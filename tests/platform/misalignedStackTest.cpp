@@ -138,7 +138,7 @@ const Case kCases[] = {
     {"Raster_Scale",
      [](Memory& m) {
        call(m, Raster_Scale, m.dst, kPitch, 32, 24, 80, 40, 0, 0, 0, 80, 40, m.src, kPitch, 32, 24,
-            0, 40, 60, 0, 2.0, 40.0 / 60, 1);
+            0, 40, 30, 0, 2.0, 40.0 / 30, 1);
      }},
     {"Raster_YUVtoRGB",
      [](Memory& m) { call(m, Raster_YUVtoRGB, m.src, m.dst, 80, 40, 0x32595559, 32); }},
