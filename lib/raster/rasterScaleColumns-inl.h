@@ -57,7 +57,7 @@ inline uint32 positionsBelow(uint32 end, uint32 start, uint32 step, uint32 most)
 
 #if HWY_TARGET == HWY_SCALAR
 
-inline void copyBytes(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
+inline void copyRow(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
 
 /// The horizontal resampler of one call.
 class Columns {
@@ -124,9 +124,6 @@ inline Reach reachOf(uint32 step) {
 /// below one or two times kBlock.
 template <Reach kReach> HWY_INLINE PixelVec pickPixels(const uint8* row, PixelVec index) {
   const Pixels d;
-  const auto within = [&](PixelVec i) {
-    return hn::IndicesFromVec(d, hn::And(i, hn::Set(d, uint32{kBlock - 1})));
-  };
   if constexpr (kReach == Reach::kOne) {
     return hn::TableLookupLanes(loadLanes(d, row), hn::IndicesFromVec(d, index));
   } else if constexpr (kReach == Reach::kTwo) {
@@ -135,6 +132,9 @@ template <Reach kReach> HWY_INLINE PixelVec pickPixels(const uint8* row, PixelVe
 #if HWY_TARGET == HWY_AVX3
     return PixelVec{_mm512_permutex2var_epi32(low.raw, index.raw, high.raw)};
 #else
+    const auto within = [&](PixelVec i) {
+      return hn::IndicesFromVec(d, hn::And(i, hn::Set(d, uint32{kBlock - 1})));
+    };
     const auto inHigh = hn::Gt(hn::BitCast(hn::RebindToSigned<Pixels>(), index),
                                hn::Set(hn::RebindToSigned<Pixels>(), int32{kBlock - 1}));
     return hn::IfThenElse(hn::RebindMask(d, inHigh), hn::TableLookupLanes(high, within(index)),
@@ -182,13 +182,18 @@ HWY_INLINE PixelVec widenPixels(const uint8* at) {
   return hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::Load(d8, kWiden)));
 }
 
-/// Copies bytes. Short runs, of which small rectangles have many, do without a call.
-HWY_INLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
+/// Copies a run of a few vectors at most, without a call.
+HWY_INLINE void copyShort(uint8* dst, const uint8* src, size_t bytes) {
+  forLanes(hn::Repartition<uint8, Pixels>(), bytes,
+           [=](auto d, size_t i) { hn::StoreU(hn::LoadU(d, src + i), d, dst + i); });
+}
+
+/// Copies a row. Small rectangles have many short ones.
+HWY_INLINE void copyRow(uint8* dst, const uint8* src, size_t bytes) {
   if (bytes > 16 * kBlock) {
     memcpy(dst, src, bytes);
   } else {
-    forLanes(hn::Repartition<uint8, Pixels>(), bytes,
-             [=](auto d, size_t i) { hn::StoreU(hn::LoadU(d, src + i), d, dst + i); });
+    copyShort(dst, src, bytes);
   }
 }
 
@@ -200,7 +205,7 @@ HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
     storeLanes(d, widenPixels(row + size_t{3} * i), out + size_t{4} * i);
   for (; i < count; i += kBlock) {
     uint8 rest[4 * kBlock] = {};
-    copyBytes(rest, row + size_t{3} * i, size_t{3} * std::min<size_t>(count - i, kBlock));
+    copyShort(rest, row + size_t{3} * i, size_t{3} * std::min<size_t>(count - i, kBlock));
     storeLanes(d, widenPixels(rest), out + size_t{4} * i);
   }
 }
@@ -217,7 +222,7 @@ HWY_INLINE void storeSome(PixelVec pixels, size_t count, uint8* at) {
 #else
     uint8 all[4 * kBlock];
     storeLanes(d, pixels, all);
-    copyBytes(at, all, 4 * count);
+    copyShort(at, all, 4 * count);
 #endif
   }
 }
@@ -306,7 +311,7 @@ class Columns {
     if (job_.srcBytesPerPixel == 3) {
       widenRow(row, job_.srcWidth, to);
     } else {
-      copyBytes(to, row, size_t{4} * job_.srcWidth);
+      copyRow(to, row, size_t{4} * job_.srcWidth);
     }
     return to;
   }

@@ -138,7 +138,7 @@ HWY_INLINE void drawPlainRows(const ScaleJob& job, bool wholePixels, const DrawR
   for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
     const uint32 row = job.rowOf(y);
     if (wholePixels && i != 0 && row == shown) {
-      copyBytes(dst, nextRow(dst, -job.dstPitch), bytes);
+      copyRow(dst, nextRow(dst, -job.dstPitch), bytes);
     } else {
       drawRow(dst, row, y);
     }

@@ -83,7 +83,7 @@ HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
     for (; i < width; i += kBlock) {
       uint8 packed[4 * kBlock];
       storeLanes(d, packThreeBytes(block(i)), packed);
-      copyBytes(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
+      copyShort(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
     }
   }
 }

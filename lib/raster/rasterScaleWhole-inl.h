@@ -121,14 +121,14 @@ HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, const Run& run, uint
     const size_t column = run.column + kSide * i;
     uint8 copies[kSide][(3 * kSide + 1) * kBlock] = {};
     for (unsigned row = 0; row < kSide; ++row)
-      copyBytes(copies[row], rows[row] + 3 * column, 3 * kSide * count);
+      copyShort(copies[row], rows[row] + 3 * column, 3 * kSide * count);
     const auto squares = [&](unsigned row, size_t part) {
       return columnsBelow(d, widenPixels(copies[row] + 3 * part * kBlock), column + part * kBlock,
                           run.end);
     };
     uint8 packed[4 * kBlock];
     storeLanes(d, packThreeBytes(averageSquares(d, side, squares)), packed);
-    copyBytes(dst + 3 * i, packed, 3 * count);
+    copyShort(dst + 3 * i, packed, 3 * count);
   }
 }
 

@@ -411,7 +411,7 @@ TEST(Raster_Scale, RefusesFactorsUpToTheLimitAndWhatIsNoNumber) {
 }
 
 TEST(Raster_Scale, RefusesSizesOf32768) {
-  const Picture from(1, 1, 1);
+  const Picture from(32767, 1, 1);  // every row of the source, with a pitch of 0
   const auto call = [&](uint32 dstWidth, uint32 dstHeight, uint32 srcWidth, uint32 srcHeight) {
     uint32 to = 0;
     return Raster_Scale(&to, 4, 32, 24, dstWidth, dstHeight, 0, 0, 0, 1, 1, from.pixels.data(), 0,
