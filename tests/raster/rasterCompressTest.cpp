@@ -9,6 +9,7 @@
 #include <memory>
 #include <string>
 
+#include "imageUtil.h"
 #include "raster.h"
 #include "reference/rasterCompressReference.h"
 #include "support/guardedBuffer.h"
@@ -396,6 +397,32 @@ Words syntheticScreen(uint32 width, uint32 height) {
 
 TEST(Raster_Decompress, GivesBackAScreen) {
   for (const uint32 width : {64u, 333u}) check(syntheticScreen(width, 240));
+}
+
+/// A picture of tests/data as pixels of four bytes.
+Words screenshot(const char* name) {
+  ImageUtilImage image{};
+  if (!ImageUtil_ReadPNG(&image, (std::string(TESTS_DATA) + "/" + name).c_str(), 0)) return {};
+  const size_t bytes = image.bpp / 8;
+  Words pixels;
+  for (uint32 y = 0; y < image.height; ++y) {
+    for (uint32 x = 0; x < image.width; ++x) {
+      uint32 pixel = 0;
+      memcpy(&pixel, image.data + size_t{y} * image.bytesPerLine + x * bytes, bytes);
+      pixels.push_back(pixel);
+    }
+  }
+  ImageUtil_FreeImageData(&image);
+  return pixels;
+}
+
+TEST(Raster_Decompress, GivesBackScreenshots) {
+  for (const char* name : {"terminals.png", "clients.png"}) {
+    const Words pixels = screenshot(name);
+    ASSERT_EQ(pixels.size(), 1280u * 800u) << name;
+    check(pixels);
+    EXPECT_LT(compressWords(pixels).size(), pixels.size() * 4 / 6) << name;
+  }
 }
 
 }  // namespace
