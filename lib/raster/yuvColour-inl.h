@@ -102,9 +102,18 @@ HWY_INLINE hn::Vec512<uint8> packBytes(hn::Vec512<int16> a, hn::Vec512<int16> b)
 
 /// Bytes of eight pixels per 16-byte block: blue then red in one vector, green then 0 in the other.
 template <class D> struct ChannelBytes { hn::Vec<hn::Repartition<uint8, D>> blueRed, green; };
-template <class D> HWY_INLINE ChannelBytes<D> toBytes(D d, const Sums<D>& sums) {
-  return {packBytes(hn::ShiftRight<kFractionOfBlue>(sums.b), hn::ShiftRight<kFraction>(sums.r)),
-          packBytes(hn::ShiftRight<kFraction>(sums.g), hn::Zero(d))};
+
+/// Drops the fraction of a sum. Where shuffles are many and registers too, it pays to multiply: on
+/// AMD's processors shifts run in the units of the shuffles.
+template <int kBits, bool kMultiplies, class D> HWY_INLINE hn::Vec<D> whole(D d, hn::Vec<D> sum) {
+  if constexpr (kMultiplies) return hn::MulHigh(sum, hn::Set(d, int16{1 << (16 - kBits)}));
+  return hn::ShiftRight<kBits>(sum);
+}
+
+template <bool kMultiplies, class D> HWY_INLINE ChannelBytes<D> toBytes(D d, const Sums<D>& sums) {
+  return {packBytes(whole<kFractionOfBlue, kMultiplies>(d, sums.b),
+                    whole<kFraction, kMultiplies>(d, sums.r)),
+          packBytes(whole<kFraction, kMultiplies>(d, sums.g), hn::Zero(d))};
 }
 
 /// Lane i of the result is lane order[i] of `v`, in 8-byte lanes.
@@ -153,9 +162,9 @@ template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Pa
     if constexpr (kSize == 2) {
       storeLanes(hn::RebindToUnsigned<D>(), packWords(d, sums), dst);
     } else if constexpr (kSize == 3) {
-      storeTriples(d, toBytes(d, sums), dst);
+      storeTriples(d, toBytes<false>(d, sums), dst);
     } else {
-      storeQuads(d, toBytes(d, sums), dst);
+      storeQuads(d, toBytes<HWY_TARGET <= HWY_AVX3>(d, sums), dst);
     }
   }
 
