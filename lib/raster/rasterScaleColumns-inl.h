@@ -38,8 +38,11 @@ HWY_INLINE uint32 averageColumns(const PixelAt& pixelAt, uint32& x, uint32 step,
     remaining -= part;
     x += part;
   }
-  for (; x < limit && remaining >= kOnePixel; x += kOnePixel, remaining -= kOnePixel)
-    sums.add(pixelAt(x >> 16));
+  const uint32 whole = std::min(remaining, limit - x) >> 16;
+  const uint32 column = x >> 16;
+  for (uint32 i = 0; i < whole; ++i) sums.add(pixelAt(column + i));
+  remaining -= whole * kOnePixel;
+  x += whole * kOnePixel;
   if (remaining != 0 && x < limit) {
     sums.add(pixelAt(x >> 16), fractionOf(remaining) >> 8);
     x += remaining;
