@@ -37,8 +37,7 @@ template <class Rop> void rowsToLeft(const RopRows& rows) {
   const uint8* src = rows.src;
   for (uint32 y = rows.height; y != 0;
        --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep)) {
-    forLanesFromRight(Bytes(), rows.bytes,
-                      [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
+    combineToLeft<Rop>(dst, src, rows.bytes);
   }
 }
 
@@ -165,14 +164,35 @@ bool kernelEqualsWalk(const RopRows& rows, uint32 unit, RopWalk walk) {
   return ahead == 0 || ahead >= std::max(kernels().stepBytes, size_t{unit}) || ahead >= rows.bytes;
 }
 
-/// ropRows where the distance between source and destination is the same in every row.
+/// The rows from the last one up.
+RopRows upwards(const RopRows& rows) {
+  const intptr_t dstStep = rows.dstStep;
+  const intptr_t srcStep = rows.srcStep;
+  return {.dst = rowAt(rows.dst, dstStep, rows.height - 1, 0, 0),
+          .dstStep = -dstStep,
+          .src = rowAt(rows.src, srcStep, rows.height - 1, 0, 0),
+          .srcStep = -srcStep,
+          .bytes = rows.bytes,
+          .height = rows.height};
+}
+
+/// Whether rows that are walked to the left may be walked from the last one up: memory is read
+/// fastest in one direction throughout. Allowed while no row meets another one.
+bool gainsFromUpwards(const RopRows& rows) {
+  const uintptr_t distance =
+      reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
+  return rows.height != 0 && rows.dstStep > 0 && distance < rows.bytes &&
+         distance + rows.bytes <= static_cast<uintptr_t>(rows.dstStep);
+}
+
+/// What ropRows does where the distance between source and destination is the same in every row.
 void evenRopRows(const RopRows& rows, uint32 unit, uint32 rop, RopWalk walk) {
   if (!kernelEqualsWalk(rows, unit, walk)) {
     walkRows(rows, unit, rop, walk);
   } else if (walk == RopWalk::kToRight) {
     kernels().toRight[rop](rows);
   } else {
-    kernels().toLeft[rop](rows);
+    kernels().toLeft[rop](gainsFromUpwards(rows) ? upwards(rows) : rows);
   }
 }
 

@@ -11,6 +11,7 @@
 
 #include <array>
 #include <cstddef>
+#include <cstdint>
 #include <tuple>
 #include <utility>
 
@@ -72,10 +73,33 @@ template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uin
   storeLanes(d, Rop{}(s, t), dst);
 }
 
+/// Rows of fewer bytes are not worth the blocks that bring the stores to vector boundaries.
+inline constexpr size_t kWorthAligning = 8 * kLanes<hn::ScalableTag<uint8>>;
+
 /// Combines a row from left to right, a vector at a time.
 template <class Rop> HWY_INLINE void combineToRight(uint8* dst, const uint8* src, size_t bytes) {
-  forLanes(hn::ScalableTag<uint8>(), bytes,
-           [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
+  const hn::ScalableTag<uint8> d8;
+  const auto block = [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); };
+  const size_t head = (0 - reinterpret_cast<uintptr_t>(dst)) % hn::Lanes(d8);
+  if (head != 0 && bytes >= kWorthAligning) {
+    forLanes(d8, head, block);
+    dst += head;
+    src += head;
+    bytes -= head;
+  }
+  forLanes(d8, bytes, block);
+}
+
+/// Combines a row from right to left, a vector at a time.
+template <class Rop> HWY_INLINE void combineToLeft(uint8* dst, const uint8* src, size_t bytes) {
+  const hn::ScalableTag<uint8> d8;
+  const size_t tail = (reinterpret_cast<uintptr_t>(dst) + bytes) % hn::Lanes(d8);
+  if (tail != 0 && bytes >= kWorthAligning) {
+    bytes -= tail;
+    forLanesFromRight(d8, tail,
+                      [&](auto d, size_t i) { combine<Rop>(d, src + bytes + i, dst + bytes + i); });
+  }
+  forLanesFromRight(d8, bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
 }
 
 /// A table by code of what `entry` makes of each operation.
