@@ -63,9 +63,53 @@ TARNLIBS_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, 
 
 // ---- Raster operations -------------------------------------------------------------------------
 
+// An operation code is a number from 0 to 15, as in the graphics contexts of the X Window System
+// protocol. With S the source and D the destination pixel, D becomes:
+//
+//   0 clear         0             8 nor           NOT (S OR D)
+//   1 and           S AND D       9 equiv         NOT (S XOR D)
+//   2 andReverse    S AND NOT D  10 invert        NOT D
+//   3 copy          S            11 orReverse     S OR NOT D
+//   4 andInverted   NOT S AND D  12 copyInverted  NOT S
+//   5 noop          D            13 orInverted    NOT S OR D
+//   6 xor           S XOR D      14 nand          NOT (S AND D)
+//   7 or            S OR D       15 set           all bits set
+//
+// All bits of a pixel take part, the top byte of a 4-byte pixel included. A code above 15 is not an
+// error: nothing is written, as for noop. Operations that do not depend on the source do not read
+// it, and those that do not depend on the destination do not read that.
+
+/// Combines `pixel` with every pixel of a rectangle through operation `rop`.
+///
+/// `pitch` is in bytes and may be negative; `bytesPerPixel` is 1, 2, 3 or 4, and the low bytes of
+/// `pixel` are used. Any other size calls Warning("Raster: Unsupported frame buffer depth\n") and
+/// then Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterops", whatever `rop` is. A width or
+/// height of 0 writes nothing. Operation 3 is Raster_RectFill.
+///
+/// Deliberate: for 2- and 4-byte pixels the first row is found with the full pitch, and rows after
+/// it step by the pitch rounded down (toward minus infinity) to a multiple of the pixel size.
 TARNLIBS_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pixel,
                                         uint32 rop, uint32 x, uint32 y, uint32 width,
                                         uint32 height);
+/// Combines a source rectangle with a destination rectangle of the same size through operation
+/// `rop`, within a frame buffer or between two with the same pixel size.
+///
+/// Pitches are in bytes and may be negative. The rectangles may overlap: rows run from the last one
+/// up when srcY < dstY and from the first one down otherwise; pixels run from right to left when
+/// srcY == dstY and dstX > srcX and from left to right otherwise. So every source pixel is read
+/// before it is overwritten when `dst` and `src` are the same frame buffer. The order depends on
+/// the coordinates only. Where the same memory is reached in other ways, the result is that of
+/// reading, combining and storing one pixel after the other in this order; pixels of 3 bytes are
+/// three operations on bytes, in rising address order, or from right to left in falling order.
+///
+/// Operation 3 is Raster_RectCopy, for any `bytesPerPixel`. With the other ones a size other than
+/// 1, 2, 3 or 4 calls Warning("Raster: Unsupported frame buffer depth\n") and then
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterops", before `rop` is looked at. A width
+/// or height of 0 writes nothing.
+///
+/// Deliberate: `rop` stands between the coordinates. For 2- and 4-byte pixels the first row is
+/// found with the full pitch, and rows after it step by the pitch, negated where rows run up, and
+/// then rounded down (toward minus infinity) to a multiple of the pixel size.
 TARNLIBS_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src,
                                         int32 srcPitch, uint32 bytesPerPixel, uint32 srcX,
                                         uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY,
@@ -73,15 +117,37 @@ TARNLIBS_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8*
 
 // ---- Tiling ------------------------------------------------------------------------------------
 
+// A pixmap is a picture with the pixel size of the destination, laid out endlessly to the right and
+// downwards. Its pixel (tileX mod pixmapWidth, tileY mod pixmapHeight) falls on (dstX, dstY). The
+// rectangle is cut into blocks at the pixmap's edges: bands of rows from the top down, each cut
+// into blocks from left to right. Within a block, pixels run top down and from left to right, also
+// where pixmap and rectangle overlap.
+//
+// Deliberate: for 2- and 4-byte pixels the first row of a block is found with the full pitches, and
+// rows after it step by the pitches rounded down to a multiple of the pixel size.
+
+/// Fills a rectangle with a repeated pixmap. As Raster_RectPixmapROPcopy with operation 3.
 TARNLIBS_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
                                            uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
                                            uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
                                            uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+/// Combines a repeated pixmap with a rectangle through operation `rop` (0 to 15, see above; higher
+/// ones write nothing).
+///
+/// Pitches are in bytes; the pixmap's size is in pixels and must not be 0: a size of 0 divides by
+/// zero, before anything else is looked at. A `bytesPerPixel` other than 1, 2, 3 or 4 calls
+/// Warning("Raster: Unsupported frame buffer depth\n") and then Panic("NOT_IMPLEMENTED %s:%d\n")
+/// with "lib/raster/rasterpix". A width or height of 0 writes nothing.
 TARNLIBS_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
                                               uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
                                               uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
                                               uint32 height);
+/// The blocks of Raster_RectPixmapROPcopy by pixel size (8, 16, 24, 32 bits): combine the rectangle
+/// at (srcX, srcY) of `src` into the one at (dstX, dstY) of `dst`, without wrapping, always top
+/// down and from left to right. Nothing looks for overlap: where `src` lies in what has been
+/// written already, the new pixels are the source. Operation 3 is such a walk too, not
+/// Raster_RectCopy.
 TARNLIBS_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
                                               uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
                                               uint32 dstX, uint32 dstY, uint32 width,
@@ -101,12 +167,28 @@ TARNLIBS_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, cons
 
 // ---- Bit planes --------------------------------------------------------------------------------
 
+// A bit plane has one bit a pixel, the most significant bit of a byte first, and starts each row
+// with a whole byte: pixel i of a row is bit 7 - i mod 8 of byte i / 8. Bits beyond the width are
+// ignored, and no byte beyond the last one needed is read. `dst` is the address of the rectangle's
+// first pixel; pitches are in bytes. A width or height that is not positive writes nothing.
+//
+// A plane that lies in the rectangle is looked at once for every four pixels, just before these are
+// written; rows run top down and pixels from left to right.
+//
+// Deliberate: rows step by the full pitch for every pixel size, so that pixels of 2 and 4 bytes may
+// lie at any address; and a `bytesPerPixel` other than 1, 2, 3 or 4 does nothing, without a
+// warning.
+
+/// Writes `foreground` where a bit of the plane is set and `background` where it is clear.
 TARNLIBS_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                          uint32 dstPitch, int32 bytesPerPixel, int32 width,
                                          int32 height, uint32 foreground, uint32 background);
+/// Writes `foreground` where a bit of the plane is set; pixels of clear bits stay.
 TARNLIBS_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                                 uint32 dstPitch, int32 bytesPerPixel, int32 width,
                                                 int32 height, uint32 foreground);
+/// Raster_BitsToPixels for one pixel size (8, 16, 24, 32 bits), of which the low bits of the values
+/// are used.
 TARNLIBS_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                          uint32 dstPitch, int32 width, int32 height,
                                          uint32 foreground, uint32 background);
@@ -119,6 +201,7 @@ TARNLIBS_EXPORT void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, u
 TARNLIBS_EXPORT void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                           uint32 dstPitch, int32 width, int32 height,
                                           uint32 foreground, uint32 background);
+/// Raster_BitsToPixelsStencil for one pixel size (8, 16, 24, 32 bits).
 TARNLIBS_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                                 uint32 dstPitch, int32 width, int32 height,
                                                 uint32 foreground);
