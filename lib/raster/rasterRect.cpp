@@ -59,7 +59,10 @@ constexpr Rects kCut = Rects{1} << kListSize;
 class EdgeTable {
  public:
   /// Before the first edge stands one that stops every insertion.
-  EdgeTable() { y_[0] = INT32_MIN; }
+  EdgeTable() {
+    y_[0] = INT32_MIN;
+    changes_[0] = kNone;
+  }
 
   /// Adds the top and the bottom of a rectangle.
   void add(const RectListEntry& r, Rects rect) {
@@ -83,6 +86,7 @@ class EdgeTable {
  private:
   void insert(int32 y, Rects changes) {
     uint32 at = ++count_;
+    // NOLINTNEXTLINE(clang-analyzer-core.UndefinedBinaryOperatorResult): the first edge ends it
     for (; y_[at - 1] > y; --at) {
       y_[at] = y_[at - 1];
       changes_[at] = changes_[at - 1];

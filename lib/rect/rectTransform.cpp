@@ -27,7 +27,8 @@ Axis vertical(const Rect& r) { return {r.top, r.bottom}; }
 /// The offset d from one edge of `from`, in the scale of `to`: exact, truncated toward zero. An
 /// empty `from` cannot be scaled up; that is the caller's fault and divides by zero.
 int64 scaledOffset(int64 d, const Axis& to, const Axis& from) {
-  return to.size() != from.size() ? d * to.size() / from.size() : d;
+  if (to.size() == from.size()) return d;
+  return d * to.size() / from.size();  // NOLINT(clang-analyzer-core.DivideZero): see above
 }
 
 /// An axis carried from one frame into another, and whether both of its ends fit.
