@@ -30,9 +30,23 @@ HWY_INLINE uint32 wordAt(const uint8* words, size_t i) { return loadPixel<4>(wor
 HWY_INLINE void putWord(uint8* words, size_t i, uint32 word) { storePixel<4>(words + 4 * i, word); }
 
 /// Copies words as long as each differs from the next one, at most `count`, and returns how many.
-/// `src` has a word more than that.
-HWY_INLINE size_t copyUpToPair(const uint8* src, uint8* dst, size_t count) {
+/// `src` has a word more than that; `dst` has room for `room` words, of which those after the ones
+/// copied may change too.
+HWY_INLINE size_t copyUpToPair(const uint8* src, uint8* dst, size_t count, size_t room) {
   size_t i = 0;
+#if HWY_TARGET != HWY_SCALAR
+  const Words d;
+  const size_t most = std::min(count, room);
+  for (; most - i >= hn::Lanes(d); i += hn::Lanes(d)) {
+    const Word words = loadLanes(d, src + 4 * i);
+    const auto pairs = hn::Eq(words, loadLanes(d, src + 4 * i + 4));
+    storeLanes(d, words, dst + 4 * i);
+    const intptr_t first = hn::FindFirstTrue(d, pairs);
+    if (first >= 0) return i + static_cast<size_t>(first);
+  }
+#else
+  (void)room;
+#endif
   for (; i < count && wordAt(src, i) != wordAt(src, i + 1); ++i) putWord(dst, i, wordAt(src, i));
   return i;
 }
@@ -94,7 +108,7 @@ HWY_INLINE void putCount(uint8* code, EncoderProgress& at, size_t count) {
 /// Encodes literals up to a pair, and the run that it begins.
 void encodeStep(const uint8* src, size_t total, uint8* code, EncoderProgress& at) {
   const size_t most = std::min(total - at.in - 1, total - at.out);
-  const size_t literals = copyUpToPair(src + 4 * at.in, code + 4 * at.out, most);
+  const size_t literals = copyUpToPair(src + 4 * at.in, code + 4 * at.out, most, most);
   at.in += literals;
   at.out += literals;
   if (at.out == total) return;
@@ -110,7 +124,8 @@ void encodeStep(const uint8* src, size_t total, uint8* code, EncoderProgress& at
 /// Decodes literals up to a pair, and its run.
 void decodeStep(const uint8* code, size_t codeWords, uint8* dst, size_t room, Progress& at) {
   const size_t most = codeWords - at.in - 1;
-  const size_t literals = copyUpToPair(code + 4 * at.in, dst + 4 * at.out, most);
+  const size_t literals =
+      copyUpToPair(code + 4 * at.in, dst + 4 * at.out, most, room - std::min(room, at.out));
   at.in += literals;
   at.out += literals;
   const uint32 pixel = wordAt(code, at.in++);
