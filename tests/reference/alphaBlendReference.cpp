@@ -106,18 +106,45 @@ uint32 blendPixel(const BlendFormat& format, const Blend& blend, const uint8* so
   return narrowed(format, channels, pixel);
 }
 
-void alphaBlend(Bytes& memory, size_t dst, size_t dstPitch, size_t src, size_t srcPitch,
-                uint32 width, uint32 height, const BlendFormat& format, const Blend& blend) {
-  for (uint32 y = 0; y < height; ++y) {
-    for (uint32 x = 0; x < width; ++x) {
-      const size_t s = src + y * srcPitch + size_t{x} * 4;
-      const size_t d = dst + y * dstPitch + size_t{x} * format.bytes;
-      const uint8 source[4] = {memory.at(s), memory.at(s + 1), memory.at(s + 2), memory.at(s + 3)};
-      uint32 pixel = 0;
-      for (uint32 k = 0; k < format.bytes; ++k) pixel |= uint32{memory.at(d + k)} << (8 * k);
-      pixel = blendPixel(format, blend, source, pixel);
-      for (uint32 k = 0; k < format.bytes; ++k)
-        memory.at(d + k) = static_cast<uint8>(pixel >> (8 * k));
+namespace {
+
+/// Blends `count` pixels at `dst` of one memory with those at `src` of another, or of the same.
+void blendPixels(Bytes& to, size_t dst, const Bytes& from, size_t src, size_t count,
+                 const BlendFormat& format, const Blend& blend) {
+  for (; count != 0; --count, dst += format.bytes, src += 4) {
+    const uint8 source[4] = {from.at(src), from.at(src + 1), from.at(src + 2), from.at(src + 3)};
+    uint32 pixel = 0;
+    for (uint32 k = 0; k < format.bytes; ++k) pixel |= uint32{to.at(dst + k)} << (8 * k);
+    pixel = blendPixel(format, blend, source, pixel);
+    for (uint32 k = 0; k < format.bytes; ++k) to.at(dst + k) = static_cast<uint8>(pixel >> (8 * k));
+  }
+}
+
+}  // namespace
+
+void blendInPlace(Bytes& memory, const BlendPlace& place, const BlendFormat& format,
+                  const Blend& blend) {
+  for (uint32 y = 0; y < place.height; ++y) {
+    blendPixels(memory, place.dst + y * place.dstPitch, memory, place.src + y * place.srcPitch,
+                place.width, format, blend);
+  }
+}
+
+void blendStaged(Bytes& memory, const BlendPlace& place, const BlendFormat& format,
+                 const Blend& blend) {
+  for (uint32 y = 0; y < place.height; ++y) {
+    size_t dst = place.dst + y * place.dstPitch;
+    size_t src = place.src + y * place.srcPitch;
+    size_t left = size_t{place.width} * format.bytes;
+    while (left != 0) {
+      const size_t chunk = std::min<size_t>(3072, left);
+      Bytes buffer;
+      for (size_t i = 0; i < chunk; ++i) buffer.push_back(memory.at(dst + i));
+      blendPixels(buffer, 0, memory, src, chunk / format.bytes, format, blend);
+      for (size_t i = 0; i < chunk; ++i) memory.at(dst + i) = buffer[i];
+      dst += chunk;
+      src += chunk / format.bytes * 4;
+      left -= chunk;
     }
   }
 }

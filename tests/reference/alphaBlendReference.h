@@ -35,9 +35,20 @@ uint32 blendChannel(const Blend& blend, uint32 source, uint32 sourceAlpha, uint3
 /// A destination pixel (its low bytes) after a blend with the four source bytes at `source`.
 uint32 blendPixel(const BlendFormat& format, const Blend& blend, const uint8* source, uint32 pixel);
 
-/// Blends a rectangle within one memory: `dst` and `src` are the offsets of the first pixels.
-void alphaBlend(Bytes& memory, size_t dst, size_t dstPitch, size_t src, size_t srcPitch,
-                uint32 width, uint32 height, const BlendFormat& format, const Blend& blend);
+/// A rectangle within one memory: the first pixels and the pitches of destination and source.
+struct BlendPlace {
+  size_t dst, dstPitch;
+  size_t src, srcPitch;
+  uint32 width, height;
+};
+
+/// Blends in place, from pixel to pixel.
+void blendInPlace(Bytes& memory, const BlendPlace& place, const BlendFormat& format,
+                  const Blend& blend);
+
+/// Blends through a buffer of 3072 bytes, from chunk to chunk.
+void blendStaged(Bytes& memory, const BlendPlace& place, const BlendFormat& format,
+                 const Blend& blend);
 
 }  // namespace reference
 

@@ -1,0 +1,165 @@
+// SPDX-License-Identifier: MIT
+//
+// Mouse cursors: the size of their planes, expansion of bit planes, clipping and drawing.
+
+#include <algorithm>
+#include <cstddef>
+#include <cstring>
+
+#include "alphaBlendInternal.h"
+#include "panicPlace.h"
+#include "raster.h"
+#include "rasteropsInternal.h"
+
+namespace raster {
+namespace {
+
+constexpr char kSource[] = "lib/raster/rasterCursor";
+
+// Five 32-bit words, then pointers at their natural alignment.
+static_assert(offsetof(RasterCursor, height) == 16);
+static_assert(offsetof(RasterCursor, image.pixels) == (sizeof(void*) == 4 ? 20 : 24));
+static_assert(offsetof(RasterCursor, image.mask.bpp) == (sizeof(void*) == 4 ? 24 : 28));
+static_assert(offsetof(RasterCursor, image.mask.andMask) == (sizeof(void*) == 4 ? 28 : 32));
+static_assert(offsetof(RasterCursor, image.mask.xorMask) == (sizeof(void*) == 4 ? 32 : 40));
+static_assert(sizeof(RasterFrameBufferDesc) == 20 && sizeof(RasterCursorBox) == 24);
+
+constexpr uint32 kTooLarge = 0xFFFFFFFF;
+
+// The raster operations that draw a mask cursor.
+constexpr uint32 kAnd = 1;
+constexpr uint32 kXor = 6;
+
+/// The bytes of a plane, or kTooLarge when a step on the way does not fit 32 bits.
+uint32 planeSize(uint32 width, uint32 height, uint32 bitsPerPixel) {
+  uint32 bits = 0;
+  uint32 bytes = 0;
+  if (__builtin_mul_overflow(width, bitsPerPixel, &bits) ||
+      __builtin_add_overflow(bits, 31U, &bits) ||
+      __builtin_mul_overflow((bits >> 5) * 4, height, &bytes))
+    return kTooLarge;
+  return bytes;
+}
+
+void expandBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel, const uint8* bits, uint8* dst,
+                    uint32 dstSize) {
+  if (planeSize(width, height, bitsPerPixel) > dstSize) notImplemented(kSource);
+  Raster_BitsToPixels(bits, planeSize(width, 1, 1), dst, planeSize(width, 1, bitsPerPixel),
+                      static_cast<int32>(bitsPerPixel / 8), static_cast<int32>(width),
+                      static_cast<int32>(height), 0xFFFFFFFF, 0);
+}
+
+/// A plane of depth 1 is expanded, one in the pixels' own depth copied with its row padding.
+void takePlane(uint32 width, uint32 height, uint32 depth, const uint8* plane, uint32 bitsPerPixel,
+               uint8* dst, uint32 size) {
+  if (depth == 1) {
+    expandBitPlane(width, height, bitsPerPixel, plane, dst, size);
+  } else if (depth == bitsPerPixel) {
+    memcpy(dst, plane, size);
+  } else {
+    notImplemented(kSource);
+  }
+}
+
+/// The visible part of a row or column of a cursor.
+struct Visible {
+  int64 at;     ///< in the frame buffer
+  int64 size;   ///< not positive where nothing is visible
+  int64 first;  ///< in the cursor
+};
+
+/// Clips `size` pixels at `at`. In 64 bits, where no sum of 32-bit numbers overflows.
+Visible clip(int64 at, int64 size, int64 limit) {
+  Visible v = {at, size, 0};
+  if (at < 0) v = {0, size + at, -at};
+  v.size = std::min(v.size, limit - v.at);
+  return v;
+}
+
+/// Where a cursor is drawn.
+struct Target {
+  uint8* bits;
+  uint32 pitch;
+  uint32 x, y;
+};
+
+void drawAlpha(const Target& to, const RasterFrameBufferDesc& fb, const RasterCursor& cursor,
+               const RasterCursorBox& box) {
+  alphaBlend(to.bits, to.x, to.y, to.pitch, cursor.image.pixels, static_cast<uint32>(box.srcX),
+             static_cast<uint32>(box.srcY), 4 * cursor.width, static_cast<uint32>(box.width),
+             static_cast<uint32>(box.height), fb.depth, fb.bpp, kBlendOver, 0, 0, 0, 0);
+}
+
+void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor,
+              const RasterCursorBox& box) {
+  const auto pitch = static_cast<int32>(cursor.width * bytesPerPixel);
+  const auto combine = [&](const uint8* plane, uint32 rop) {
+    Raster_RectROPcopy(to.bits, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
+                       static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x,
+                       to.y, static_cast<uint32>(box.width), static_cast<uint32>(box.height));
+  };
+  combine(cursor.image.mask.andMask, kAnd);
+  combine(cursor.image.mask.xorMask, kXor);
+}
+
+}  // namespace
+}  // namespace raster
+
+extern "C" {
+
+uint32 Raster_CalculateCursorSize(uint32 width, uint32 height, uint32 bitsPerPixel) {
+  return raster::planeSize(width, height, bitsPerPixel);
+}
+
+void Raster_ExpandCursorBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel,
+                                 const uint8* bits, uint8* dst, uint32 dstSize) {
+  raster::expandBitPlane(width, height, bitsPerPixel, bits, dst, dstSize);
+}
+
+void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
+                                   const uint8* andBits, uint32 xorDepth, const uint8* xorBits,
+                                   uint32 bitsPerPixel, uint8* dst, uint32 dstSize) {
+  const uint32 size = raster::planeSize(width, height, bitsPerPixel);
+  const uint32 both = size > raster::kTooLarge / 2 ? raster::kTooLarge : 2 * size;
+  if (dstSize < both) raster::notImplemented(raster::kSource);
+  raster::takePlane(width, height, andDepth, andBits, bitsPerPixel, dst, size);
+  raster::takePlane(width, height, xorDepth, xorBits, bitsPerPixel, dst + size, size);
+}
+
+bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb, const RasterCursor* cursor, int32 x,
+                             int32 y, RasterCursorBox* box) {
+  const raster::Visible columns = raster::clip(
+      int64{x} - cursor->hotX, static_cast<int32>(cursor->width), static_cast<int32>(fb->width));
+  const raster::Visible rows = raster::clip(
+      int64{y} - cursor->hotY, static_cast<int32>(cursor->height), static_cast<int32>(fb->height));
+  if (columns.size <= 0 || rows.size <= 0) return false;
+  *box = {static_cast<int32>(columns.at),    static_cast<int32>(rows.at),
+          static_cast<int32>(columns.size),  static_cast<int32>(rows.size),
+          static_cast<int32>(columns.first), static_cast<int32>(rows.first)};
+  return true;
+}
+
+void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb, uint8* saveBits,
+                       uint32 savePitch, const RasterCursor* cursor, const RasterCursorBox* box) {
+  const uint32 bytesPerPixel = fb->bpp / 8;
+  const auto x = static_cast<uint32>(box->x);
+  const auto y = static_cast<uint32>(box->y);
+  raster::Target target = {fbBits, fb->pitch, x, y};
+  if (saveBits != nullptr) {
+    raster::rectCopy(saveBits, raster::pitchOf(savePitch), fbBits, raster::pitchOf(fb->pitch),
+                     bytesPerPixel, x, y, 0, 0, static_cast<uint32>(box->width),
+                     static_cast<uint32>(box->height));
+    target = {saveBits, savePitch, 0, 0};
+  }
+  if (cursor->type == RASTER_CURSOR_ALPHA) {
+    raster::drawAlpha(target, *fb, *cursor, *box);
+  } else if (cursor->type == RASTER_CURSOR_MASK) {
+    const RasterCursorMask& mask = cursor->image.mask;
+    if (mask.depth != fb->depth || mask.bpp != fb->bpp) raster::notImplemented(raster::kSource);
+    raster::drawMask(target, bytesPerPixel, *cursor, *box);
+  } else {
+    raster::notImplemented(raster::kSource);
+  }
+}
+
+}  // extern "C"

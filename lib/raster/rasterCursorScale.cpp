@@ -1,0 +1,115 @@
+// SPDX-License-Identifier: MIT
+//
+// Scaled cursors. A cursor is placed in a larger buffer first, with a margin on every side, so that
+// smoothing has room to spread past its edges.
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+#include <cstring>
+
+#include "raster.h"
+#include "rasteropsInternal.h"
+#include "rect.h"
+#include "utilAlloc.h"
+
+namespace raster {
+namespace {
+
+constexpr uint32 kBytesPerPixel = 4;
+constexpr uint32 kDepth = 24;
+constexpr uint32 kBpp = 32;
+
+// How planes are scaled, and what lies around the cursor.
+constexpr int32 kNearest = 0;
+constexpr int32 kSmoothed = 2;
+constexpr uint8 kTransparent = 0;
+constexpr uint8 kKeepScreen = 0xFF;
+constexpr uint8 kInvertNothing = 0;
+
+/// A number toward zero; one that does not fit gives the smallest integer, as the processor's
+/// conversion does.
+int32 truncated(double value) {
+  if (value > -2147483649.0 && value < 2147483648.0) return static_cast<int32>(value);
+  return INT32_MIN;
+}
+
+/// A length in pixels, modulo 2^32.
+uint32 pixelsOf(double length) {
+  if (std::fabs(length) < 9223372036854775808.0)
+    return static_cast<uint32>(static_cast<uint64>(static_cast<int64>(length)));
+  return 0;
+}
+
+/// How far smoothing reaches at a scale, in pixels of the cursor.
+uint32 marginOf(double scale) {
+  return static_cast<uint32>(std::max(truncated(1 / scale), truncated(scale))) + 1;
+}
+
+int32 scaledHotSpot(int32 hot, double scale) {
+  return truncated(static_cast<double>(int64{hot} + static_cast<int32>(marginOf(scale))) * scale);
+}
+
+/// The sizes and factors of a scaled cursor.
+struct Scaling {
+  double scaleX, scaleY;
+  uint32 paddedWidth, paddedHeight;
+  uint32 scaledWidth, scaledHeight;
+};
+
+/// Scales one plane of `width` x `height` 4-byte pixels, surrounded by bytes of `fill`.
+void scalePlane(uint8* dst, const uint8* plane, uint32 width, uint32 height, const Scaling& to,
+                uint8 fill, int32 smooth) {
+  const uint32 pitch = kBytesPerPixel * to.paddedWidth;
+  const size_t bytes = size_t{pitch} * to.paddedHeight;
+  auto* padded = static_cast<uint8*>(UtilSafeMalloc0(bytes));
+  memset(padded, fill, bytes);
+  rectCopy(padded, pitchOf(pitch), plane, pitchOf(kBytesPerPixel * width), kBytesPerPixel, 0, 0,
+           marginOf(to.scaleX), marginOf(to.scaleY), width, height);
+  Rect all;
+  Rect_SetFromXYWH(&all, 0, 0, static_cast<int32>(to.scaledWidth),
+                   static_cast<int32>(to.scaledHeight));
+  Raster_Scale(dst, kBytesPerPixel * to.scaledWidth, kBpp, kDepth, to.scaledWidth, to.scaledHeight,
+               0, all.left, all.top, all.right, all.bottom, padded, static_cast<int32>(pitch), kBpp,
+               kDepth, 0, to.paddedWidth, to.paddedHeight, 0, to.scaleX, to.scaleY, smooth);
+  free(padded);
+}
+
+}  // namespace
+}  // namespace raster
+
+extern "C" {
+
+uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight, uint32* scaledWidth,
+                                  uint32* scaledHeight, int32* scaledHot, uint32 width,
+                                  uint32 height, double scaleX, double scaleY, int32 hotX,
+                                  int32 hotY) {
+  *paddedWidth = width + 2 * raster::marginOf(scaleX);
+  *paddedHeight = height + 2 * raster::marginOf(scaleY);
+  *scaledWidth = raster::pixelsOf(std::ceil(*paddedWidth * scaleX));
+  *scaledHeight = raster::pixelsOf(std::ceil(*paddedHeight * scaleY));
+  scaledHot[0] = raster::scaledHotSpot(hotX, scaleX);
+  scaledHot[1] = raster::scaledHotSpot(hotY, scaleY);
+  return *scaledWidth * raster::kBytesPerPixel * *scaledHeight;
+}
+
+void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX, double scaleY,
+                             uint32 paddedWidth, uint32 paddedHeight, uint32 scaledWidth,
+                             uint32 scaledHeight) {
+  const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
+  raster::scalePlane(dst, cursor->image.pixels, cursor->width, cursor->height, to,
+                     raster::kTransparent, raster::kSmoothed);
+}
+
+void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const RasterCursor* cursor,
+                             double scaleX, double scaleY, uint32 paddedWidth, uint32 paddedHeight,
+                             uint32 scaledWidth, uint32 scaledHeight) {
+  const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
+  const RasterCursorMask& mask = cursor->image.mask;
+  raster::scalePlane(andDst, mask.andMask, cursor->width, cursor->height, to, raster::kKeepScreen,
+                     raster::kNearest);
+  raster::scalePlane(xorDst, mask.xorMask, cursor->width, cursor->height, to,
+                     raster::kInvertNothing, raster::kNearest);
+}
+
+}  // extern "C"
