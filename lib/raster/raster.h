@@ -406,11 +406,67 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 
 // ---- Alpha blending ----------------------------------------------------------------------------
 
+/// Composites a rectangle of 4-byte source pixels with alpha onto a frame buffer without.
+///
+/// Source pixels are channel 0, channel 1, channel 2 and alpha in memory order, the channels
+/// premultiplied by alpha. Pitches are in bytes, and rows step by the full pitch. The formats of
+/// the destination, in bits from the lowest:
+///
+/// | depth | bpp | pixel    | channel 0 | channel 1 | channel 2 | other bits          |
+/// |-------|-----|----------|-----------|-----------|-----------|---------------------|
+/// | 6     | any | 1 byte   | 0-1       | 2-3       | 4-5       | 6-7 become 0        |
+/// | 8     | any | 1 byte   | 6-7       | 3-5       | 0-2       |                     |
+/// | 15    | any | 2 bytes  | 0-4       | 5-9       | 10-14     | 15 becomes 0        |
+/// | 16    | any | 2 bytes  | 0-4       | 5-10      | 11-15     |                     |
+/// | 24    | 24  | 3 bytes  | byte 0    | byte 1    | byte 2    |                     |
+/// | 24    | 32  | 4 bytes  | byte 0    | byte 1    | byte 2    | byte 3 keeps its value |
+///
+/// Any other pair ends in Panic("ASSERT %s:%d bugNr=%d\n", "lib/raster/alphaBlend", 205, 19864),
+/// also for an empty rectangle. Fields are widened to 8 bits by repeating them from the top, and
+/// narrowed to their top bits.
+///
+/// `op` is one of the numbers of the X Rendering Extension's operators (Porter and Duff 1984), 0 to
+/// 13; larger ones are not checked for. With s and d a channel of source and destination, sa and da
+/// their alphas, every product divided by 255 toward zero and every sum clamped at 255:
+///
+/// | op | name         | result                    | op | name            | result              |
+/// |----|--------------|---------------------------|----|-----------------|---------------------|
+/// | 0  | Clear        | 0                         | 7  | Out             | s(255-da)           |
+/// | 1  | Source       | s                         | 8  | Out-reverse     | d(255-sa)           |
+/// | 2  | Destination  | d                         | 9  | Atop            | s da + d(255-sa)    |
+/// | 3  | Over         | s + d(255-sa)             | 10 | Atop-reverse    | d sa + s(255-da)    |
+/// | 4  | Over-reverse | d + s(255-da)             | 11 | Xor             | as 10               |
+/// | 5  | In           | s da                      | 12 | Add             | s + d               |
+/// | 6  | In-reverse   | d sa                      | 13 | Saturate        | d + s F             |
+///
+/// F is (255 - da) / da, truncated and at most 255. Bit 0 of `flags` first scales all four source
+/// bytes by `srcAlpha` / 255. Bit 1 scales the destination's channels by `dstAlpha` / 255 and makes
+/// da = dstAlpha; without it da is 255. Other bits are ignored; both alphas are 0 to 255.
+///
+/// `staged` 0 blends in place, from left to right and row after row, so that source and destination
+/// may overlap. Any other value moves the destination through a buffer: the frame buffer, be it
+/// slow or shared, is then read and written by block copies of at most 3072 bytes only, and a
+/// source that overlaps it is read as it was before its block is written back. The pixels are
+/// otherwise equal.
+///
+/// In place, operators 0 and 2 read no source and 0, 1, 5 and 7 no destination, except that in
+/// 4-byte pixels byte 3 is read and written back together with the others: no other thread may
+/// write a pixel of the rectangle during the call, not even that byte.
+///
+/// Deliberate:
+/// - Operator 11 is computed as operator 10.
+/// - A field of three bits (depth 8) widens to c << 5 | c << 2 | (c & 3), so 4 becomes 0x90. In
+/// that
+///   depth channel 0 is in the top bits, in all others in the lowest.
+/// - Operator 13 with bit 1 of `flags` and `dstAlpha` 0 divides by zero: the call raises SIGFPE
+/// when
+///   there is a pixel to blend, and traps should a handler return.
 TARNLIBS_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
                                        const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
                                        uint32 width, uint32 height, uint32 depth, uint32 bpp,
                                        uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
                                        uint8 staged);
+/// Raster_AlphaBlend with operator 3 (Over) and without constant alphas.
 TARNLIBS_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
                                            const uint8* src, uint32 srcX, uint32 srcY,
                                            uint32 srcPitch, uint32 width, uint32 height,
@@ -493,9 +549,11 @@ TARNLIBS_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint3
 
 // NOLINTBEGIN(modernize-use-using)
 
+/// The kinds of cursor: an AND and an XOR plane in the frame buffer's format, or pixels with alpha.
 enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
 
-/// The planes of a mask cursor.
+/// The planes of a mask cursor: `height` rows of `width` x (bpp / 8) bytes each, without gaps.
+/// Screen pixels survive where the AND plane is all ones, and are inverted where the XOR plane is.
 typedef struct RasterCursorMask {
   uint32 depth;
   uint32 bpp;
@@ -503,18 +561,20 @@ typedef struct RasterCursorMask {
   uint8* xorMask;
 } RasterCursorMask;
 
+/// A cursor. The caller owns its planes.
 typedef struct RasterCursor {
   uint32 type;
-  int32 hotX;
+  int32 hotX;  ///< the hot spot within the image, in pixels
   int32 hotY;
-  uint32 width;
+  uint32 width;  ///< in pixels
   uint32 height;
   union {
-    uint8* pixels;          ///< RASTER_CURSOR_ALPHA
+    uint8* pixels;          ///< RASTER_CURSOR_ALPHA: rows of 4-byte pixels as for Raster_AlphaBlend
     RasterCursorMask mask;  ///< RASTER_CURSOR_MASK
   } image;
 } RasterCursor;
 
+/// A frame buffer's size in pixels, format and pitch in bytes.
 typedef struct RasterFrameBufferDesc {
   uint32 width;
   uint32 height;
@@ -523,6 +583,8 @@ typedef struct RasterFrameBufferDesc {
   uint32 pitch;
 } RasterFrameBufferDesc;
 
+/// The visible part of a cursor: its place and size in the frame buffer, and its first column and
+/// row in the cursor's image.
 typedef struct RasterCursorBox {
   int32 x;
   int32 y;
@@ -534,27 +596,66 @@ typedef struct RasterCursorBox {
 
 // NOLINTEND(modernize-use-using)
 
+/// The bytes of a cursor plane whose rows are padded to a multiple of 32 bits:
+/// (width x bitsPerPixel + 31) / 32 x 4 bytes a row. 0xFFFFFFFF where the product, the sum or the
+/// whole does not fit 32 bits; rows are checked even when there are none.
 TARNLIBS_EXPORT uint32 Raster_CalculateCursorSize(uint32 width, uint32 height, uint32 bitsPerPixel);
+/// Expands a plane of 1-bit pixels to pixels of `bitsPerPixel` / 8 bytes (1 to 4; nothing happens
+/// for other sizes): a set bit gives a pixel of ones, a clear bit one of zeros. Bits are taken from
+/// the highest down. Rows of both planes are padded as by Raster_CalculateCursorSize; the padding
+/// of `dst` is not written. Ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor"
+/// when the plane has more than `dstSize` bytes.
 TARNLIBS_EXPORT void Raster_ExpandCursorBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel,
                                                  const uint8* bits, uint8* dst, uint32 dstSize);
+/// Stores the AND plane and behind it the XOR plane of a cursor in `dst`, each of
+/// Raster_CalculateCursorSize(width, height, bitsPerPixel) bytes. A plane of depth 1 is expanded as
+/// by Raster_ExpandCursorBitPlane, one of depth `bitsPerPixel` copied with its padding. Ends in
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor" when both planes need more than
+/// `dstSize` bytes, or for any other depth; the AND plane is stored before `xorDepth` is looked at.
 TARNLIBS_EXPORT void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
                                                    const uint8* andBits, uint32 xorDepth,
                                                    const uint8* xorBits, uint32 bitsPerPixel,
                                                    uint8* dst, uint32 dstSize);
+/// Clips a cursor, placed with its hot spot at (x, y), to the frame buffer. Returns false, and
+/// leaves `box` alone, when nothing of it is visible. Sizes above 2^31 - 1 count as negative.
 TARNLIBS_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
                                              const RasterCursor* cursor, int32 x, int32 y,
                                              RasterCursorBox* box);
+/// Draws the part of a cursor that `box` (from Raster_ComputeCursorBox) names.
+///
+/// When `saveBits` is null the cursor is drawn into the frame buffer. Otherwise the area of the box
+/// is first copied to the top left of `saveBits`, with rows of `savePitch` bytes, and the cursor
+/// drawn into that copy; the frame buffer is left unchanged. An alpha cursor is blended as by
+/// Raster_AlphaBlendOver, in place. A mask cursor is drawn as by Raster_RectROPcopy, the AND plane
+/// with operation 1 and then the XOR plane with operation 6 (so rows after the first step by a
+/// rounded pitch).
+///
+/// Ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor", after the copy, for a
+/// mask cursor whose depth or bpp is not the frame buffer's and for any other type.
 TARNLIBS_EXPORT void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb,
                                        uint8* saveBits, uint32 savePitch,
                                        const RasterCursor* cursor, const RasterCursorBox* box);
+/// The sizes of a cursor of 4-byte pixels scaled by `scaleX` and `scaleY`, and its hot spot there.
+///
+/// For smoothing to spread, the cursor gets a margin of max(1 / scale, scale) + 1 pixels on every
+/// side (numbers toward zero), which gives the padded size; the scaled size is that times the
+/// factors, rounded up. `scaledHot[0]` and `[1]` are (hot spot + margin) x factor, toward zero.
+/// Returns scaledWidth x 4 x scaledHeight, the bytes of the scaled image. Sizes wrap at 2^32.
 TARNLIBS_EXPORT uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight,
                                                   uint32* scaledWidth, uint32* scaledHeight,
                                                   int32* scaledHot, uint32 width, uint32 height,
                                                   double scaleX, double scaleY, int32 hotX,
                                                   int32 hotY);
+/// Scales the pixels of an alpha cursor into `dst`, smoothly and with a clear margin. Sizes are
+/// those that Raster_GetScaledCursorSize gave for the same cursor and factors; rows of `dst` are 4
+/// x scaledWidth bytes. The scaling is that of Raster_Scale, and `dst` is left alone where that
+/// refuses. Working memory comes from UtilSafeMalloc0.
 TARNLIBS_EXPORT void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX,
                                              double scaleY, uint32 paddedWidth, uint32 paddedHeight,
                                              uint32 scaledWidth, uint32 scaledHeight);
+/// Scales both planes of a mask cursor, which must be 4-byte pixels, to their nearest pixels: the
+/// AND plane with a margin of ones, the XOR plane with one of zeros. Otherwise as
+/// Raster_ScaleAlphaCursor.
 TARNLIBS_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst,
                                              const RasterCursor* cursor, double scaleX,
                                              double scaleY, uint32 paddedWidth, uint32 paddedHeight,
