@@ -46,6 +46,7 @@ class Commands {
 void addImageCommands(Commands& commands);
 void addRopCommand(Commands& commands);
 void addBlendCommand(Commands& commands);
+void addCursorCommand(Commands& commands);
 void addScaleCommands(Commands& commands);
 void addCompareCommand(Commands& commands);
 void addScreenCommands(Commands& commands);

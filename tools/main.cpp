@@ -56,8 +56,9 @@ int runCommandLine(int argc, char** argv) {
   app.require_subcommand(1);
   app.set_version_flag("--version", "rastertool 1.0.0");
   Commands commands(app);
-  for (const auto addFamily : {addScreenCommands, addImageCommands, addRopCommand, addBlendCommand,
-                               addScaleCommands, addCompareCommand, addYuvCommand, addPackCommands})
+  for (const auto addFamily :
+       {addScreenCommands, addImageCommands, addRopCommand, addBlendCommand, addCursorCommand,
+        addScaleCommands, addCompareCommand, addYuvCommand, addPackCommands})
     addFamily(commands);
   try {
     app.parse(argc, argv);

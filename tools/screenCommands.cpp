@@ -11,6 +11,7 @@
 
 #include "changedRects.h"
 #include "commands.h"
+#include "cursorImage.h"
 #include "display.h"
 #include "geometry.h"
 #include "imageOptions.h"
@@ -42,13 +43,27 @@ struct ScreenOptions {
 struct ScreenshotOptions {
   ScreenOptions screen;
   OutputOptions output;
+  bool withCursor = false;
+  double cursorScale = 1;
 };
+
+void drawCursor(Picture& picture, const Rect& region, LiveCursor live, double scale) {
+  CursorImage cursor =
+      CursorImage::ofPixels(live.width, live.height, live.hotSpot, std::move(live.pixels));
+  cursor.scaleBy(scale);
+  cursor.drawOn(picture,
+                {live.hotSpotOnScreen.x - region.left, live.hotSpotOnScreen.y - region.top});
+}
 
 int screenshot(const ScreenshotOptions& options) {
   const SaveOptions saving = options.output.forSave();
   Display display(options.screen.display);
   const Rect region = options.screen.regionOf(display);
   Picture picture = display.capture(region);
+  if (options.withCursor) {
+    if (picture.record.bpp == 8) picture = picture.convertedTo(32);  // no index for a mixed colour
+    drawCursor(picture, region, display.cursor(), options.cursorScale);
+  }
   save(picture, options.output.path, saving);
   printf("%s: %s of a screen with %s\n", options.output.path.c_str(), regionText(region).c_str(),
          display.description().c_str());
@@ -61,6 +76,11 @@ void addScreenshot(Commands& commands) {
                                    [options] { return screenshot(*options); });
   options->output.addTo(command);
   options->screen.addTo(command);
+  CLI::Option* cursor =
+      command->add_flag("--cursor", options->withCursor, "draw the mouse cursor as well");
+  command->add_option("--cursor-scale", options->cursorScale, "draw it larger or smaller")
+      ->check(CLI::Range(0.1, 16.0))
+      ->needs(cursor);
 }
 
 struct WatchOptions {

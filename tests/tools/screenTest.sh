@@ -34,6 +34,7 @@ for depth in 8 15 16 24; do
   ok screenshot "part$depth.png" --region 100x50+37+21
   ok crop "shot$depth.png" cut.png 100x50+37+21
   ok compare "part$depth.png" cut.png
+  ok screenshot "cursor$depth.png" --cursor
 done
 
 refused 1 'does not lie within the screen' screenshot no.png --region 200x121+0+0
@@ -56,4 +57,18 @@ if have xsetroot; then
   says '1: changes within 200x120+0+0'
 fi
 
+# The cursor lies where the pointer is: in the middle of a server without a mouse.
+if have xsetroot; then
+  xsetroot -cursor_name left_ptr -solid '#204060'
+  ok screenshot plain.png
+  ok screenshot pointed.png --cursor
+  expect 1 compare plain.png pointed.png
+  grep -q 'within .*+\(9[0-9]\|10[0-9]\)+\(5[0-9]\|6[0-9]\)$' out || fail "the cursor lies at: $(cat out)"
+  ok screenshot large.png --cursor --cursor-scale 3
+  expect 1 compare pointed.png large.png
+  ok screenshot off.png --cursor --region 20x20+0+0
+  ok crop plain.png corner.png 20x20+0+0
+  ok compare off.png corner.png
+  refused 2 'cursor' screenshot no.png --cursor-scale 2
+fi
 finish

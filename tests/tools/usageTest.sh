@@ -4,7 +4,7 @@
 
 ok --help
 ok --version
-for command in screenshot watch info convert combine rop blend scale crop compare yuv pack unpack; do
+for command in screenshot watch info convert combine rop blend cursor scale crop compare yuv pack unpack; do
   ok "$command" --help
   grep -q -- "$command" out || fail "$command --help does not name it"
   refused 2 '' "$command" --no-such-option

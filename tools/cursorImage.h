@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: MIT
+//
+// Cursors that own their pixels: of either kind, scaled, drawn into a picture.
+
+#ifndef RASTER_TOOLS_CURSOR_IMAGE_H
+#define RASTER_TOOLS_CURSOR_IMAGE_H
+
+#include <vector>
+
+#include "picture.h"
+#include "raster.h"
+
+namespace tool {
+
+class CursorImage {
+ public:
+  /// Premultiplied pixels of 32 bits.
+  static CursorImage ofPixels(uint32 width, uint32 height, const Point& hotSpot,
+                              std::vector<uint32> pixels);
+  /// Two planes of one bit a pixel; rows are padded to 32 bits.
+  static CursorImage ofBitPlanes(uint32 width, uint32 height, const Point& hotSpot,
+                                 const std::vector<uint8>& andBits,
+                                 const std::vector<uint8>& xorBits);
+
+  /// Enlarges or reduces it about its hot spot.
+  void scaleBy(double scale);
+
+  /// Draws it, clipped, with its hot spot at a pixel. A picture of 32 bits takes both kinds.
+  void drawOn(Picture& picture, const Point& at) const;
+
+ private:
+  CursorImage(uint32 type, uint32 width, uint32 height, const Point& hotSpot);
+  RasterCursor record() const;
+
+  RasterCursor geometry = {};
+  std::vector<uint32> first;   // the pixels, or the AND plane
+  std::vector<uint32> second;  // the XOR plane
+};
+
+}  // namespace tool
+
+#endif
