@@ -58,8 +58,8 @@ struct Scaling {
 };
 
 /// Scales one plane of `width` x `height` 4-byte pixels, surrounded by bytes of `fill`.
-void scalePlane(uint8* dst, const uint8* plane, uint32 width, uint32 height, const Scaling& to,
-                uint8 fill, int32 smooth) {
+void RasterScaleCursorPlane(uint8* dst, const uint8* plane, uint32 width, uint32 height,
+                            const Scaling& to, uint8 fill, int32 smooth) {
   const uint32 pitch = kBytesPerPixel * to.paddedWidth;
   const size_t bytes = size_t{pitch} * to.paddedHeight;
   auto* padded = static_cast<uint8*>(UtilSafeMalloc0(bytes));
@@ -97,8 +97,8 @@ void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scal
                              uint32 paddedWidth, uint32 paddedHeight, uint32 scaledWidth,
                              uint32 scaledHeight) {
   const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
-  raster::scalePlane(dst, cursor->image.pixels, cursor->width, cursor->height, to,
-                     raster::kTransparent, raster::kSmoothed);
+  raster::RasterScaleCursorPlane(dst, cursor->image.pixels, cursor->width, cursor->height, to,
+                                 raster::kTransparent, raster::kSmoothed);
 }
 
 void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const RasterCursor* cursor,
@@ -106,10 +106,10 @@ void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const RasterCursor* c
                              uint32 scaledWidth, uint32 scaledHeight) {
   const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
   const RasterCursorMask& mask = cursor->image.mask;
-  raster::scalePlane(andDst, mask.andMask, cursor->width, cursor->height, to, raster::kKeepScreen,
-                     raster::kNearest);
-  raster::scalePlane(xorDst, mask.xorMask, cursor->width, cursor->height, to,
-                     raster::kInvertNothing, raster::kNearest);
+  raster::RasterScaleCursorPlane(andDst, mask.andMask, cursor->width, cursor->height, to,
+                                 raster::kKeepScreen, raster::kNearest);
+  raster::RasterScaleCursorPlane(xorDst, mask.xorMask, cursor->width, cursor->height, to,
+                                 raster::kInvertNothing, raster::kNearest);
 }
 
 }  // extern "C"

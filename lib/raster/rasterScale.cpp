@@ -126,7 +126,7 @@ bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth
   job.smooth = dstDepth > 23 && smooth != 0 && job.dstBytesPerPixel <= 4;
   job.depthsDiffer = src.depth != dst.depth;
   job.sizesDiffer = srcBpp != dstBpp;
-  raster::scaleCore(job);
+  raster::RasterScaleCore(job);
   return true;
 }
 

@@ -213,7 +213,7 @@ const ScaleKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(scaleKernels)(
 
 }  // namespace
 
-void scaleCore(const ScaleJob& job) { chosenKernels<lookUpKernels>().draw(job); }
+void RasterScaleCore(const ScaleJob& job) { chosenKernels<lookUpKernels>().draw(job); }
 
 }  // namespace raster
 

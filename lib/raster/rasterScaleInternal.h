@@ -116,7 +116,7 @@ struct ScaleKernels {
 };
 
 /// Draws the job's rectangle.
-void scaleCore(const ScaleJob& job);
+void RasterScaleCore(const ScaleJob& job);
 
 }  // namespace raster
 

@@ -3,6 +3,6 @@
 . "$(dirname "$0")/common.sh"
 libraries=$PNG_FOLDER
 # Portable code without optimisation is enough to see that, and compiles in seconds.
-buildProject "$here/subproject" -DRASTER_SOURCE="$SOURCE" -G Ninja -DCMAKE_BUILD_TYPE=Debug \
+buildProject "$here/subproject" -DRASTER_SOURCE="$SOURCE" -G Ninja \
   -DCMAKE_CXX_FLAGS="-DHWY_COMPILE_ONLY_SCALAR${TOOLCHAIN:+ -m32}"
 run "$work/build/consumerC"

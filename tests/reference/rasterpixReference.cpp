@@ -5,8 +5,8 @@
 namespace reference {
 namespace {
 
-/// The result of operation `rop` on one bit each. Written in binary, the code of an operation is its
-/// column of results for (s, d) = 00, 01, 10, 11.
+/// The result of operation `rop` on one bit each. Written in binary, the code of an operation is
+/// its column of results for (s, d) = 00, 01, 10, 11.
 uint8 combineBit(uint32 rop, uint32 s, uint32 d) { return rop >> (3 - (2 * s + d)) & 1; }
 
 uint8 combineByte(uint32 rop, uint8 s, uint8 d) {
