@@ -55,7 +55,7 @@ void takePlane(uint32 width, uint32 height, uint32 depth, const uint8* plane, ui
   if (depth == 1) {
     expandBitPlane(width, height, bitsPerPixel, plane, dst, size);
   } else if (depth == bitsPerPixel) {
-    memcpy(dst, plane, size);
+    if (size != 0) memcpy(dst, plane, size);  // an empty plane may be null
   } else {
     notImplemented(kSource);
   }
