@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cstddef>
-#include <cstring>
 
 #include "alphaBlendInternal.h"
 #include "panicPlace.h"
@@ -55,7 +54,7 @@ void takePlane(uint32 width, uint32 height, uint32 depth, const uint8* plane, ui
   if (depth == 1) {
     expandBitPlane(width, height, bitsPerPixel, plane, dst, size);
   } else if (depth == bitsPerPixel) {
-    if (size != 0) memcpy(dst, plane, size);  // an empty plane may be null
+    if (size != 0) rectCopy(dst, 0, plane, 0, 1, 0, 0, 0, 0, size, 1);  // else it may be null
   } else {
     notImplemented(kSource);
   }
