@@ -64,7 +64,6 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include <algorithm>
 #include <numeric>
 
 #include "kernelChoice.h"

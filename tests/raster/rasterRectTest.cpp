@@ -92,7 +92,9 @@ class Bitmap {
     std::vector<size_t> above;
     for (int32 y = 0; y < kSize; ++y) {
       std::vector<size_t> here;
-      for (const auto& [start, end] : runs(y)) {
+      for (const auto& run : runs(y)) {
+        const int32 start = run.first;
+        const int32 end = run.second;
         const auto same = std::find_if(above.begin(), above.end(), [&](size_t i) {
           return all[i][0] == start && all[i][2] == end - start;
         });
