@@ -9,6 +9,11 @@
 #include <cstdlib>
 #include <string>
 
+#ifdef __SANITIZE_ADDRESS__
+// Requests that no memory can meet are part of the tests.
+extern "C" const char* __asan_default_options() { return "allocator_may_return_null=1"; }
+#endif
+
 namespace {
 
 constexpr int kSkipped = 77;

@@ -13,11 +13,6 @@
 
 #include "support/recordedMessages.h"
 
-#ifdef __SANITIZE_ADDRESS__
-// The sanitizer's allocator otherwise ends the program where malloc returns null.
-extern "C" const char* __asan_default_options() { return "allocator_may_return_null=1"; }
-#endif
-
 namespace {
 
 /// More than any process has: half of the address space.
