@@ -175,7 +175,6 @@ void addOpencv(Contenders& c, const Work& w) {
                      w.srcPitch());
   const cv::Mat to(static_cast<int>(w.to.height), static_cast<int>(w.to.width), type, w.dst,
                    w.dstPitch());
-  cv::setNumThreads(1);
   c.add("OpenCV", [from, to, filter]() mutable { cv::resize(from, to, to.size(), 0, 0, filter); });
 }
 #endif

@@ -148,9 +148,6 @@ void yuvJob(const std::string& name, Layout layout, int depth) {
 }  // namespace
 
 int main(int argc, char** argv) {
-#ifdef HAVE_OPENCV
-  cv::setNumThreads(1);
-#endif
   for (const int depth : {32, 24, 16, 15}) {
     yuvJob("YUY2", Layout::kYuy2, depth);
     yuvJob("UYVY", Layout::kUyvy, depth);

@@ -10,6 +10,10 @@
 #include <map>
 #include <vector>
 
+#ifdef HAVE_OPENCV
+#include <opencv2/core.hpp>
+#endif
+
 namespace bench {
 namespace {
 
@@ -133,6 +137,9 @@ int run(int argc, char** argv) {
   int count = static_cast<int>(arguments.size());
   benchmark::Initialize(&count, arguments.data());
   if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) return 2;
+#ifdef HAVE_OPENCV
+  cv::setNumThreads(1);  // as all the others
+#endif
   BestTimes best;
   benchmark::RunSpecifiedBenchmarks(&best);
   printTable();
