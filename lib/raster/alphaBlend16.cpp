@@ -12,15 +12,8 @@
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-namespace {
-
-using Bgr555 = Packed<uint16, Field<0, 5>, Field<5, 5>, Field<10, 5>>;
-using Bgr565 = Packed<uint16, Field<0, 5>, Field<5, 6>, Field<11, 5>>;
-
-}  // namespace
-
-const FormatKernels* kernels15() { return &kKernelsOf<Bgr555>; }
-const FormatKernels* kernels16() { return &kKernelsOf<Bgr565>; }
+const FormatKernels* kernels15() { return &kKernelsOf<Packed<Code15>>; }
+const FormatKernels* kernels16() { return &kKernelsOf<Packed<Code16>>; }
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();

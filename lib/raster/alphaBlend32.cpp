@@ -12,8 +12,6 @@
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-namespace {}  // namespace
-
 const FormatKernels* kernels24() { return &kKernelsOf<Bytes3>; }
 const FormatKernels* kernels32() { return &kKernelsOf<Bytes4>; }
 

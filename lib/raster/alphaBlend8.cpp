@@ -12,15 +12,8 @@
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-namespace {
-
-using Bgr222 = Packed<uint8, Field<0, 2>, Field<2, 2>, Field<4, 2>>;
-using Bgr233 = Packed<uint8, Field<6, 2>, Field<3, 3>, Field<0, 3>>;
-
-}  // namespace
-
-const FormatKernels* kernels6() { return &kKernelsOf<Bgr222>; }
-const FormatKernels* kernels8() { return &kKernelsOf<Bgr233>; }
+const FormatKernels* kernels6() { return &kKernelsOf<Packed<Code6>>; }
+const FormatKernels* kernels8() { return &kKernelsOf<Packed<Code8>>; }
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();

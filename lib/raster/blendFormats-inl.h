@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 //
-// The six destination formats: how their pixels become four bytes in a 32-bit lane (channels 0, 1
-// and 2; the fourth has no meaning) and how they go back. Included once per instruction set.
+// The six destination formats: how blocks of their pixels become vectors of channels and go back.
+// Included once per instruction set.
 
-#include "blendFields.h"
+#include "pixelFormat.h"
 
 #if defined(RASTER_BLEND_FORMATS_INL_H) == defined(HWY_TARGET_TOGGLE)
 #ifdef RASTER_BLEND_FORMATS_INL_H
@@ -12,7 +12,8 @@
 #define RASTER_BLEND_FORMATS_INL_H
 #endif
 
-#include "blendOps-inl.h"
+#include "blendBytes-inl.h"
+#include "blendPlanes-inl.h"
 #include "frameBuffer.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -27,95 +28,174 @@ template <int kBits, class V> HWY_INLINE V shiftLeft(V v) {
   }
 }
 
-/// Products of the 16-bit halves of a lane with two constants; they fit.
-template <uint32 kLower, uint32 kUpper, class D>
-HWY_INLINE hn::Vec<D> mulByConstants(D d, hn::Vec<D> v) {
+/// Multiplies a field, where it lies, by a pattern that puts copies of it into the upper byte.
+template <class Field> HWY_INLINE WordLanes copyField(WordLanes words, uint16 pattern) {
+  // A constant that GCC knows would become a chain of shifts and sums.
+  const auto copies = inRegister(hn::Set(Words(), pattern));
+  return (words & hn::Set(Words(), Field::kMask)) * copies;
+}
+
+/// Three bits as eight. Deliberate: the last two repeat the field's low two bits, not its high
+/// ones.
+constexpr uint8 widenThree(uint32 field) {
+  return static_cast<uint8>(field << 5 | field << 2 | (field & 3));
+}
+static_assert(widenThree(4) == 0x90 && widenThree(7) == 0xFF);
+
+/// All of them, and behind them the 1 that a product needs as the lower byte.
+alignas(16) inline constexpr uint8 kWidenedThrees[16] = {
+    widenThree(0), widenThree(1), widenThree(2),
+    widenThree(3), widenThree(4), widenThree(5),
+    widenThree(6), widenThree(7), 1};
+inline constexpr uint16 kOneAt = 8;
+
+template <class Field> HWY_INLINE WordLanes widenThrees(WordLanes words) {
+  const Words d;
+  const auto fields = shiftLeft<8 + Field::kBits - Field::kTop>(words);
+  const auto index = hn::OrAnd(hn::Set(d, kOneAt), fields, hn::Set(d, 0x0700));
 #if HWY_TARGET == HWY_SCALAR
-  if constexpr (kLower == kUpper || kUpper == 0) return v * hn::Set(d, kLower);
-  return (v & hn::Set(d, 0xFFFFu)) * hn::Set(d, kLower) |
-         hn::AndNot(hn::Set(d, 0xFFFFu), v) * hn::Set(d, kUpper);
+  return hn::Set(d, static_cast<uint16>(kWidenedThrees[hn::GetLane(index) >> 8] << 8 | 1));
 #else
-  const hn::Repartition<uint16, D> d16;
-  const auto factors = hn::BitCast(d16, hn::Set(d, kLower | kUpper << 16));
-  return hn::BitCast(d, hn::BitCast(d16, v) * factors);
+  const hn::Repartition<uint8, Words> d8;
+  const auto table = hn::LoadDup128(d8, kWidenedThrees);
+  return hn::BitCast(d, hn::TableLookupBytes(table, hn::BitCast(d8, index)));
 #endif
 }
 
-/// Pixels of one or two bytes, with a field for each channel. Bits outside them become 0.
-template <class Word, class C0, class C1, class C2> struct Packed {
-  static constexpr size_t kBytes = sizeof(Word);
+/// Widens a field of two or three bits to the upper byte; the lower one becomes 1.
+template <class Field> HWY_INLINE WordLanes widenShort(WordLanes words) {
+  if constexpr (Field::kBits == 3) {
+    return widenThrees<Field>(words);
+  } else {
+    return copyField<Field>(words, 0x5500 >> (Field::kTop - Field::kBits)) | hn::Set(Words(), 1);
+  }
+}
+template <class Field> inline constexpr bool kIsShort = Field::kBits <= 3;
+
+/// Widens a field of five or six bits to the upper byte: itself, and its top bits once more. The
+/// lower byte has no meaning.
+template <class Field> HWY_INLINE WordLanes widenLong(WordLanes words) {
+  constexpr int kUp = 16 - Field::kTop;
+  if constexpr (kUp >= Field::kBits) {
+    return copyField<Field>(words, (1 << kUp) + (1 << (kUp - Field::kBits)));
+  } else {
+    const auto top = hn::ShiftLeft<kUp>(words);
+    const auto mask = hn::Set(Words(), 0xFFFF0000u >> Field::kBits & 0xFFFF);
+    return hn::OrAnd(hn::ShiftRight<Field::kBits>(top), top, mask);
+  }
+}
+
+/// Narrows the upper byte of each lane to the field's place. Bits outside it have no meaning.
+template <class Field> HWY_INLINE WordLanes narrow(WordLanes channel) {
+  return shiftLeft<Field::kTop - 16>(channel);
+}
+
+/// Narrows the upper byte of each lane to a field of a pixel that has no other fields yet.
+template <class Field> HWY_INLINE WordLanes firstField(WordLanes channel) {
+  if constexpr (Field::kTop == Field::kBits) return narrow<Field>(channel);
+  return narrow<Field>(channel) & hn::Set(Words(), Field::kMask);
+}
+template <class Field> HWY_INLINE WordLanes addField(WordLanes others, WordLanes channel) {
+  return hn::OrAnd(others, narrow<Field>(channel), hn::Set(Words(), Field::kMask));
+}
+
+/// Pixels of one or two bytes, with a field for each channel: the first one is blue. Bits outside
+/// them become 0.
+template <class Format> struct Packed {
+  using Lanes = Words;
+  static constexpr size_t kBytes = Format::kBytes;
   static constexpr bool kKeepsBytes = false;
 
-  template <class D> static HWY_INLINE Halves<D> load(D d, const uint8* at) {
-    const auto word = hn::PromoteTo(d, loadLanes(hn::Rebind<Word, D>(), at));
-    const auto even = (shiftLeft<-C0::kShift>(word) | shiftLeft<16 - C2::kShift>(word)) &
-                      hn::Set(d, C0::kMask | C2::kMask << 16);
-    const auto odd = shiftLeft<-C1::kShift>(word) & hn::Set(d, C1::kMask);
-    return {widen<C0, C2>(d, even), widen<C1, NoField>(d, odd)};
+  static HWY_INLINE PlaneFactor factorOf(uint8 value) { return planeFactor(value); }
+  static HWY_INLINE Planes black() {
+    const auto zero = hn::Zero(Words());
+    return {zero, zero, zero, zero};
   }
 
-  template <class D, class Before>
-  static HWY_INLINE void store(D d, Halves<D> p, Before /*before*/, uint8* at) {
-    storeFields<8, 8, 24>(d, p.even, p.odd, p.even, at);
+  template <class Part> static HWY_INLINE Planes loadSource(const uint8* at, Part part) {
+    return loadPlanes(at, part);
   }
-  template <class D, class Before>
-  static HWY_INLINE void store(D d, Bytes<D> p, Before /*before*/, uint8* at) {
-    storeFields<0, 8, 16>(d, p.v, p.v, p.v, at);
+  template <class Part> static HWY_INLINE auto load(const uint8* at, Part part) {
+    const auto words = loadWords(at, part);
+    if constexpr (kIsShort<C0> && kIsShort<C1> && kIsShort<C2>) {
+      return ExactPlanes{
+          {widenShort<C0>(words), widenShort<C1>(words), widenShort<C2>(words), words}};
+    } else {
+      return Planes{widenLong<C0>(words), widenLong<C1>(words), widenLong<C2>(words), words};
+    }
+  }
+  template <class Part>
+  static HWY_INLINE void store(const Planes& p, const Planes& /*before*/, uint8* at, Part part) {
+    const auto fields = addField<C1>(firstField<C0>(p.c0), p.c1);
+    storeWords(addField<C2>(fields, p.c2), at, part);
   }
 
  private:
-  /// Widens a field in each half of a lane.
-  template <class Lower, class Upper, class D>
-  static HWY_INLINE hn::Vec<D> widen(D d, hn::Vec<D> fields) {
-    const auto widened = mulByConstants<Lower::kCopies, Upper::kCopies>(d, fields);
-    constexpr uint32 kLowCopies = Lower::kLowCopy | Upper::kLowCopy << 16;
-    if constexpr (kLowCopies == 0) return widened;
-    return hn::OrAnd(widened, hn::ShiftLeft<8>(fields), hn::Set(d, kLowCopies));
-  }
+  using C0 = typename Format::Blue;
+  using C1 = typename Format::Green;
+  using C2 = typename Format::Red;
+  static constexpr hn::Rebind<std::conditional_t<kBytes == 1, uint8, uint16>, Words> kPixels{};
 
-  /// Stores pixels from the bytes whose first bits are kBit0, kBit1 and kBit2 of three vectors.
-  template <int kBit0, int kBit1, int kBit2, class D>
-  static HWY_INLINE void storeFields(D d, hn::Vec<D> v0, hn::Vec<D> v1, hn::Vec<D> v2, uint8* at) {
-    auto word = shiftLeft<C0::kShift - C0::kUp - kBit0>(v0) & hn::Set(d, C0::kMask << C0::kShift);
-    word = hn::OrAnd(word, shiftLeft<C1::kShift - C1::kUp - kBit1>(v1),
-                     hn::Set(d, C1::kMask << C1::kShift));
-    word = hn::OrAnd(word, shiftLeft<C2::kShift - C2::kUp - kBit2>(v2),
-                     hn::Set(d, C2::kMask << C2::kShift));
-    const hn::Rebind<Word, D> narrow;
-    storeLanes(narrow, hn::TruncateTo(narrow, word), at);
+  template <class Part> static HWY_INLINE WordLanes loadWords(const uint8* at, Part part) {
+    const auto pixels = loadPart<kBytes>(kPixels, at, 0, part);
+    if constexpr (kBytes == 2) {
+      return pixels;
+    } else {
+      return hn::PromoteTo(Words(), pixels);
+    }
+  }
+  template <class Part> static HWY_INLINE void storeWords(WordLanes words, uint8* at, Part part) {
+    if constexpr (kBytes == 2) {
+      storePart<kBytes>(kPixels, words, at, part);
+    } else {
+      storePart<kBytes>(kPixels, hn::TruncateTo(kPixels, words), at, part);
+    }
+  }
+};
+
+/// What pixels of three and four bytes have in common.
+struct WholeBytes {
+  using Lanes = hn::ScalableTag<uint32>;
+  static HWY_INLINE Factor<Lanes> factorOf(uint8 value) { return factor(Lanes(), value); }
+  static HWY_INLINE Bytes<Lanes> black() { return {hn::Zero(Lanes())}; }
+  template <class Part> static HWY_INLINE Bytes<Lanes> loadSource(const uint8* at, Part part) {
+    return {loadPart<4>(Lanes(), at, 0, part)};
   }
 };
 
 /// Pixels of four bytes. The fourth one keeps its value: it is read and written back with the
 /// others of its vector.
-struct Bytes4 {
+struct Bytes4 : WholeBytes {
   static constexpr size_t kBytes = 4;
   static constexpr bool kKeepsBytes = true;
 
-  template <class D> static HWY_INLINE Bytes<D> load(D d, const uint8* at) {
-    return {loadOnce(d, at)};
+  template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
+    return loadSource(at, part);
   }
-  template <class D, class P> static HWY_INLINE void store(D d, P p, Bytes<D> before, uint8* at) {
+  template <class P, class Part>
+  static HWY_INLINE void store(P p, Bytes<Lanes> before, uint8* at, Part part) {
+    const Lanes d;
     const auto colors = hn::Set(d, 0x00FFFFFFu);
 #if HWY_TARGET == HWY_SCALAR
-    storeLanes(d, hn::OrAnd(hn::AndNot(colors, before.v), colors, bytesOf(p).v), at);
+    const auto pixels = hn::OrAnd(hn::AndNot(colors, before.v), colors, bytesOf(p).v);
 #else
-    storeLanes(d, hn::IfVecThenElse(colors, bytesOf(p).v, before.v), at);
+    const auto pixels = hn::IfVecThenElse(colors, bytesOf(p).v, before.v);
 #endif
+    storePart<kBytes>(d, pixels, at, part);
   }
 };
 
 #if HWY_TARGET == HWY_SCALAR
 
-struct Bytes3 {
+struct Bytes3 : WholeBytes {
   static constexpr size_t kBytes = 3;
   static constexpr bool kKeepsBytes = false;
 
-  template <class D> static HWY_INLINE Bytes<D> load(D d, const uint8* at) {
-    return {hn::Set(d, loadPixel<3>(at))};
+  static HWY_INLINE Bytes<Lanes> load(const uint8* at, WholeBlock /*part*/) {
+    return {hn::Set(Lanes(), loadPixel<3>(at))};
   }
-  template <class D, class P, class Before>
-  static HWY_INLINE void store(D /*d*/, P p, Before /*before*/, uint8* at) {
+  template <class P, class Before>
+  static HWY_INLINE void store(P p, Before /*before*/, uint8* at, WholeBlock /*part*/) {
     storePixel<3>(at, hn::GetLane(bytesOf(p).v));
   }
 };
@@ -123,63 +203,78 @@ struct Bytes3 {
 #else
 
 /// Pixels of three bytes. Four of them are the twelve lower bytes of a block of sixteen.
-struct Bytes3 {
+struct Bytes3 : WholeBytes {
   static constexpr size_t kBytes = 3;
   static constexpr bool kKeepsBytes = false;
 
-  template <class D> static HWY_INLINE Bytes<D> load(D d, const uint8* at) {
-    const hn::Repartition<uint8, D> d8;
+  template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
+    const hn::Repartition<uint8, Lanes> d8;
     alignas(16) static constexpr uint8 kSpread[16] = {0, 1, 2, 0x80, 3, 4,  5,  0x80,
                                                       6, 7, 8, 0x80, 9, 10, 11, 0x80};
-    const auto blocks = hn::BitCast(d8, loadBlocks(d, at));
-    return {hn::BitCast(d, hn::TableLookupBytesOr0(blocks, hn::LoadDup128(d8, kSpread)))};
+    const auto blocks = hn::BitCast(d8, spreadBlocks(loadQuarters(at, part)));
+    const auto spread = hn::TableLookupBytesOr0(blocks, hn::LoadDup128(d8, kSpread));
+    return {hn::BitCast(Lanes(), spread)};
   }
 
-  template <class D, class P, class Before>
-  static HWY_INLINE void store(D d, P p, Before /*before*/, uint8* at) {
-    const hn::Repartition<uint8, D> d8;
+  template <class P, class Before, class Part>
+  static HWY_INLINE void store(P p, Before /*before*/, uint8* at, Part part) {
+    const hn::Repartition<uint8, Lanes> d8;
     alignas(16) static constexpr uint8 kGather[16] = {0,  1,  2,  4,  5,    6,    8,    9,
                                                       10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
     const auto bytes = hn::BitCast(d8, bytesOf(p).v);
-    storeBlocks(d, hn::BitCast(d, hn::TableLookupBytesOr0(bytes, hn::LoadDup128(d8, kGather))), at);
+    const auto blocks = hn::TableLookupBytesOr0(bytes, hn::LoadDup128(d8, kGather));
+    storeQuarters(gatherBlocks(hn::BitCast(Lanes(), blocks)), at, part);
   }
 
  private:
-  // Three quarters of a vector are read and written as its lower half and half of the upper one.
-  template <class D> static HWY_INLINE hn::Vec<D> loadQuarters(D d, const uint8* at) {
-    const hn::Half<D> half;
-    const hn::Half<decltype(half)> quarter;
-    const auto upper = loadLanes(quarter, at + sizeof(uint32) * kLanes<decltype(half)>);
-    return hn::Combine(d, hn::ZeroExtendVector(half, upper), loadLanes(half, at));
-  }
-  template <class D> static HWY_INLINE void storeQuarters(D /*d*/, hn::Vec<D> v, uint8* at) {
-    const hn::Half<D> half;
-    const hn::Half<decltype(half)> quarter;
-    storeLanes(half, hn::LowerHalf(half, v), at);
-    storeLanes(quarter, hn::LowerHalf(quarter, hn::UpperHalf(half, v)),
-               at + sizeof(uint32) * kLanes<decltype(half)>);
-  }
+  using Vector = hn::Vec<Lanes>;
 
-  template <class D> static HWY_INLINE hn::Vec<D> loadBlocks(D d, const uint8* at) {
-    const auto bytes = loadQuarters(d, at);
-    if constexpr (kLanes<D> == 4) {
-      return bytes;
+  // Three quarters of a vector hold the pixels. They are read and written as its lower half and
+  // half of the upper one.
+  static constexpr hn::Half<Lanes> kHalf{};
+  static constexpr hn::Half<hn::Half<Lanes>> kQuarter{};
+  static constexpr size_t kHalfBytes = sizeof(uint32) * kLanes<hn::Half<Lanes>>;
+
+  static HWY_INLINE Vector loadQuarters(const uint8* at, WholeBlock /*part*/) {
+#if HWY_TARGET == HWY_AVX3
+    return loadQuarters(at, FirstPixels{16});
+#endif
+    const auto upper = loadLanes(kQuarter, at + kHalfBytes);
+    return hn::Combine(Lanes(), hn::ZeroExtendVector(kHalf, upper), loadLanes(kHalf, at));
+  }
+  static HWY_INLINE void storeQuarters(Vector v, uint8* at, WholeBlock /*part*/) {
+    storeLanes(kHalf, hn::LowerHalf(kHalf, v), at);
+    const auto upper = hn::LowerHalf(kQuarter, hn::UpperHalf(kHalf, v));
+    storeLanes(kQuarter, upper, at + kHalfBytes);
+  }
+#if HWY_TARGET == HWY_AVX3
+  static HWY_INLINE Vector loadQuarters(const uint8* at, FirstPixels part) {
+    return loadPart<kBytes>(Lanes(), at, 0, part);
+  }
+  static HWY_INLINE void storeQuarters(Vector v, uint8* at, FirstPixels part) {
+    storePart<kBytes>(Lanes(), v, at, part);
+  }
+#endif
+
+  static HWY_INLINE Vector spreadBlocks(Vector quarters) {
+    if constexpr (kLanes<Lanes> == 4) {
+      return quarters;
     } else {
       alignas(64) static constexpr uint32 kLane[16] = {0, 1, 2, 2, 3, 4,  5,  5,
                                                        6, 7, 8, 8, 9, 10, 11, 11};
-      return hn::TableLookupLanes(bytes, hn::SetTableIndices(d, kLane));
+      return hn::TableLookupLanes(quarters, hn::SetTableIndices(Lanes(), kLane));
     }
   }
-  template <class D> static HWY_INLINE void storeBlocks(D d, hn::Vec<D> blocks, uint8* at) {
-    if constexpr (kLanes<D> == 4) {
-      storeQuarters(d, blocks, at);
+  static HWY_INLINE Vector gatherBlocks(Vector blocks) {
+    if constexpr (kLanes<Lanes> == 4) {
+      return blocks;
     } else {
       alignas(64) static constexpr uint32 kLane[16] = {0, 1, 2, 4, 5, 6, 0, 0,
                                                        0, 0, 0, 0, 0, 0, 0, 0};
       alignas(64) static constexpr uint32 kLongLane[16] = {0,  1,  2,  4,  5, 6, 8, 9,
                                                            10, 12, 13, 14, 0, 0, 0, 0};
-      constexpr const uint32* kFrom = kLanes<D> == 8 ? kLane : kLongLane;
-      storeQuarters(d, hn::TableLookupLanes(blocks, hn::SetTableIndices(d, kFrom)), at);
+      constexpr const uint32* kFrom = kLanes<Lanes> == 8 ? kLane : kLongLane;
+      return hn::TableLookupLanes(blocks, hn::SetTableIndices(Lanes(), kFrom));
     }
   }
 };

@@ -19,9 +19,6 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
-using Lanes = hn::ScalableTag<uint32>;
-using Alpha = Factor<Lanes>;
-
 /// What an operator's formula is given. An input that it does not need is Nothing.
 template <class Source, class SourceAlpha, class Destination, class DstAlpha, class Share>
 struct Channels {
@@ -33,109 +30,115 @@ struct Channels {
   Nothing nothing;
 };
 
-template <uint32 kFlags, uint32 kReads>
-HWY_INLINE auto loadSource(const BlendRect& rect, const uint8* src) {
-  const Lanes lanes;
+template <class Format, uint32 kFlags, uint32 kReads, class Part>
+HWY_INLINE auto loadSource(const BlendRect& rect, const uint8* src, Part part) {
   if constexpr ((kReads & kUsesSource) == 0) {
     return Nothing();
   } else if constexpr ((kFlags & kFlagSrcAlpha) == 0) {
-    return Bytes<Lanes>{loadOnce(lanes, src)};
+    return Format::loadSource(src, part);
   } else {
-    return mul(Bytes<Lanes>{loadOnce(lanes, src)}, factor(lanes, rect.srcAlpha));
+    return mul(Format::loadSource(src, part), Format::factorOf(rect.srcAlpha));
   }
 }
 
-template <class Format, uint32 kReads> HWY_INLINE auto loadDestination(const uint8* dst) {
+template <class Format, uint32 kReads, class Part>
+HWY_INLINE auto loadDestination(const uint8* dst, Part part) {
   if constexpr ((kReads & kUsesDestination) == 0 && !Format::kKeepsBytes) {
-    return Nothing();
+    return Format::black();
   } else {
-    return Format::load(Lanes(), dst);
+    return Format::load(dst, part);
   }
 }
 
-template <uint32 kFlags, uint32 kReads, class P>
+template <class Format, uint32 kFlags, uint32 kReads, class P>
 HWY_INLINE auto scaleDestination(const BlendRect& rect, P before) {
   if constexpr ((kReads & kUsesDestination) == 0) {
     return Nothing();
   } else if constexpr ((kFlags & kFlagDstAlpha) == 0) {
     return before;
   } else {
-    return mul(before, factor(Lanes(), rect.dstAlpha));
+    return mul(before, Format::factorOf(rect.dstAlpha));
   }
 }
 
-template <uint32 kFlags, class Opaque> HWY_INLINE auto constantFactor(uint8 value, Opaque opaque) {
+template <class Format, uint32 kFlags, class Opaque>
+HWY_INLINE auto constantFactor(uint8 value, Opaque opaque) {
   if constexpr ((kFlags & kFlagDstAlpha) == 0) {
     return opaque;
   } else {
-    return factor(Lanes(), value);
+    return Format::factorOf(value);
   }
 }
 
-HWY_INLINE Bytes<Lanes> pixelsOf(Nothing /*zero*/) { return {hn::Zero(Lanes())}; }
-template <class P> HWY_INLINE P pixelsOf(P p) { return p; }
+template <class Format> HWY_INLINE auto pixelsOf(Nothing /*zero*/) { return Format::black(); }
+template <class Format, class P> HWY_INLINE P pixelsOf(P p) { return p; }
 
-/// Blends kLanes<Lanes> pixels, reading only what the operator needs.
-template <class Format, auto kOperator, uint32 kFlags>
-HWY_INLINE void blendBlock(const BlendRect& rect, uint8* dst, const uint8* src) {
+/// Blends a block of pixels, or the first of one, reading only what the operator needs.
+template <class Format, auto kOperator, uint32 kFlags, class Part>
+HWY_INLINE void blendBlock(const BlendRect& rect, uint8* dst, const uint8* src, Part part) {
   constexpr uint32 kReads = kInputs<kOperator, kFlags>;
-  const auto s = loadSource<kFlags, kReads>(rect, src);
-  const auto before = loadDestination<Format, kReads>(dst);
-  const auto d = scaleDestination<kFlags, kReads>(rect, before);
-  const auto da = constantFactor<kFlags>(rect.dstAlpha, One());
-  const auto f = constantFactor<kFlags>(rect.saturateShare, Zero());
+  const auto s = loadSource<Format, kFlags, kReads>(rect, src, part);
+  const auto before = loadDestination<Format, kReads>(dst, part);
+  const auto d = scaleDestination<Format, kFlags, kReads>(rect, before);
+  const auto da = constantFactor<Format, kFlags>(rect.dstAlpha, One());
+  const auto f = constantFactor<Format, kFlags>(rect.saturateShare, Zero());
   const auto sa = alphaOf(s);
   const Channels<decltype(s), decltype(sa), decltype(d), decltype(da), decltype(f)> c{s,  sa, d,
                                                                                       da, f,  {}};
-  Format::store(Lanes(), pixelsOf(kOperator(c)), before, dst);
+  Format::store(pixelsOf<Format>(kOperator(c)), before, dst, part);
 }
 
-#if HWY_TARGET != HWY_SCALAR
-/// Copies less than a vector of bytes.
+#if HWY_TARGET == HWY_AVX3
+
+template <class Format, auto kOperator, uint32 kFlags>
+HWY_INLINE void blendEnd(const BlendRect& rect, uint8* dst, const uint8* src, size_t pixels) {
+  if (pixels != 0) blendBlock<Format, kOperator, kFlags>(rect, dst, src, FirstPixels{pixels});
+}
+
+#elif HWY_TARGET != HWY_SCALAR
+
+/// Copies less than two vectors of bytes.
 HWY_NOINLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
   forLanes(hn::ScalableTag<uint8>(), bytes,
            [&](auto d, size_t i) HWY_ATTR { hn::StoreU(hn::LoadU(d, src + i), d, dst + i); });
 }
 
-/// Copies less than a vector of bytes to the front of a whole one.
-HWY_INLINE void copyToBlock(uint8* block, const uint8* src, size_t bytes) {
-#if HWY_TARGET == HWY_AVX3
-  const hn::ScalableTag<uint8> d;
-  hn::StoreU(hn::MaskedLoad(hn::FirstN(d, bytes), d, src), d, block);
-#else
-  copyBytes(block, src, bytes);
-#endif
-}
-
 /// Blends the end of a row, shorter than a block, by way of a whole block of its own.
 template <class Format, auto kOperator, uint32 kFlags>
 HWY_INLINE void blendEnd(const BlendRect& rect, uint8* dst, const uint8* src, size_t pixels) {
+  if (pixels == 0) return;
   constexpr uint32 kReads = kInputs<kOperator, kFlags>;
-  uint8 source[4 * kLanes<Lanes>] = {};
-  uint8 destination[4 * kLanes<Lanes>] = {};
-  if constexpr ((kReads & kUsesSource) != 0) copyToBlock(source, src, pixels * 4);
+  constexpr size_t kBlock = kLanes<typename Format::Lanes>;
+  uint8 source[4 * kBlock] = {};
+  uint8 destination[Format::kBytes * kBlock] = {};
+  if constexpr ((kReads & kUsesSource) != 0) copyBytes(source, src, pixels * 4);
   if constexpr ((kReads & kUsesDestination) != 0 || Format::kKeepsBytes)
-    copyToBlock(destination, dst, pixels * Format::kBytes);
-  blendBlock<Format, kOperator, kFlags>(rect, destination, source);
+    copyBytes(destination, dst, pixels * Format::kBytes);
+  blendBlock<Format, kOperator, kFlags>(rect, destination, source, WholeBlock());
   copyBytes(dst, destination, pixels * Format::kBytes);
 }
+
+#else
+
+template <class Format, auto kOperator, uint32 kFlags>
+HWY_INLINE void blendEnd(const BlendRect& /*rect*/, uint8* /*dst*/, const uint8* /*src*/,
+                         size_t /*pixels*/) {}
+
 #endif
 
 template <class Format, auto kOperator, uint32 kFlags> void blendRect(const BlendRect& call) {
   const BlendRect rect = call;  // a local that no store to pixels can change
   uint8* dstRow = rect.dst;
   const uint8* srcRow = rect.src;
-  constexpr size_t kBlock = kLanes<Lanes>;
+  constexpr size_t kBlock = kLanes<typename Format::Lanes>;
   for (uint32 y = 0; y < rect.height; ++y) {
     size_t x = 0;
-    for (; rect.width - x >= kBlock; x += kBlock)
-      blendBlock<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4);
-#if HWY_TARGET != HWY_SCALAR
-    if (x != rect.width) {
-      blendEnd<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4,
-                                          rect.width - x);
+    for (; rect.width - x >= kBlock; x += kBlock) {
+      blendBlock<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4,
+                                            WholeBlock());
     }
-#endif
+    blendEnd<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4,
+                                        rect.width - x);
     dstRow = nextRow(dstRow, rect.dstStep);
     srcRow = nextRow(srcRow, rect.srcStep);
   }
