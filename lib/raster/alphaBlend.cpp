@@ -57,6 +57,8 @@ BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
   rect.dstStep = pitchOf(call.dstPitch);
   rect.dst = rowAt(call.dst, rect.dstStep, call.dstY, call.dstX, bytes);
   rect.srcStep = pitchOf(call.srcPitch);
+  rect.before = rect.dst;
+  rect.beforeStep = rect.dstStep;
   rect.src = rowAt(call.src, rect.srcStep, call.srcY, call.srcX, 4);
   rect.width = call.width;
   rect.height = call.height;
@@ -67,7 +69,7 @@ BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
 }
 
 /// The kernel for the constants of a call: those of 255 change nothing.
-BlendKernel kernelFor(const FormatKernels& kernels, uint32 op, const BlendRect& rect) {
+const BlendKernel& kernelFor(const FormatKernels& kernels, uint32 op, const BlendRect& rect) {
   const uint32 flags =
       (rect.srcAlpha != 255 ? kFlagSrcAlpha : 0) | (rect.dstAlpha != 255 ? kFlagDstAlpha : 0);
   return kernels[op][flags];
@@ -92,47 +94,78 @@ bool mayReadAhead(const BlendRect& r, uint32 bytes) {
   return !overlap(dst, src) || (bytes == 4 && r.height == 1 && dst.first <= src.first);
 }
 
+/// Blends one pixel after the other.
+void blendByPixels(BlendRect row, uint32 bytes, const BlendKernel& kernel) {
+  const size_t width = std::exchange(row.width, 1);
+  for (size_t x = 0; x < width; ++x, row.src += 4) {
+    kernel.blend(row);
+    row.dst += bytes;
+    row.before = row.dst;
+  }
+}
+
 /// Blends rows that overlap their sources, one by one and pixel by pixel where it matters.
-void blendOverlapping(const BlendRect& all, uint32 bytes, BlendKernel kernel) {
+void blendOverlapping(const BlendRect& all, uint32 bytes, const BlendKernel& kernel) {
   BlendRect row = all;
   row.height = 1;
   for (uint32 y = 0; y < all.height; ++y) {
     row.dst = rowAt(all.dst, all.dstStep, y, 0, 0);
+    row.before = row.dst;
     row.src = rowAt(all.src, all.srcStep, y, 0, 0);
-    row.width = all.width;
     if (mayReadAhead(row, bytes)) {
-      kernel(row);
-      continue;
+      kernel.blend(row);
+    } else {
+      blendByPixels(row, bytes, kernel);
     }
-    row.width = 1;
-    for (size_t x = 0; x < all.width; ++x, row.dst += bytes, row.src += 4) kernel(row);
   }
 }
 
-void blendInPlace(BlendRect rect, uint32 bytes, BlendKernel kernel) {
-  if (!mayReadAhead(rect, bytes)) {
-    blendOverlapping(rect, bytes, kernel);
-    return;
-  }
+/// Blends rows that do not overlap their sources, as one long row where that is the same.
+void blendRows(const BlendRect& rows, uint32 bytes, const BlendKernel& kernel) {
+  BlendRect rect = rows;
   const bool gapless = rect.dstStep == static_cast<intptr_t>(rect.width * bytes) &&
                        rect.srcStep == static_cast<intptr_t>(rect.width * 4);
   if (gapless) {
     rect.width *= rect.height;
     rect.height = 1;
   }
-  kernel(rect);
+  kernel.blend(rect);
 }
 
-/// Blends rows through a buffer that holds them.
-void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, BlendKernel kernel) {
-  uint8* const dst = rect.dst;
+void blendInPlace(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {
+  const auto blend = mayReadAhead(rect, bytes) ? blendRows : blendOverlapping;
+  blend(rect, bytes, kernel);
+}
+
+/// Rows of fewer bytes are quicker to blend when they are copied next to each other first.
+constexpr size_t kLongRow = 256;
+
+/// Copies rows by blocks.
+void copyRows(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, size_t bytes,
+              uint32 rows) {
+  if (bytes >= kLongRow) {
+    blendStageKernels().copyRows(to, toStep, from, fromStep, bytes, rows);
+  } else {
+    rectCopy(to, toStep, from, fromStep, 1, 0, 0, 0, 0, static_cast<uint32>(bytes), rows);
+  }
+}
+
+/// Blends rows through a buffer that holds them. A kernel that reads long rows as a block copy does
+/// takes the place of the copy into the buffer.
+void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel& kernel) {
+  uint8* const dst = std::exchange(rect.dst, stage);
   const intptr_t dstStep = rect.dstStep;
-  const auto span = static_cast<uint32>(rect.width * bytes);
-  rectCopy(stage, static_cast<intptr_t>(span), dst, dstStep, 1, 0, 0, 0, 0, span, rect.height);
-  rect.dst = stage;
+  const size_t span = rect.width * bytes;
   rect.dstStep = static_cast<intptr_t>(span);
-  blendInPlace(rect, bytes, kernel);
-  rectCopy(dst, dstStep, stage, rect.dstStep, 1, 0, 0, 0, 0, span, rect.height);
+  if (kernel.readsBlocks && span >= kLongRow) {
+    kernel.blend(rect);
+  } else {
+    copyRows(stage, rect.dstStep, dst, dstStep, span, rect.height);
+    rect.before = stage;
+    rect.beforeStep = rect.dstStep;
+    blendRows(rect, bytes, kernel);
+  }
+  copyRows(dst, dstStep, stage, rect.dstStep, span, rect.height);
 }
 
 /// How many rows the buffer may hold at once: one where a row depends on those before it.
@@ -147,7 +180,7 @@ uint32 rowsAtOnce(const BlendRect& rect, uint32 bytes) {
 
 /// Moves the destination through a buffer, so that frame-buffer memory is touched by block copies
 /// only, of at most kStageBytes each.
-void blendStaged(BlendRect all, uint32 bytes, BlendKernel kernel) {
+void blendStaged(const BlendRect& all, uint32 bytes, const BlendKernel& kernel) {
   alignas(64) uint8 stage[kStageBytes];
   const size_t pixels = kStageBytes / bytes;
   const uint32 rows = rowsAtOnce(all, bytes);
@@ -156,6 +189,7 @@ void blendStaged(BlendRect all, uint32 bytes, BlendKernel kernel) {
     part.height = std::min(rows, all.height - y);
     for (size_t x = 0; x < all.width; x += pixels) {
       part.dst = rowAt(all.dst, all.dstStep, y, 0, 0) + x * bytes;
+      part.before = part.dst;
       part.src = rowAt(all.src, all.srcStep, y, 0, 0) + x * 4;
       part.width = std::min(pixels, all.width - x);
       blendThrough(stage, part, bytes, kernel);
@@ -166,7 +200,7 @@ void blendStaged(BlendRect all, uint32 bytes, BlendKernel kernel) {
 void blend(const Call& call, const Format& format, uint32 op, bool staged) {
   if (call.width == 0 || call.height == 0) return;
   const BlendRect rect = rowsOf(call, op, format.bytes);
-  const BlendKernel kernel = kernelFor(format.kernels(), op, rect);
+  const BlendKernel& kernel = kernelFor(format.kernels(), op, rect);
   (staged ? blendStaged : blendInPlace)(rect, format.bytes, kernel);
 }
 

@@ -20,15 +20,21 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-namespace raster {
+#include "kernelChoice.h"
 
+namespace raster {
 namespace {
+
 HWY_EXPORT(kernels15);
 HWY_EXPORT(kernels16);
+
+const FormatKernels* lookUp15() { return HWY_DYNAMIC_DISPATCH(kernels15)(); }
+const FormatKernels* lookUp16() { return HWY_DYNAMIC_DISPATCH(kernels16)(); }
+
 }  // namespace
 
-const FormatKernels& blendKernels15() { return *HWY_DYNAMIC_DISPATCH(kernels15)(); }
-const FormatKernels& blendKernels16() { return *HWY_DYNAMIC_DISPATCH(kernels16)(); }
+const FormatKernels& blendKernels15() { return chosenKernels<lookUp15>(); }
+const FormatKernels& blendKernels16() { return chosenKernels<lookUp16>(); }
 
 }  // namespace raster
 

@@ -20,15 +20,21 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-namespace raster {
+#include "kernelChoice.h"
 
+namespace raster {
 namespace {
+
 HWY_EXPORT(kernels24);
 HWY_EXPORT(kernels32);
+
+const FormatKernels* lookUp24() { return HWY_DYNAMIC_DISPATCH(kernels24)(); }
+const FormatKernels* lookUp32() { return HWY_DYNAMIC_DISPATCH(kernels32)(); }
+
 }  // namespace
 
-const FormatKernels& blendKernels24() { return *HWY_DYNAMIC_DISPATCH(kernels24)(); }
-const FormatKernels& blendKernels32() { return *HWY_DYNAMIC_DISPATCH(kernels32)(); }
+const FormatKernels& blendKernels24() { return chosenKernels<lookUp24>(); }
+const FormatKernels& blendKernels32() { return chosenKernels<lookUp32>(); }
 
 }  // namespace raster
 

@@ -20,15 +20,21 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-namespace raster {
+#include "kernelChoice.h"
 
+namespace raster {
 namespace {
+
 HWY_EXPORT(kernels6);
 HWY_EXPORT(kernels8);
+
+const FormatKernels* lookUp6() { return HWY_DYNAMIC_DISPATCH(kernels6)(); }
+const FormatKernels* lookUp8() { return HWY_DYNAMIC_DISPATCH(kernels8)(); }
+
 }  // namespace
 
-const FormatKernels& blendKernels6() { return *HWY_DYNAMIC_DISPATCH(kernels6)(); }
-const FormatKernels& blendKernels8() { return *HWY_DYNAMIC_DISPATCH(kernels8)(); }
+const FormatKernels& blendKernels6() { return chosenKernels<lookUp6>(); }
+const FormatKernels& blendKernels8() { return chosenKernels<lookUp8>(); }
 
 }  // namespace raster
 

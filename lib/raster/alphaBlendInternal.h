@@ -25,6 +25,8 @@ inline constexpr uint32 kFlagDstAlpha = 2;
 struct BlendRect {
   uint8* dst;
   intptr_t dstStep;
+  const uint8* before;  ///< the destination's pixels: at dst, or apart from it
+  intptr_t beforeStep;
   const uint8* src;
   intptr_t srcStep;
   size_t width;
@@ -34,8 +36,11 @@ struct BlendRect {
   uint8 saturateShare;  ///< the source's share of Saturate
 };
 
-/// Blends a rectangle whose pixels do not overlap their sources.
-using BlendKernel = void (*)(const BlendRect& rect);
+/// A loop over a rectangle whose pixels do not overlap their sources.
+struct BlendKernel {
+  void (*blend)(const BlendRect& rect);
+  bool readsBlocks;  ///< reads the destination's rows as a block copy does: all bytes, by vectors
+};
 
 /// By the two flags.
 using BlendVariants = std::array<BlendKernel, 4>;
@@ -50,6 +55,14 @@ const FormatKernels& blendKernels15();
 const FormatKernels& blendKernels16();
 const FormatKernels& blendKernels24();
 const FormatKernels& blendKernels32();
+
+/// The block copies of the staged blends.
+struct StageKernels {
+  /// Copies rows that do not overlap.
+  void (*copyRows)(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, size_t bytes,
+                   uint32 rows);
+};
+const StageKernels& blendStageKernels();
 
 /// As Raster_AlphaBlend.
 void alphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src,

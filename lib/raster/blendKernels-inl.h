@@ -41,12 +41,12 @@ HWY_INLINE auto loadSource(const BlendRect& rect, const uint8* src, Part part) {
   }
 }
 
-template <class Format, uint32 kReads, class Part>
-HWY_INLINE auto loadDestination(const uint8* dst, Part part) {
-  if constexpr ((kReads & kUsesDestination) == 0 && !Format::kKeepsBytes) {
-    return Format::black();
+template <class Format, bool kReads, class Part>
+HWY_INLINE auto loadDestination(const uint8* at, Part part) {
+  if constexpr (kReads) {
+    return Format::load(at, part);
   } else {
-    return Format::load(dst, part);
+    return Format::black();
   }
 }
 
@@ -73,26 +73,42 @@ HWY_INLINE auto constantFactor(uint8 value, Opaque opaque) {
 template <class Format> HWY_INLINE auto pixelsOf(Nothing /*zero*/) { return Format::black(); }
 template <class Format, class P> HWY_INLINE P pixelsOf(P p) { return p; }
 
+/// Where a block of pixels goes, where the destination's pixels are, and the source's.
+struct Block {
+  uint8* dst;
+  const uint8* before;
+  const uint8* src;
+
+  template <class Format> Block pixel(size_t x) const {
+    return {dst + x * Format::kBytes, before + x * Format::kBytes, src + x * 4};
+  }
+};
+
+template <class Format, auto kOperator, uint32 kFlags>
+constexpr bool kReadsDestination = Format::kKeepsBytes ||
+                                   (kInputs<kOperator, kFlags> & kUsesDestination) != 0;
+
 /// Blends a block of pixels, or the first of one, reading only what the operator needs.
 template <class Format, auto kOperator, uint32 kFlags, class Part>
-HWY_INLINE void blendBlock(const BlendRect& rect, uint8* dst, const uint8* src, Part part) {
+HWY_INLINE void blendBlock(const BlendRect& rect, Block at, Part part) {
   constexpr uint32 kReads = kInputs<kOperator, kFlags>;
-  const auto s = loadSource<Format, kFlags, kReads>(rect, src, part);
-  const auto before = loadDestination<Format, kReads>(dst, part);
+  const auto s = loadSource<Format, kFlags, kReads>(rect, at.src, part);
+  const auto before =
+      loadDestination<Format, kReadsDestination<Format, kOperator, kFlags>>(at.before, part);
   const auto d = scaleDestination<Format, kFlags, kReads>(rect, before);
   const auto da = constantFactor<Format, kFlags>(rect.dstAlpha, One());
   const auto f = constantFactor<Format, kFlags>(rect.saturateShare, Zero());
   const auto sa = alphaOf(s);
   const Channels<decltype(s), decltype(sa), decltype(d), decltype(da), decltype(f)> c{s,  sa, d,
                                                                                       da, f,  {}};
-  Format::store(pixelsOf<Format>(kOperator(c)), before, dst, part);
+  Format::store(pixelsOf<Format>(kOperator(c)), before, at.dst, part);
 }
 
 #if HWY_TARGET == HWY_AVX3
 
 template <class Format, auto kOperator, uint32 kFlags>
-HWY_INLINE void blendEnd(const BlendRect& rect, uint8* dst, const uint8* src, size_t pixels) {
-  if (pixels != 0) blendBlock<Format, kOperator, kFlags>(rect, dst, src, FirstPixels{pixels});
+HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
+  if (pixels != 0) blendBlock<Format, kOperator, kFlags>(rect, at, FirstPixels{pixels});
 }
 
 #elif HWY_TARGET != HWY_SCALAR
@@ -105,42 +121,37 @@ HWY_NOINLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
 
 /// Blends the end of a row, shorter than a block, by way of a whole block of its own.
 template <class Format, auto kOperator, uint32 kFlags>
-HWY_INLINE void blendEnd(const BlendRect& rect, uint8* dst, const uint8* src, size_t pixels) {
+HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
   if (pixels == 0) return;
-  constexpr uint32 kReads = kInputs<kOperator, kFlags>;
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
   uint8 source[4 * kBlock] = {};
   uint8 destination[Format::kBytes * kBlock] = {};
-  if constexpr ((kReads & kUsesSource) != 0) copyBytes(source, src, pixels * 4);
-  if constexpr ((kReads & kUsesDestination) != 0 || Format::kKeepsBytes)
-    copyBytes(destination, dst, pixels * Format::kBytes);
-  blendBlock<Format, kOperator, kFlags>(rect, destination, source, WholeBlock());
-  copyBytes(dst, destination, pixels * Format::kBytes);
+  if constexpr ((kInputs<kOperator, kFlags> & kUsesSource) != 0)
+    copyBytes(source, at.src, pixels * 4);
+  if constexpr (kReadsDestination<Format, kOperator, kFlags>)
+    copyBytes(destination, at.before, pixels * Format::kBytes);
+  blendBlock<Format, kOperator, kFlags>(rect, {destination, destination, source}, WholeBlock());
+  copyBytes(at.dst, destination, pixels * Format::kBytes);
 }
 
 #else
 
 template <class Format, auto kOperator, uint32 kFlags>
-HWY_INLINE void blendEnd(const BlendRect& /*rect*/, uint8* /*dst*/, const uint8* /*src*/,
-                         size_t /*pixels*/) {}
+HWY_INLINE void blendEnd(const BlendRect& /*rect*/, Block /*at*/, size_t /*pixels*/) {}
 
 #endif
 
 template <class Format, auto kOperator, uint32 kFlags> void blendRect(const BlendRect& call) {
   const BlendRect rect = call;  // a local that no store to pixels can change
-  uint8* dstRow = rect.dst;
-  const uint8* srcRow = rect.src;
+  Block row{rect.dst, rect.before, rect.src};
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
   for (uint32 y = 0; y < rect.height; ++y) {
     size_t x = 0;
-    for (; rect.width - x >= kBlock; x += kBlock) {
-      blendBlock<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4,
-                                            WholeBlock());
-    }
-    blendEnd<Format, kOperator, kFlags>(rect, dstRow + x * Format::kBytes, srcRow + x * 4,
-                                        rect.width - x);
-    dstRow = nextRow(dstRow, rect.dstStep);
-    srcRow = nextRow(srcRow, rect.srcStep);
+    for (; rect.width - x >= kBlock; x += kBlock)
+      blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());
+    blendEnd<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), rect.width - x);
+    row = {nextRow(row.dst, rect.dstStep), nextRow(row.before, rect.beforeStep),
+           nextRow(row.src, rect.srcStep)};
   }
 }
 
@@ -156,12 +167,17 @@ template <auto kOperator> constexpr uint32 effective(uint32 flags) {
   return flags;
 }
 
+template <class Format, auto kOperator, uint32 kFlags> constexpr BlendKernel kernelOf() {
+  return {blendRect<Format, kOperator, kFlags>,
+          HWY_TARGET != HWY_SCALAR && kReadsDestination<Format, kOperator, kFlags>};
+}
+
 /// The kernels of an operator onto a format, by flags.
 template <class Format, auto kOperator> constexpr BlendVariants variantsOf() {
-  return {blendRect<Format, kOperator, effective<kOperator>(0)>,
-          blendRect<Format, kOperator, effective<kOperator>(1)>,
-          blendRect<Format, kOperator, effective<kOperator>(2)>,
-          blendRect<Format, kOperator, effective<kOperator>(3)>};
+  return {kernelOf<Format, kOperator, effective<kOperator>(0)>(),
+          kernelOf<Format, kOperator, effective<kOperator>(1)>(),
+          kernelOf<Format, kOperator, effective<kOperator>(2)>(),
+          kernelOf<Format, kOperator, effective<kOperator>(3)>()};
 }
 
 /// The kernels of a format, by operator.
