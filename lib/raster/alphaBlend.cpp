@@ -6,7 +6,6 @@
 
 #include <algorithm>
 #include <array>
-#include <csignal>
 #include <utility>
 
 #include "panicPlace.h"
@@ -42,10 +41,7 @@ struct Call {
 
 /// (255 - da) / da, at most 255. Deliberate: a destination alpha of 0 faults as the division does.
 uint8 saturateShare(uint32 da) {
-  if (da == 0) {
-    static_cast<void>(raise(SIGFPE));
-    __builtin_trap();
-  }
+  if (da == 0) divisionByZero();
   return static_cast<uint8>(std::min(255u, (255 - da) / da));
 }
 

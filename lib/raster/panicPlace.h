@@ -2,11 +2,14 @@
 //
 // The forms of a fatal fault. A place is a module's fixed source path and, unless a number is part
 // of the message, the line of the call.
+//
+// The functions are in a source of their own because they call the host: see lib/CMakeLists.txt on
+// the stack's alignment.
 
 #ifndef RASTER_PANIC_PLACE_H
 #define RASTER_PANIC_PLACE_H
 
-#include "message.h"
+#include "baseTypes.h"
 
 namespace raster {
 
@@ -20,21 +23,18 @@ struct Place {
       : source(path), line(at) {}
 };
 
-[[noreturn]] inline void notImplemented(Place at) {
-  Panic("NOT_IMPLEMENTED %s:%d\n", at.source, at.line);
-}
-
-[[noreturn]] inline void notReached(Place at) { Panic("NOT_REACHED %s:%d\n", at.source, at.line); }
-
-[[noreturn]] inline void assertFailed(Place at, int bugNr) {
-  Panic("ASSERT %s:%d bugNr=%d\n", at.source, at.line, bugNr);
-}
+[[noreturn]] void notImplemented(Place at);
+[[noreturn]] void notReached(Place at);
+[[noreturn]] void assertFailed(Place at, int bugNr);
 
 /// The common end of a raster operation with a pixel size other than 1, 2, 3 or 4.
-[[noreturn]] inline void unsupportedPixelSize(Place at) {
-  Warning("Raster: Unsupported frame buffer depth\n");
-  notImplemented(at);
-}
+[[noreturn]] void unsupportedPixelSize(Place at);
+
+/// A warning about a number, for which `format` has a %d, and then notImplemented.
+[[noreturn]] void unsupportedNumber(const char* format, int32 number, Place at);
+
+/// Ends as an integer division by zero does.
+[[noreturn]] void divisionByZero();
 
 }  // namespace raster
 

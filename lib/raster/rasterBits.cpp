@@ -174,6 +174,16 @@ template <unsigned kBytes> void expand(const Expansion& e, const BitColors& colo
 }
 
 }  // namespace
+
+void bitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
+                  int32 bytesPerPixel, int32 width, int32 height, uint32 foreground,
+                  uint32 background) {
+  withPixelSize(static_cast<uint32>(bytesPerPixel), [&](auto bytes) {
+    expand<bytes>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height),
+                  {foreground, background}, false);
+  });
+}
+
 }  // namespace raster
 
 using raster::expand;
@@ -184,10 +194,8 @@ extern "C" {
 void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                          int32 bytesPerPixel, int32 width, int32 height, uint32 foreground,
                          uint32 background) {
-  raster::withPixelSize(static_cast<uint32>(bytesPerPixel), [&](auto bytes) {
-    expand<bytes>(expansionOf(bits, bitsPitch, dst, dstPitch, width, height),
-                  {foreground, background}, false);
-  });
+  raster::bitsToPixels(bits, bitsPitch, dst, dstPitch, bytesPerPixel, width, height, foreground,
+                       background);
 }
 
 void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,

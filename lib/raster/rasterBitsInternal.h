@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// What the bit-plane kernels of the instruction-set levels and their caller share.
+// Bit planes for the other modules of the library, and what the kernels of the instruction-set
+// levels and their caller share.
 
 #ifndef RASTER_RASTER_BITS_INTERNAL_H
 #define RASTER_RASTER_BITS_INTERNAL_H
@@ -32,6 +33,11 @@ struct BitsKernels {
   Expand twoColors[4];
   Expand stencil[4];
 };
+
+/// As Raster_BitsToPixels.
+void bitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
+                  int32 bytesPerPixel, int32 width, int32 height, uint32 foreground,
+                  uint32 background);
 
 }  // namespace raster
 

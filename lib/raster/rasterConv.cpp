@@ -4,7 +4,6 @@
 
 #include <cstring>
 
-#include "message.h"
 #include "panicPlace.h"
 #include "raster.h"
 #include "rasterConvInternal.h"
@@ -20,8 +19,7 @@ const uint8* bytesOf(const void* memory) { return static_cast<const uint8*>(memo
 uint8* bytesOf(void* memory) { return static_cast<uint8*>(memory); }
 
 [[noreturn]] void badPseudoColorDepth(int32 depth, Place at) {
-  Warning("Raster convert pixels invalid depth for pseudo color %d\n", depth);
-  notImplemented(at);
+  unsupportedNumber("Raster convert pixels invalid depth for pseudo color %d\n", depth, at);
 }
 
 /// How far right the top bits of a channel are shifted into a one-byte pixel.
@@ -70,8 +68,7 @@ template <class From, class Read> uint32 convertOneFrom(int32 dstDepth, Read rea
     case 32:
       return convertOne<From, Code32>(read());
     default:
-      Warning("Raster convert one pixel invalid depth %d\n", dstDepth);
-      notImplemented(kSource);
+      unsupportedNumber("Raster convert one pixel invalid depth %d\n", dstDepth, kSource);
   }
 }
 
@@ -92,8 +89,7 @@ uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool pseudo
     case 32:
       return convertOneFrom<Code32>(dstDepth, value);
     default:
-      Warning("Raster convert one pixel invalid source depth %d\n", srcDepth);
-      notImplemented(kSource);
+      unsupportedNumber("Raster convert one pixel invalid source depth %d\n", srcDepth, kSource);
   }
 }
 
@@ -162,13 +158,11 @@ bool convertTo(const Rectangle& r, int32 dstDepth, size_t srcIndex, uint32 srcBy
 }
 
 [[noreturn]] void badSourceDepth(int32 depth, Place at) {
-  Warning("Raster convert pixels invalid source depth %d\n", depth);
-  notImplemented(at);
+  unsupportedNumber("Raster convert pixels invalid source depth %d\n", depth, at);
 }
 
 [[noreturn]] void badDepth(int32 depth, Place at) {
-  Warning("Raster convert pixels invalid depth %d\n", depth);
-  notImplemented(at);
+  unsupportedNumber("Raster convert pixels invalid depth %d\n", depth, at);
 }
 
 void convertFromPalette(const Rectangle& r, int32 dstDepth, int32 srcDepth, const uint32* palette) {

@@ -8,7 +8,9 @@
 #include "alphaBlendInternal.h"
 #include "panicPlace.h"
 #include "raster.h"
+#include "rasterBitsInternal.h"
 #include "rasteropsInternal.h"
+#include "rasteropsRopInternal.h"
 
 namespace raster {
 namespace {
@@ -43,9 +45,9 @@ uint32 planeSize(uint32 width, uint32 height, uint32 bitsPerPixel) {
 void expandBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel, const uint8* bits, uint8* dst,
                     uint32 dstSize) {
   if (planeSize(width, height, bitsPerPixel) > dstSize) notImplemented(kSource);
-  Raster_BitsToPixels(bits, planeSize(width, 1, 1), dst, planeSize(width, 1, bitsPerPixel),
-                      static_cast<int32>(bitsPerPixel / 8), static_cast<int32>(width),
-                      static_cast<int32>(height), 0xFFFFFFFF, 0);
+  bitsToPixels(bits, planeSize(width, 1, 1), dst, planeSize(width, 1, bitsPerPixel),
+               static_cast<int32>(bitsPerPixel / 8), static_cast<int32>(width),
+               static_cast<int32>(height), 0xFFFFFFFF, 0);
 }
 
 /// A plane of depth 1 is expanded, one in the pixels' own depth copied with its row padding.
@@ -93,9 +95,9 @@ void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor
               const RasterCursorBox& box) {
   const auto pitch = static_cast<int32>(cursor.width * bytesPerPixel);
   const auto combine = [&](const uint8* plane, uint32 rop) {
-    Raster_RectROPcopy(to.bits, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
-                       static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x,
-                       to.y, static_cast<uint32>(box.width), static_cast<uint32>(box.height));
+    rectRopCopy(to.bits, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
+                static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x, to.y,
+                static_cast<uint32>(box.width), static_cast<uint32>(box.height));
   };
   combine(cursor.image.mask.andMask, kAnd);
   combine(cursor.image.mask.xorMask, kXor);

@@ -205,7 +205,6 @@ HWY_AFTER_NAMESPACE();
 
 #include "firstTime.h"
 #include "kernelChoice.h"
-#include "message.h"
 #include "raster.h"
 #include "videoAttributes.h"
 
@@ -276,7 +275,7 @@ void yuvToRgb(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 
       break;
   }
   static constinit std::atomic<bool> said{false};
-  if (firstTime(said)) Log("%s: format:%u not supported.\n", "Raster_YUVtoRGB", format);
+  logOnce(said, "%s: format:%u not supported.\n", "Raster_YUVtoRGB", format);
 }
 
 }  // namespace
@@ -290,7 +289,8 @@ void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height, 
   const Output output = outputOf(bppdepth);
   if (output.bytes != 0) return yuvToRgb(src, dst, width, height, format, output);
   static constinit std::atomic<bool> said{false};
-  if (firstTime(said)) Log("%s: bppdepth:%d not supported.\n", "Raster_YUVtoRGB", bppdepth);
+  logOnce(said, "%s: bppdepth:%d not supported.\n", "Raster_YUVtoRGB",
+          static_cast<uint32>(bppdepth));
 }
 
 uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v) {

@@ -228,6 +228,36 @@ void ropRows(const RopRows& rows, uint32 bytesPerPixel, uint32 rop, RopWalk walk
   }
 }
 
+void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,
+                 uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                 uint32 height) {
+  if (rop == kRopCopy) {
+    rectCopy(dst, pitchOf(dstPitch), src, pitchOf(srcPitch), bytesPerPixel, srcX, srcY, dstX, dstY,
+             width, height);
+    return;
+  }
+  const bool unsupported = bytesPerPixel < 1 || bytesPerPixel > 4;
+  RopWalk walk = RopWalk::kToRight;
+  if (srcY == dstY && dstX > srcX) {
+    if (unsupported) unsupportedPixelSize(kSource);
+    walk = RopWalk::kToLeft;
+  } else if (unsupported) {
+    unsupportedPixelSize(kSource);
+  }
+  if (rop >= kRopCount || rop == kRopNoop) return;
+  const bool bottomUp = srcY < dstY;
+  const uint32 firstRow = bottomUp ? height - 1 : 0;
+  const int32 dstWalked = bottomUp ? negated(dstPitch) : dstPitch;
+  const int32 srcWalked = bottomUp ? negated(srcPitch) : srcPitch;
+  ropRows({.dst = rowAt(dst, pitchOf(dstPitch), dstY + firstRow, dstX, bytesPerPixel),
+           .dstStep = rowStep(dstWalked, bytesPerPixel),
+           .src = rowAt(src, pitchOf(srcPitch), srcY + firstRow, srcX, bytesPerPixel),
+           .srcStep = rowStep(srcWalked, bytesPerPixel),
+           .bytes = size_t{width} * bytesPerPixel,
+           .height = height},
+          bytesPerPixel, rop, walk);
+}
+
 }  // namespace raster
 
 extern "C" {
@@ -256,32 +286,8 @@ void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pix
 void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch,
                         uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX,
                         uint32 dstY, uint32 width, uint32 height) {
-  using namespace raster;
-  if (rop == kRopCopy) {
-    rectCopy(dst, pitchOf(dstPitch), src, pitchOf(srcPitch), bytesPerPixel, srcX, srcY, dstX, dstY,
-             width, height);
-    return;
-  }
-  const bool unsupported = bytesPerPixel < 1 || bytesPerPixel > 4;
-  RopWalk walk = RopWalk::kToRight;
-  if (srcY == dstY && dstX > srcX) {
-    if (unsupported) unsupportedPixelSize(kSource);
-    walk = RopWalk::kToLeft;
-  } else if (unsupported) {
-    unsupportedPixelSize(kSource);
-  }
-  if (rop >= kRopCount || rop == kRopNoop) return;
-  const bool bottomUp = srcY < dstY;
-  const uint32 firstRow = bottomUp ? height - 1 : 0;
-  const int32 dstWalked = bottomUp ? negated(dstPitch) : dstPitch;
-  const int32 srcWalked = bottomUp ? negated(srcPitch) : srcPitch;
-  ropRows({.dst = rowAt(dst, pitchOf(dstPitch), dstY + firstRow, dstX, bytesPerPixel),
-           .dstStep = rowStep(dstWalked, bytesPerPixel),
-           .src = rowAt(src, pitchOf(srcPitch), srcY + firstRow, srcX, bytesPerPixel),
-           .srcStep = rowStep(srcWalked, bytesPerPixel),
-           .bytes = size_t{width} * bytesPerPixel,
-           .height = height},
-          bytesPerPixel, rop, walk);
+  raster::rectRopCopy(dst, dstPitch, src, srcPitch, bytesPerPixel, srcX, srcY, rop, dstX, dstY,
+                      width, height);
 }
 
 }  // extern "C"

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// Raster operations on rows, for the modules that have found their rows already.
+// Raster operations for the other modules of the library: on rows that are found already, and as
+// the exported function does them.
 
 #ifndef RASTER_RASTEROPS_ROP_INTERNAL_H
 #define RASTER_RASTEROPS_ROP_INTERNAL_H
@@ -49,6 +50,11 @@ enum class RopWalk { kToRight, kToLeft };
 /// result is that of reading, combining and storing one pixel after the other (one byte after the
 /// other in pixels of three), wherever source and destination lie.
 void ropRows(const RopRows& rows, uint32 bytesPerPixel, uint32 rop, RopWalk walk);
+
+/// As Raster_RectROPcopy.
+void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,
+                 uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                 uint32 height);
 
 }  // namespace raster
 

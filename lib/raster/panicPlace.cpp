@@ -1,0 +1,34 @@
+// SPDX-License-Identifier: MIT
+
+#include "panicPlace.h"
+
+#include <csignal>
+
+#include "message.h"
+
+namespace raster {
+
+void notImplemented(Place at) { Panic("NOT_IMPLEMENTED %s:%d\n", at.source, at.line); }
+
+void notReached(Place at) { Panic("NOT_REACHED %s:%d\n", at.source, at.line); }
+
+void assertFailed(Place at, int bugNr) {
+  Panic("ASSERT %s:%d bugNr=%d\n", at.source, at.line, bugNr);
+}
+
+void unsupportedPixelSize(Place at) {
+  Warning("Raster: Unsupported frame buffer depth\n");
+  notImplemented(at);
+}
+
+void unsupportedNumber(const char* format, int32 number, Place at) {
+  Warning(format, number);
+  notImplemented(at);
+}
+
+void divisionByZero() {
+  static_cast<void>(raise(SIGFPE));
+  __builtin_trap();
+}
+
+}  // namespace raster
