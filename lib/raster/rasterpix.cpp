@@ -19,41 +19,242 @@ namespace raster::HWY_NAMESPACE {
 namespace {
 
 using Bytes = hn::ScalableTag<uint8>;
+using Copy = std::remove_const_t<decltype(kCopy)>;
+
+#if HWY_TARGET == HWY_SCALAR
+
+constexpr size_t kBlockBytes = 1024;
+
+/// Combines a row with a source of the same length.
+template <class Rop> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+  combineToRight<Rop>(dst, src, bytes);
+}
+
+void copyRow(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
+
+void repeatShortRow(Bytes /*d*/, uint8* dst, const uint8* src, size_t period, size_t bytes) {
+  for (size_t i = 0; i < bytes; i += period) memcpy(dst + i, src, period);
+}
+
+/// Combines a row with a pattern that repeats after `period` bytes.
+template <class Rop>
+void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
+                    size_t /*lastPhase*/) {
+  for (size_t i = 0; i != bytes; i += std::min(bytes - i, period))
+    combineToRight<Rop>(dst + i, pattern, std::min(bytes - i, period));
+}
+
+#else
+
+/// Rows are combined in blocks of so many bytes.
+constexpr size_t kBlockBytes = 128;
+constexpr size_t kCacheLine = 64;
+static_assert(kBlockBytes >= 2 * kLanes<Bytes>);
+
+/// Combines a row that is at most a vector long: with the widest lanes that fit, from either end.
+template <class Rop, class D>
+HWY_INLINE void combineShortRow(D d, uint8* dst, const uint8* src, size_t bytes) {
+  constexpr size_t n = kLanes<D>;
+  if (bytes > n) {
+    const auto last = combined<Rop>(d, src + bytes - n, dst + bytes - n);
+    combine<Rop>(d, src, dst);
+    storeLanes(d, last, dst + bytes - n);
+  } else if (bytes == n) {
+    combine<Rop>(d, src, dst);
+  } else if constexpr (n > 1) {
+    combineShortRow<Rop>(hn::Half<D>(), dst, src, bytes);
+  }
+}
+
+/// Combines a row of at least a vector with a pattern that repeats after `period` bytes, at least
+/// a block, and is there for another block. The byte `lastPhase` of the pattern falls on the start
+/// of the row's last vector. The first and the last vector lie across what is stored between them,
+/// at vector boundaries, so they are made before anything is stored.
+template <class Rop>
+HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
+                               size_t lastPhase) {
+  const Bytes d;
+  constexpr size_t n = kLanes<Bytes>;
+  const auto first = combined<Rop>(d, pattern, dst);
+  const auto last = combined<Rop>(d, pattern + lastPhase, dst + bytes - n);
+  size_t i = n - reinterpret_cast<uintptr_t>(dst) % n;
+  size_t phase = i;
+  for (; bytes - i > kBlockBytes; i += kBlockBytes) {
+    for (size_t k = 0; k < kBlockBytes; k += kCacheLine) fetchAhead(dst + i + k);
+    for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, pattern + phase + k, dst + i + k);
+    phase += kBlockBytes;
+    if (phase >= period) phase -= period;
+  }
+  for (; bytes - i > n; i += n, phase += n) combine<Rop>(d, pattern + phase, dst + i);
+  storeLanes(d, first, dst);
+  storeLanes(d, last, dst + bytes - n);
+}
+
+/// Combines a row with a source of the same length.
+template <class Rop> HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+  if (bytes > kLanes<Bytes>) {
+    combinePeriods<Rop>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
+  } else {
+    combineShortRow<Rop>(Bytes(), dst, src, bytes);
+  }
+}
+
+/// Copies a row of at least a vector.
+HWY_INLINE void copyRow(uint8* dst, const uint8* src, size_t bytes) {
+  const Bytes d;
+  constexpr size_t n = kLanes<Bytes>;
+  storeLanes(d, loadLanes(d, src), dst);
+  for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; bytes - i > n; i += n)
+    storeLanes(d, loadLanes(d, src + i), dst + i);
+  storeLanes(d, loadLanes(d, src + bytes - n), dst + bytes - n);
+}
+
+/// Repeats `period` bytes, less than two vectors, up to `bytes` and a period more at most. What was
+/// stored is not read again: that would have to wait for the stores.
+template <class D>
+HWY_INLINE void repeatShortRow(D d, uint8* dst, const uint8* src, size_t period, size_t bytes) {
+  constexpr size_t n = kLanes<D>;
+  if (period > n) {
+    const auto first = loadLanes(d, src);
+    const auto last = loadLanes(d, src + period - n);
+    for (size_t i = 0; i < bytes; i += period) {
+      storeLanes(d, first, dst + i);
+      storeLanes(d, last, dst + i + period - n);
+    }
+  } else if (period == n) {
+    const auto all = loadLanes(d, src);
+    for (size_t i = 0; i < bytes; i += n) storeLanes(d, all, dst + i);
+  } else if constexpr (n > 1) {
+    repeatShortRow(hn::Half<D>(), dst, src, period, bytes);
+  }
+}
+
+#endif
+
+/// Calls row(dst, src, bytes) for the parts of a row that a pixmap row falls on, from its phase on
+/// and over and over.
+template <class Row>
+HWY_INLINE void tileRow(uint8* dst, const uint8* src, size_t bytes, size_t period, size_t phase,
+                        const Row& row) {
+  size_t i = std::min(bytes, period - phase);
+  row(dst, src + phase, i);
+  for (; i != bytes; i += std::min(bytes - i, period))
+    row(dst + i, src, std::min(bytes - i, period));
+}
 
 template <class Rop> void tileRows(const TileRows& t) {
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   for (uint32 y = t.height; y != 0; --y, dst = nextRow(dst, t.dstStep)) {
-    const uint8* src = rowAt(t.src, t.srcStep, srcY, 0, 0);
+    tileRow(dst, rowAt(t.src, t.srcStep, srcY, 0, 0), t.bytes, t.period, t.phase, combineRow<Rop>);
     srcY = srcY + 1 == t.srcRows ? 0 : srcY + 1;
-    size_t i = std::min(t.bytes, t.period - t.phase);
-    combineToRight<Rop>(dst, src + t.phase, i);
-    for (; i != t.bytes; i += std::min(t.bytes - i, t.period))
-      combineToRight<Rop>(dst + i, src, std::min(t.bytes - i, t.period));
   }
 }
 
-void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
-  forLanes(Bytes(), bytes,
-           [&](auto d, size_t i) { storeLanes(d, loadLanes(d, src + i), dst + i); });
+constexpr size_t kLongestVector = 64;
+constexpr size_t kBufferBytes = 32768;
+
+/// How pixmap rows lie in a buffer: repeated, and short ones from their start, others from a byte
+/// that leaves no less than a vector in front of their end.
+struct WideRows {
+  size_t skipped;  ///< bytes of a pixmap row that are left out at the start
+  size_t start;    ///< the place of the byte that the phase asks for
+  size_t bytes;    ///< what there is from there: all that a row needs, or a period and a block
+  size_t period;   ///< what it repeats after: whole periods of the pixmap
+  size_t step;
+};
+
+/// Periods of whole vectors let a row read its pattern at vector boundaries where it writes at
+/// them; they are chosen where they are not too long.
+HWY_INLINE WideRows wideRowsOf(const TileRows& t) {
+  constexpr size_t n = kLanes<Bytes>;
+  constexpr size_t kLongPeriod = 1024;
+  const size_t powerOfTwo = std::min(t.period & (0 - t.period), kLongestVector);
+  const size_t whole = t.period * (kLongestVector / powerOfTwo);
+  const size_t unit = whole <= kLongPeriod ? whole : t.period;
+  WideRows w{};
+  w.period = unit;
+  while (w.period < kBlockBytes) w.period += unit;
+  w.bytes = w.period + kBlockBytes;
+  if (t.bytes <= w.bytes) w.period = w.bytes = t.bytes;
+  w.skipped = t.period < n ? 0 : std::min(t.phase, t.period - n);
+  w.start = t.phase - w.skipped;
+  w.step = (w.start + w.bytes + n + kLongestVector - 1) & (0 - kLongestVector);
+  return w;
 }
 
-/// Writes the period once and then doubles what is there.
-void widenRows(const TileRows& t, uint8* wide, size_t wideBytes) {
+/// Copies rows of at least a vector.
+HWY_NOINLINE void copyRows(uint8* dst, size_t dstStep, const uint8* src, intptr_t srcStep,
+                           size_t bytes, uint32 rows) {
+  for (; rows != 0; --rows, dst += dstStep, src = nextRow(src, srcStep)) copyRow(dst, src, bytes);
+}
+
+/// Lays out `rows` pixmap rows from `src` on.
+HWY_NOINLINE void widenRows(const uint8* src, intptr_t srcStep, size_t period, uint32 rows,
+                            const WideRows& w, uint8* wide) {
+  constexpr size_t n = kLanes<Bytes>;
+  const size_t end = w.start + w.bytes;
+  const size_t step = w.step;
+  if (period < n) {
+    for (; rows != 0; --rows, wide += step, src = nextRow(src, srcStep))
+      repeatShortRow(Bytes(), wide, src, period, end);
+    return;
+  }
+  const size_t first = period - w.skipped;
+  copyRows(wide, step, src + w.skipped, srcStep, std::min(first, std::max(end, n)), rows);
+  for (size_t i = first; i < end; i += period)
+    copyRows(wide + i, step, src, srcStep, std::min(period, std::max(end - i, n)), rows);
+}
+
+/// Combines rows with `wideRows` widened ones, from the one with the number `y` on.
+template <class Rop>
+HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, uint32 height,
+                                  const uint8* wide, size_t wideStep, uint32 wideRows, uint32 y,
+                                  size_t period) {
+  constexpr size_t n = kLanes<Bytes>;
+  const uint8* const end = wide + wideRows * wideStep;
+  const uint8* pattern = wide + y * wideStep;
+  const size_t lastPhase = bytes <= n ? 0 : period == bytes ? bytes - n : (bytes - n) % period;
+  for (; height != 0; --height, dst = nextRow(dst, dstStep)) {
+    if (bytes <= n) {
+      combineRow<Rop>(dst, pattern, bytes);
+    } else {
+      combinePeriods<Rop>(dst, pattern, bytes, period, lastPhase);
+    }
+    pattern += wideStep;
+    if (pattern == end) pattern = wide;
+  }
+}
+
+/// Widens all pixmap rows, or as many as there is room for before they are used.
+template <class Rop> void tileWidened(const TileRows& t) {
+  alignas(kLongestVector) uint8 buffer[kBufferBytes];
+  const WideRows w = wideRowsOf(t);
+  // Rows that are used only once or twice are not to leave the innermost cache before that.
+  const size_t bytes = t.height / 2 >= t.srcRows ? kBufferBytes : kBufferBytes / 4;
+  const auto room = static_cast<uint32>((bytes - kLongestVector) / w.step);
+  const bool all = t.srcRows <= room && t.srcRows <= t.height;
+  uint8* dst = t.dst;
   uint32 srcY = t.srcY;
-  for (uint32 y = std::min(t.height, t.srcRows); y != 0; --y, wide += wideBytes) {
-    const uint8* src = rowAt(t.src, t.srcStep, srcY, 0, 0);
-    srcY = srcY + 1 == t.srcRows ? 0 : srcY + 1;
-    const size_t head = std::min(t.period - t.phase, wideBytes);
-    copyBytes(wide, src + t.phase, head);
-    copyBytes(wide + head, src, std::min(t.phase, wideBytes - head));
-    for (size_t i = t.period; i < wideBytes; i += std::min(i, wideBytes - i))
-      copyBytes(wide + i, wide, std::min(i, wideBytes - i));
+  uint32 height = t.height;
+  while (height != 0) {
+    const uint32 first = all ? 0 : srcY;
+    const uint32 rows = std::min(all ? t.srcRows : std::min(height, room), t.srcRows - first);
+    const uint32 slice = all ? height : rows;
+    // The rows of the buffer lie to vector boundaries as those of the destination do.
+    uint8* wide = buffer + (reinterpret_cast<uintptr_t>(dst) - w.start) % kLongestVector;
+    widenRows(rowAt(t.src, t.srcStep, first, 0, 0), t.srcStep, t.period, rows, w, wide);
+    combineWideRows<Rop>(dst, t.dstStep, t.bytes, slice, wide + w.start, w.step, rows, srcY - first,
+                         w.period);
+    dst = rowAt(dst, t.dstStep, slice, 0, 0);
+    srcY = srcY + slice == t.srcRows ? 0 : srcY + slice;
+    height -= slice;
   }
 }
 
 constexpr auto kTileRows = ropTable([](auto rop) { return &tileRows<decltype(rop)>; });
-constexpr TileKernels kKernels = {kTileRows.data(), widenRows};
+constexpr auto kTileWidened = ropTable([](auto rop) { return &tileWidened<decltype(rop)>; });
+constexpr TileKernels kKernels = {kTileRows.data(), kTileWidened.data()};
 
 }  // namespace
 
@@ -63,8 +264,6 @@ const TileKernels* tileKernels() { return &kKernels; }
 HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
-
-#include <numeric>
 
 #include "kernelChoice.h"
 #include "panicPlace.h"
@@ -81,12 +280,8 @@ HWY_EXPORT(tileKernels);
 const TileKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(tileKernels)(); }
 const TileKernels& kernels() { return chosenKernels<lookUpKernels>(); }
 
-// Rows of a pixmap that are shorter than kNarrow bytes are first widened, to kWide bytes or less,
-// in a buffer on the stack.
-constexpr size_t kNarrow = 256;
-constexpr size_t kWide = 1024;
-constexpr size_t kBufferBytes = 16384;
-constexpr size_t kVectorBytes = 64;
+// Rows of a pixmap that are shorter are first widened.
+constexpr size_t kNarrow = 1024;
 
 /// A picture as the tiling functions are given it.
 template <class Byte> struct Picture {
@@ -153,39 +348,6 @@ void tileBlocks(const Tiling& t, uint32 tileX, uint32 tileY, uint32 rop) {
   }
 }
 
-/// How far rows are widened, with `most` bytes for each: as far as a destination row needs, or else
-/// to whole periods, and to whole vectors of them where that fits.
-size_t wideBytesOf(const TileRows& t, size_t most) {
-  if (t.bytes <= most) return t.bytes;
-  const size_t whole = std::lcm(t.period, kVectorBytes);
-  return most / whole != 0 ? most / whole * whole : most / t.period * t.period;
-}
-
-/// Tiles slices of rows, each with its pixmap rows widened. All pixmap rows fit the buffer at once
-/// unless there are very many of them.
-void tileWidened(TileRows t, uint32 rop) {
-  uint8 buffer[kBufferBytes];
-  const auto rowsThatFit = static_cast<uint32>(kBufferBytes / (2 * kNarrow));
-  const uint32 slice = t.srcRows <= rowsThatFit ? t.height : rowsThatFit;
-  while (t.height != 0) {
-    TileRows part = t;
-    part.height = std::min(t.height, slice);
-    const uint32 wideRows = std::min(part.height, t.srcRows);
-    const size_t wideBytes = wideBytesOf(part, std::min(kWide, kBufferBytes / wideRows));
-    kernels().widen(part, buffer, wideBytes);
-    part.src = buffer;
-    part.srcStep = static_cast<intptr_t>(wideBytes);
-    part.srcRows = wideRows;
-    part.srcY = 0;
-    part.period = wideBytes;
-    part.phase = 0;
-    kernels().tile[rop](part);
-    t.dst = rowAt(t.dst, t.dstStep, part.height, 0, 0);
-    t.srcY = (t.srcY + part.height) % t.srcRows;
-    t.height -= part.height;
-  }
-}
-
 /// Whether the order of the pixels shows nowhere: every byte of the destination is written once,
 /// and no byte of the pixmap is written.
 bool isOrderFree(const TileRows& t) {
@@ -193,6 +355,13 @@ bool isOrderFree(const TileRows& t) {
   const RowSpan src(t.src, t.srcStep, t.period, t.srcRows);
   const intptr_t gap = static_cast<intptr_t>(t.bytes);
   return dst.isApartFrom(src) && (t.dstStep >= gap || t.dstStep <= -gap || t.height == 1);
+}
+
+/// Whether pixmap rows are better repeated before they are used: those that end within a row, are
+/// short, and used more than once or twice.
+bool isWorthWidening(const TileRows& t) {
+  if (t.period >= kNarrow || t.bytes <= t.period - t.phase) return false;
+  return t.height > t.srcRows || t.bytes > 2 * t.period;
 }
 
 void tile(const Tiling& t, uint32 tileX, uint32 tileY, uint32 rop) {
@@ -205,8 +374,8 @@ void tile(const Tiling& t, uint32 tileX, uint32 tileY, uint32 rop) {
                       rows.srcStep == rowStep(rows.srcStep, t.bytesPerPixel);
   if (!steady || !isOrderFree(rows) || !ropReadsSource(rop)) {
     tileBlocks(t, phaseX, phaseY, rop);
-  } else if (rows.period < kNarrow && rows.bytes > rows.period - rows.phase) {
-    tileWidened(rows, rop);
+  } else if (isWorthWidening(rows)) {
+    kernels().tileWidened[rop](rows);
   } else {
     kernels().tile[rop](rows);
   }

@@ -28,10 +28,10 @@ struct TileRows {
 struct TileKernels {
   /// By operation. The order of the pixels must not matter.
   using Tile = void (*)(const TileRows& rows);
+  /// For any pixmap, straight from its rows.
   const Tile* tile;
-  /// Writes the pixmap rows for the first min(height, srcRows) destination rows to `wide`, each
-  /// from its phase on and repeated up to `wideBytes`.
-  void (*widen)(const TileRows& rows, uint8* wide, size_t wideBytes);
+  /// For pixmap rows of less than 1024 bytes, which are first repeated in a buffer.
+  const Tile* tileWidened;
 };
 
 }  // namespace raster

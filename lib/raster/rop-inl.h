@@ -64,13 +64,19 @@ inline constexpr bool kReadsSrc = (kTruthTable<Rop> & 3) != kTruthTable<Rop> >> 
 template <class Rop>
 inline constexpr bool kReadsDst = (kTruthTable<Rop> & 5) != (kTruthTable<Rop> >> 1 & 5);
 
-/// Combines one block of lanes; reads only what the operation depends on.
-template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uint8* dst) {
+/// What an operation makes of one block of lanes; reads only what it depends on.
+template <class Rop, class D>
+HWY_INLINE hn::Vec<D> combined(D d, const uint8* src, const uint8* dst) {
   auto s = hn::Zero(d);
   auto t = hn::Zero(d);
   if constexpr (kReadsSrc<Rop>) s = loadLanes(d, src);
   if constexpr (kReadsDst<Rop>) t = loadLanes(d, dst);
-  storeLanes(d, Rop{}(s, t), dst);
+  return Rop{}(s, t);
+}
+
+/// Combines one block of lanes.
+template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uint8* dst) {
+  storeLanes(d, combined<Rop>(d, src, dst), dst);
 }
 
 /// Rows of fewer bytes are not worth the blocks that bring the stores to vector boundaries.

@@ -18,6 +18,7 @@
 #include <cstring>
 
 #include "baseTypes.h"
+#include "frameBuffer.h"
 #include "hwy/highway.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -46,6 +47,13 @@ template <class D> HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) 
   const hn::Repartition<uint8, D> d8;
   hn::StoreU(hn::BitCast(d8, lanes), d8, at);
 #endif
+}
+
+/// Asks for the memory that a loop over a long row comes to soon: processors do not fetch far ahead
+/// of stores by themselves. It is only a hint, so the end of the row does not matter.
+HWY_INLINE void fetchAhead(const uint8* at) {
+  constexpr intptr_t kAhead = 1024;
+  __builtin_prefetch(nextRow(at, kAhead));
 }
 
 /// Runs body(tag, first) for the rest of a row that is shorter than two blocks of `d`.

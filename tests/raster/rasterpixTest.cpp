@@ -125,6 +125,26 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithASeparatePixmap) {
   }
 }
 
+TEST(Raster_RectPixmapROPcopy, EqualsTheModelForEveryPixmapWidthAlsoWithTallPixmaps) {
+  Random random(6);
+  for (uint32 width = 1; width <= 70; ++width) {
+    for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
+      Tiling t = someTiling(random, random.oneOf({kCopy, 1 + random.below(14)}));
+      t.bytesPerPixel = bytesPerPixel;
+      t.pixmapWidth = width;
+      t.pixmapHeight = random.oneOf({1 + random.below(4), 1 + random.below(80)});
+      t.width = random.oneOf({random.below(100), 200 + random.below(500)});
+      t.height = random.oneOf({random.below(20), random.below(200)});
+      t.dstPitch = (t.dstX + t.width) * bytesPerPixel + random.oneOf({0u, random.below(40)});
+      if (random.below(2) == 0) t.dstPitch = (t.dstPitch + 63) / 64 * 64;
+      t.pixmapPitch = width * bytesPerPixel + random.oneOf({0u, random.below(30)});
+      t.pixmap = t.dstRange().end;
+      checkTiling(random, t);
+      if (HasFatalFailure()) FAIL() << "width " << width;
+    }
+  }
+}
+
 TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithAPixmapInsideOrBesideTheRectangle) {
   Random random(2);
   for (int round = 0; round < 4000; ++round) {
