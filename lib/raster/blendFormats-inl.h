@@ -229,32 +229,33 @@ struct Bytes3 : WholeBytes {
  private:
   using Vector = hn::Vec<Lanes>;
 
-  // Three quarters of a vector hold the pixels. They are read and written as its lower half and
-  // half of the upper one.
+  // Three quarters of a vector hold the pixels: its lower half and half of the upper one.
   static constexpr hn::Half<Lanes> kHalf{};
   static constexpr hn::Half<hn::Half<Lanes>> kQuarter{};
   static constexpr size_t kHalfBytes = sizeof(uint32) * kLanes<hn::Half<Lanes>>;
 
-  static HWY_INLINE Vector loadQuarters(const uint8* at, WholeBlock /*part*/) {
 #if HWY_TARGET == HWY_AVX3
-    return loadQuarters(at, FirstPixels{16});
-#endif
+  static HWY_INLINE Vector loadQuarters(const uint8* at, FirstPixels part) {
+    return loadPart<kBytes>(Lanes(), at, 0, part);
+  }
+  static HWY_INLINE Vector loadQuarters(const uint8* at, WholeBlock /*part*/) {
+    return loadQuarters(at, FirstPixels{kLanes<Lanes>});
+  }
+  static HWY_INLINE void storeQuarters(Vector v, uint8* at, FirstPixels part) {
+    storePart<kBytes>(Lanes(), v, at, part);
+  }
+#else
+  static HWY_INLINE Vector loadQuarters(const uint8* at, WholeBlock /*part*/) {
     const auto upper = loadLanes(kQuarter, at + kHalfBytes);
     return hn::Combine(Lanes(), hn::ZeroExtendVector(kHalf, upper), loadLanes(kHalf, at));
   }
+#endif
+  // By two stores, which the next loads do not wait for as they do for a masked one.
   static HWY_INLINE void storeQuarters(Vector v, uint8* at, WholeBlock /*part*/) {
     storeLanes(kHalf, hn::LowerHalf(kHalf, v), at);
     const auto upper = hn::LowerHalf(kQuarter, hn::UpperHalf(kHalf, v));
     storeLanes(kQuarter, upper, at + kHalfBytes);
   }
-#if HWY_TARGET == HWY_AVX3
-  static HWY_INLINE Vector loadQuarters(const uint8* at, FirstPixels part) {
-    return loadPart<kBytes>(Lanes(), at, 0, part);
-  }
-  static HWY_INLINE void storeQuarters(Vector v, uint8* at, FirstPixels part) {
-    storePart<kBytes>(Lanes(), v, at, part);
-  }
-#endif
 
   static HWY_INLINE Vector spreadBlocks(Vector quarters) {
     if constexpr (kLanes<Lanes> == 4) {
