@@ -117,15 +117,17 @@ void blendOverlapping(const BlendRect& all, uint32 bytes, const BlendKernel& ker
 }
 
 /// Blends rows that do not overlap their sources, as one long row where that is the same.
-void blendRows(const BlendRect& rows, uint32 bytes, const BlendKernel& kernel) {
-  BlendRect rect = rows;
+void blendRows(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {
   const bool gapless = rect.dstStep == static_cast<intptr_t>(rect.width * bytes) &&
                        rect.srcStep == static_cast<intptr_t>(rect.width * 4);
-  if (gapless) {
-    rect.width *= rect.height;
-    rect.height = 1;
+  if (!gapless) {
+    kernel.blend(rect);
+    return;
   }
-  kernel.blend(rect);
+  BlendRect row = rect;
+  row.width *= row.height;
+  row.height = 1;
+  kernel.blend(row);
 }
 
 void blendInPlace(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {

@@ -108,7 +108,7 @@ HWY_INLINE void blendBlock(const BlendRect& rect, Block at, Part part) {
 
 template <class Format, auto kOperator, uint32 kFlags>
 HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
-  if (pixels != 0) blendBlock<Format, kOperator, kFlags>(rect, at, FirstPixels{pixels});
+  blendBlock<Format, kOperator, kFlags>(rect, at, FirstPixels{pixels});
 }
 
 #elif HWY_TARGET != HWY_SCALAR
@@ -122,7 +122,6 @@ HWY_NOINLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
 /// Blends the end of a row, shorter than a block, by way of a whole block of its own.
 template <class Format, auto kOperator, uint32 kFlags>
 HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
-  if (pixels == 0) return;
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
   uint8 source[4 * kBlock] = {};
   uint8 destination[Format::kBytes * kBlock] = {};
@@ -145,13 +144,15 @@ template <class Format, auto kOperator, uint32 kFlags> void blendRect(const Blen
   const BlendRect rect = call;  // a local that no store to pixels can change
   Block row{rect.dst, rect.before, rect.src};
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
+  const size_t whole = rect.width / kBlock * kBlock;
   for (uint32 y = 0; y < rect.height; ++y) {
-    size_t x = 0;
-    for (; rect.width - x >= kBlock; x += kBlock)
+    for (size_t x = 0; x != whole; x += kBlock)
       blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());
-    blendEnd<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), rect.width - x);
-    row = {nextRow(row.dst, rect.dstStep), nextRow(row.before, rect.beforeStep),
-           nextRow(row.src, rect.srcStep)};
+    if (whole != rect.width)
+      blendEnd<Format, kOperator, kFlags>(rect, row.pixel<Format>(whole), rect.width - whole);
+    // The steps come from memory: 32-bit x86 has no registers left for them.
+    row = {nextRow(row.dst, call.dstStep), nextRow(row.before, call.beforeStep),
+           nextRow(row.src, call.srcStep)};
   }
 }
 
