@@ -445,8 +445,8 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 ///
 /// `staged` 0 blends in place, from left to right and row after row, so that source and destination
 /// may overlap. Any other value moves the destination through a buffer: the frame buffer, be it
-/// slow or shared, is then read and written by block copies of at most 3072 bytes only, and a
-/// source that overlaps it is read as it was before its block is written back. The pixels are
+/// slow or shared, is then touched by blocks of at most 3072 bytes only, each read once and in order
+/// before it is copied back, and a source that overlaps it is read as it was before. The pixels are
 /// otherwise equal.
 ///
 /// In place, operators 0 and 2 read no source and 0, 1, 5 and 7 no destination, except that in
@@ -455,12 +455,10 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 ///
 /// Deliberate:
 /// - Operator 11 is computed as operator 10.
-/// - A field of three bits (depth 8) widens to c << 5 | c << 2 | (c & 3), so 4 becomes 0x90. In
-/// that
+/// - A field of three bits (depth 8) widens to c << 5 | c << 2 | (c & 3), so 4 becomes 0x90. In that
 ///   depth channel 0 is in the top bits, in all others in the lowest.
-/// - Operator 13 with bit 1 of `flags` and `dstAlpha` 0 divides by zero: the call raises SIGFPE
-/// when
-///   there is a pixel to blend, and traps should a handler return.
+/// - Operator 13 with bit 1 of `flags` and `dstAlpha` 0 divides by zero: where there is a pixel to
+///   blend the call raises SIGFPE, and traps should a handler return.
 TARNLIBS_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
                                        const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
                                        uint32 width, uint32 height, uint32 depth, uint32 bpp,
