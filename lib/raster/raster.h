@@ -445,9 +445,9 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 ///
 /// `staged` 0 blends in place, from left to right and row after row, so that source and destination
 /// may overlap. Any other value moves the destination through a buffer: the frame buffer, be it
-/// slow or shared, is then touched by blocks of at most 3072 bytes only, each read once and in order
-/// before it is copied back, and a source that overlaps it is read as it was before. The pixels are
-/// otherwise equal.
+/// slow or shared, is then touched by blocks of at most 3072 bytes only, each read once and in
+/// order before it is copied back, and a source that overlaps it is read as it was before. The
+/// pixels are otherwise equal.
 ///
 /// In place, operators 0 and 2 read no source and 0, 1, 5 and 7 no destination, except that in
 /// 4-byte pixels byte 3 is read and written back together with the others: no other thread may
@@ -455,8 +455,8 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 ///
 /// Deliberate:
 /// - Operator 11 is computed as operator 10.
-/// - A field of three bits (depth 8) widens to c << 5 | c << 2 | (c & 3), so 4 becomes 0x90. In that
-///   depth channel 0 is in the top bits, in all others in the lowest.
+/// - A field of three bits (depth 8) widens to c << 5 | c << 2 | (c & 3), so 4 becomes 0x90. There
+///   channel 0 is in the top bits, in all other depths in the lowest.
 /// - Operator 13 with bit 1 of `flags` and `dstAlpha` 0 divides by zero: where there is a pixel to
 ///   blend the call raises SIGFPE, and traps should a handler return.
 TARNLIBS_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
@@ -681,14 +681,12 @@ typedef struct RasterRGBParam {
 /// with an arithmetic shift, each limited to 0..255. `width` and `height` are in pixels.
 ///
 /// `format` is a four-character code, its first character in the low byte:
-/// - "YUY2" (0x32595559) and "UYVY" (0x59565955): width x height / 2 groups of four bytes, one
-/// after
-///   the other without row padding: Y0 Cr Y1 Cb, and Cr Y0 Cb Y1. With an odd number of pixels the
-///   last one is not written.
+/// - "YUY2" (0x32595559) and "UYVY" (0x59565955): width x height / 2 groups of four bytes, without
+///   row padding: Y0 Cr Y1 Cb, and Cr Y0 Cb Y1. With an odd number of pixels the last one is not
+///   written.
 /// - "YV12" (0x32315659): a plane of Y, one of Cb and one of Cr, each right after the other. Rows
-/// of
-///   Y are `width` rounded up to even bytes apart and their number is `height` rounded up to even;
-///   the other planes have half of both. A last odd row or column is not written.
+///   of Y are `width` rounded up to even bytes apart and their number is `height` rounded up to
+///   even; the other planes have half of both. A last odd row or column is not written.
 ///
 /// Deliberate: in the packed formats the first chroma byte of a group is the red-difference, and in
 /// the planar one the plane after Y is the blue-difference. Standard frames of these names have
