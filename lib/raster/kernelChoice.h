@@ -10,15 +10,21 @@
 
 namespace raster {
 
-/// The kernels that `kLookUp` finds for this processor. The level does not change within a process,
-/// so threads that race here store the same pointer.
+template <auto kLookUp> inline constinit std::atomic<decltype(kLookUp())> lookedUpKernels{nullptr};
+
+/// The first call's way, kept out of the functions that call kernels. The level does not change
+/// within a process, so threads that race here store the same pointer.
+template <auto kLookUp> [[gnu::noinline, gnu::cold]] auto lookUpKernelsOnce() {
+  const auto kernels = kLookUp();
+  lookedUpKernels<kLookUp>.store(kernels, std::memory_order_release);
+  return kernels;
+}
+
+/// The kernels that `kLookUp` finds for this processor.
 template <auto kLookUp> inline const auto& chosenKernels() {
-  static constinit std::atomic<decltype(kLookUp())> chosen{nullptr};
-  auto kernels = chosen.load(std::memory_order_acquire);
-  if (kernels == nullptr) [[unlikely]] {
-    kernels = kLookUp();
-    chosen.store(kernels, std::memory_order_release);
-  }
+  auto kernels = lookedUpKernels<kLookUp>.load(std::memory_order_acquire);
+  if (kernels == nullptr) [[unlikely]]
+    kernels = lookUpKernelsOnce<kLookUp>();
   return *kernels;
 }
 

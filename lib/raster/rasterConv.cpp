@@ -2,11 +2,10 @@
 //
 // Pixel formats: display modes, format codes, and the conversion of one pixel and of rectangles.
 
-#include <cstring>
-
 #include "panicPlace.h"
 #include "raster.h"
 #include "rasterConvInternal.h"
+#include "rasteropsInternal.h"
 
 namespace raster {
 namespace {
@@ -111,17 +110,17 @@ void copyPixels(const Rectangle& r, int32 depth) {
   const uint32 bytesPerPixel = bytesPerPixelOf(depth);
   const size_t bytes = size_t{r.width} * bytesPerPixel;
   if (bytes == 0) return;
-  uint8* dst = rowAt(r.dst, pitchOf(r.dstPitch), r.dstY, r.dstX, bytesPerPixel);
-  const uint8* src = rowAt(r.src, pitchOf(r.srcPitch), r.srcY, r.srcX, bytesPerPixel);
+  CopyRows rows{.dst = rowAt(r.dst, pitchOf(r.dstPitch), r.dstY, r.dstX, bytesPerPixel),
+                .dstStep = pitchOf(r.dstPitch),
+                .src = rowAt(r.src, pitchOf(r.srcPitch), r.srcY, r.srcX, bytesPerPixel),
+                .srcStep = pitchOf(r.srcPitch),
+                .bytes = bytes,
+                .height = r.height};
   if (r.srcPitch == bytes && r.dstPitch == bytes) {
-    memcpy(dst, src, bytes * r.height);
-    return;
+    rows.bytes *= rows.height;
+    rows.height = 1;
   }
-  for (uint32 y = 0; y < r.height; ++y) {
-    memcpy(dst, src, bytes);
-    dst = nextRow(dst, pitchOf(r.dstPitch));
-    src = nextRow(src, pitchOf(r.srcPitch));
-  }
+  copyRows(rows);
 }
 
 /// Runs the kernel for a pair of formats, given by their indices in the table.

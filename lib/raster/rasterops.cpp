@@ -21,18 +21,22 @@ namespace {
 
 #if HWY_TARGET == HWY_SCALAR
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
-  for (; height != 0; --height, row = nextRow(row, step)) {
+void fillRows(const FillRows& job) {
+  uint8* row = job.row;
+  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step)) {
     size_t i = 0;
-    for (; bytes - i >= sizeof pixels; i += sizeof pixels) memcpy(row + i, &pixels, sizeof pixels);
-    memcpy(row + i, &pixels, bytes - i);
+    for (; job.bytes - i >= sizeof job.pixels; i += sizeof job.pixels)
+      memcpy(row + i, &job.pixels, sizeof job.pixels);
+    memcpy(row + i, &job.pixels, job.bytes - i);
   }
 }
 
-void copyRows(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, size_t bytes,
-              uint32 height) {
-  for (; height != 0; --height, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep))
-    memmove(dst, src, bytes);
+void copyRows(const CopyRows& job) {
+  uint8* dst = job.dst;
+  const uint8* src = job.src;
+  for (uint32 y = job.height; y != 0;
+       --y, dst = nextRow(dst, job.dstStep), src = nextRow(src, job.srcStep))
+    memmove(dst, src, job.bytes);
 }
 
 #else
@@ -42,12 +46,13 @@ using Words = hn::ScalableTag<uint32>;
 
 /// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
 /// The end of a row is stored as one vector that overlaps what is there already.
-template <class V>
-HWY_INLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 height, V first,
-                             V second, V third, V last) {
-  const Bytes d;
-  const size_t n = hn::Lanes(d);
-  for (; height != 0; --height, row = nextRow(row, step)) {
+template <class D, class V = hn::Vec<D>>
+HWY_INLINE void fillLongRows(D d, const FillRows& job, V first, V second, V third, V last) {
+  constexpr size_t n = kLanes<D>;
+  const size_t bytes = job.bytes;
+  const intptr_t step = job.step;  // read here, as a store to a pixel might change it
+  uint8* row = job.row;
+  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, step)) {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
       hn::StoreU(first, d, row + i);
@@ -60,43 +65,58 @@ HWY_INLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 hei
   }
 }
 
-void fillShortRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
-  const PixelPattern pattern = patternOf(pixels);
-  for (; height != 0; --height, row = nextRow(row, step)) {
-    forLanes(Bytes(), bytes,
-             [&](auto d, size_t i) { hn::StoreU(hn::LoadU(d, pattern.bytes + i), d, row + i); });
+/// Fills with words that are all the same: in vectors of `d`, or smaller ones for short rows.
+template <class D> HWY_INLINE void fillWithWord(D d, const FillRows& job) {
+  if (job.bytes >= kLanes<D>) {
+    const auto same = hn::BitCast(d, hn::Set(hn::Repartition<uint32, D>(), job.pixels.word[0]));
+    fillLongRows(d, job, same, same, same, same);
+  } else if constexpr (kLanes < D >> sizeof(uint32)) {
+    fillWithWord(hn::Half<D>(), job);
+  } else {
+    uint8* row = job.row;
+    for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step))
+      memcpy(row, &job.pixels, job.bytes);
   }
 }
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords pixels) {
+HWY_NOINLINE void fillWithPattern(const FillRows& job) {
   const Bytes d;
   const size_t n = hn::Lanes(d);
-  if (bytes < n) {
-    fillShortRows(row, step, bytes, height, pixels);
-  } else if (pixels.word[0] == pixels.word[1] && pixels.word[1] == pixels.word[2]) {
-    const auto same = hn::BitCast(d, hn::Set(Words(), pixels.word[0]));
-    fillLongRows(row, step, bytes, height, same, same, same, same);
-  } else {
-    const PixelPattern pattern = patternOf(pixels);
-    const size_t lastPhase = (bytes - n) % sizeof pixels;
-    fillLongRows(row, step, bytes, height, hn::LoadU(d, pattern.bytes),
-                 hn::LoadU(d, pattern.bytes + n), hn::LoadU(d, pattern.bytes + 2 * n),
-                 hn::LoadU(d, pattern.bytes + lastPhase));
+  const PixelPattern pattern = patternOf(job.pixels);
+  if (job.bytes >= n) {
+    const size_t lastPhase = (job.bytes - n) % sizeof job.pixels;
+    fillLongRows(d, job, hn::LoadU(d, pattern.bytes), hn::LoadU(d, pattern.bytes + n),
+                 hn::LoadU(d, pattern.bytes + 2 * n), hn::LoadU(d, pattern.bytes + lastPhase));
+    return;
   }
+  uint8* row = job.row;
+  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step)) {
+    forLanes(d, job.bytes, [&](auto tag, size_t i) {
+      storeLanes(tag, loadLanes(tag, pattern.bytes + i), row + i);
+    });
+  }
+}
+
+void fillRows(const FillRows& job) {
+  const uint32* const word = job.pixels.word;
+  if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(job);
+  fillWithWord(Bytes(), job);
 }
 
 /// Copies rows of one to two blocks of `d`. A row is loaded whole before it is stored, so source
 /// and destination may overlap.
-template <class D>
-void copyShortRows(D d, uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep,
-                   size_t bytes, uint32 height) {
-  if (bytes < hn::Lanes(d)) {
-    if constexpr (kLanes < D >> 1)
-      copyShortRows(hn::Half<D>(), dst, dstStep, src, srcStep, bytes, height);
+template <class D> HWY_INLINE void copyShortRows(D d, const CopyRows& job) {
+  if (job.bytes < kLanes<D>) {
+    if constexpr (kLanes < D >> 1) copyShortRows(hn::Half<D>(), job);
     return;
   }
-  const size_t last = bytes - hn::Lanes(d);
-  for (; height != 0; --height, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep)) {
+  const size_t last = job.bytes - kLanes<D>;
+  uint8* dst = job.dst;
+  const uint8* src = job.src;
+  const intptr_t dstStep = job.dstStep;  // as above
+  const intptr_t srcStep = job.srcStep;
+  for (uint32 y = job.height; y != 0;
+       --y, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep)) {
     const auto head = hn::LoadU(d, src);
     const auto tail = hn::LoadU(d, src + last);
     hn::StoreU(head, d, dst);
@@ -104,14 +124,68 @@ void copyShortRows(D d, uint8* dst, intptr_t dstStep, const uint8* src, intptr_t
   }
 }
 
-void copyRows(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, size_t bytes,
-              uint32 height) {
-  if (bytes <= 2 * hn::Lanes(Bytes())) {
-    copyShortRows(Bytes(), dst, dstStep, src, srcStep, bytes, height);
-    return;
+constexpr Bytes kBytes;
+constexpr size_t kStep = kLanes<Bytes>;
+
+/// Moves four vectors, loaded before they are stored.
+HWY_INLINE void moveFour(uint8* dst, const uint8* src) {
+  const auto a = hn::LoadU(kBytes, src);
+  const auto b = hn::LoadU(kBytes, src + kStep);
+  const auto c = hn::LoadU(kBytes, src + 2 * kStep);
+  const auto d = hn::LoadU(kBytes, src + 3 * kStep);
+  hn::StoreU(a, kBytes, dst);
+  hn::StoreU(b, kBytes, dst + kStep);
+  hn::StoreU(c, kBytes, dst + 2 * kStep);
+  hn::StoreU(d, kBytes, dst + 3 * kStep);
+}
+HWY_INLINE void moveOne(uint8* dst, const uint8* src) {
+  hn::StoreU(hn::LoadU(kBytes, src), kBytes, dst);
+}
+
+/// As memmove, of more than a vector. Both ends are loaded first and stored last, so that what lies
+/// between them is stored aligned.
+void moveRow(uint8* dst, const uint8* src, size_t bytes) {
+  const auto head = hn::LoadU(kBytes, src);
+  const auto tail = hn::LoadU(kBytes, src + bytes - kStep);
+  const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
+  if (ahead >= bytes) {
+    size_t i = kStep - reinterpret_cast<uintptr_t>(dst) % kStep;
+    for (; i + 4 * kStep < bytes; i += 4 * kStep) moveFour(dst + i, src + i);
+    for (; i + kStep < bytes; i += kStep) moveOne(dst + i, src + i);
+  } else {
+    size_t end = bytes - reinterpret_cast<uintptr_t>(dst + bytes) % kStep;
+    for (; end > 4 * kStep; end -= 4 * kStep)
+      moveFour(dst + end - 4 * kStep, src + end - 4 * kStep);
+    for (; end > kStep; end -= kStep) moveOne(dst + end - kStep, src + end - kStep);
   }
-  for (; height != 0; --height, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep))
-    memmove(dst, src, bytes);
+  hn::StoreU(head, kBytes, dst);
+  hn::StoreU(tail, kBytes, dst + bytes - kStep);
+}
+
+// Rows up to here are moved by moveRow, which is faster than the C library's memmove for them: in
+// the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
+constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 32 * 1024;
+
+HWY_NOINLINE void copyLongRows(const CopyRows& job) {
+  uint8* dst = job.dst;
+  const uint8* src = job.src;
+  const intptr_t dstStep = job.dstStep;
+  const intptr_t srcStep = job.srcStep;
+  const size_t bytes = job.bytes;
+  for (uint32 y = job.height; y != 0;
+       --y, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep)) {
+    if (bytes <= kMaxOwnBytes) {
+      moveRow(dst, src, bytes);
+    } else {
+      memmove(dst, src, bytes);
+    }
+  }
+}
+
+// Two functions, as the short rows need nothing from the stack and so no alignment of it.
+void copyRows(const CopyRows& job) {
+  if (job.bytes > 2 * kStep) return copyLongRows(job);
+  copyShortRows(kBytes, job);
 }
 
 #endif
@@ -193,7 +267,7 @@ struct RowCopy {
   }
 };
 
-void copyRows(const RowCopy& copy) {
+void copyRectangle(const RowCopy& copy) {
   const bool bottomUp = copy.bottomUp || copy.gainsFromBottomUp();
   const uint32 first = bottomUp ? copy.height - 1 : 0;
   uint8* const d = rowAt(copy.dst, copy.dstPitch, first, 0, 0);
@@ -205,34 +279,36 @@ void copyRows(const RowCopy& copy) {
   if (streams && !overlap(d, s, copy.bytes)) {
     mmxCopyRows(d, dstStep, s, srcStep, copy.bytes, copy.height);
   } else if (copy.isOneMove()) {
-    kernels().copyRows(copy.dst, 0, copy.src, 0, copy.bytes * copy.height, 1);
+    kernels().copyRows({copy.dst, 0, copy.src, 0, copy.bytes * copy.height, 1});
   } else {
-    kernels().copyRows(d, dstStep, s, srcStep, copy.bytes, copy.height);
+    kernels().copyRows({d, dstStep, s, srcStep, copy.bytes, copy.height});
   }
 }
 
 }  // namespace
+
+void copyRows(const CopyRows& rows) { kernels().copyRows(rows); }
 
 void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
               uint32 width, uint32 height) {
   if (bytesPerPixel < 1 || bytesPerPixel > 4) unsupportedPixelSize(kSource);
   const intptr_t step = rowStep(pitch, bytesPerPixel);
   const RowRun run = joinRows(step, size_t{width} * bytesPerPixel, height);
-  kernels().fillRows(rowAt(fb, pitch, y, x, bytesPerPixel), step, run.bytes, run.rows,
-                     repeatPixel(pixel, bytesPerPixel));
+  kernels().fillRows({rowAt(fb, pitch, y, x, bytesPerPixel), step, run.bytes, run.rows,
+                      repeatPixel(pixel, bytesPerPixel)});
 }
 
 void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
               uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
               uint32 width, uint32 height) {
   if (height == 0) return;
-  copyRows({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
-            .dstPitch = dstPitch,
-            .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
-            .srcPitch = srcPitch,
-            .bytes = size_t{width} * bytesPerPixel,
-            .height = height,
-            .bottomUp = dstY > srcY});
+  copyRectangle({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
+                 .dstPitch = dstPitch,
+                 .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
+                 .srcPitch = srcPitch,
+                 .bytes = size_t{width} * bytesPerPixel,
+                 .height = height,
+                 .bottomUp = dstY > srcY});
 }
 
 }  // namespace raster

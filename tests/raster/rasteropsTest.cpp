@@ -189,6 +189,24 @@ TEST(Raster_RectCopy, ShiftsOneRowDownUpAndOnePixelRight) {
   }
 }
 
+TEST(Raster_RectCopy, MovesRowsOfAnyLengthWithinThemselves) {
+  Random random(7);
+  for (const uint32 bytes : {129u, 200u, 257u, 1000u, 5003u, 32768u, 32769u, 262144u, 262145u}) {
+    for (const uint32 distance : {1u, 15u, 64u, 65u, 256u, 300u}) {
+      for (const bool right : {false, true}) {
+        const uint32 from = random.below(64) + (right ? 0 : distance);
+        const uint32 to = right ? from + distance : from - distance;
+        Bytes expected = random.bytes(std::max(from, to) + bytes);
+        GuardedBuffer actual(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+        actual.assign(expected);
+        memmove(&expected[to], &expected[from], bytes);
+        Raster_RectCopy(actual.data(), 0, actual.data(), 0, 1, from, 0, to, 0, bytes, 1);
+        ASSERT_EQ(actual.bytes(), expected) << bytes << " bytes from " << from << " to " << to;
+      }
+    }
+  }
+}
+
 TEST(Raster_RectCopy, GivesTheSamePixelsAroundTheLimitsOfTheCacheBypass) {
   for (const auto& [bytes, rows] :
        {std::array{32u, 16u}, std::array{32u, 15u}, std::array{31u, 16u}, std::array{39u, 40u}}) {
