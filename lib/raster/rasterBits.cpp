@@ -70,6 +70,7 @@ HWY_INLINE void expandGroup(D d, const uint8* bits, uint8* dst, const Patterns& 
   memcpy(&plane, bits, kLanes<D> / 8);
   const auto everywhere = hn::BitCast(d, hn::Set(d64, plane));
   for (size_t i = 0; i < kBytes * kLanes<D>; i += kLanes<D>) {
+    if (i % kCacheLine == 0) fetchAhead(dst + i);
     const auto bit = hn::LoadU(d, kBitOfByte<kBytes>.bit + i);
     const auto byte = hn::TableLookupBytes(everywhere, hn::LoadU(d, kBitOfByte<kBytes>.byte + i));
     const auto clear = hn::LoadU(d, kStencil ? dst + i : patterns.background.bytes + i);

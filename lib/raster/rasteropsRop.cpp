@@ -23,21 +23,39 @@ namespace {
 
 using Bytes = hn::ScalableTag<uint8>;
 
-template <class Rop> void rowsToRight(const RopRows& rows) {
+/// Runs row(dst, src, bytes) from the first row to the last one.
+template <class Row> HWY_INLINE void forRows(const RopRows& rows, const Row& row) {
+  const size_t bytes = rows.bytes;
   uint8* dst = rows.dst;
   const uint8* src = rows.src;
   for (uint32 y = rows.height; y != 0;
-       --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep)) {
-    combineToRight<Rop>(dst, src, rows.bytes);
+       --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep))
+    row(dst, src, bytes);
+}
+
+/// Whether no step of a row reads what an earlier one stored, `ahead` bytes in the direction of the
+/// walk from where it read.
+template <class Rop> bool staysFresh(uintptr_t ahead, size_t bytes) {
+  return !kReadsSrc<Rop> || ahead == 0 || ahead >= bytes;
+}
+
+template <class Rop> void rowsToRight(const RopRows& rows) {
+  const uintptr_t ahead =
+      reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
+  if (staysFresh<Rop>(ahead, rows.bytes)) {
+    forRows(rows, combineFreshToRight<Rop>);
+  } else {
+    forRows(rows, combineToRight<Rop>);
   }
 }
 
 template <class Rop> void rowsToLeft(const RopRows& rows) {
-  uint8* dst = rows.dst;
-  const uint8* src = rows.src;
-  for (uint32 y = rows.height; y != 0;
-       --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep)) {
-    combineToLeft<Rop>(dst, src, rows.bytes);
+  const uintptr_t ahead =
+      reinterpret_cast<uintptr_t>(rows.src) - reinterpret_cast<uintptr_t>(rows.dst);
+  if (staysFresh<Rop>(ahead, rows.bytes)) {
+    forRows(rows, combineFreshToLeft<Rop>);
+  } else {
+    forRows(rows, combineToLeft<Rop>);
   }
 }
 
@@ -71,6 +89,7 @@ void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords
   for (; height != 0; --height, row = nextRow(row, step)) {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
+      for (size_t k = 0; k < 3 * n; k += kCacheLine) fetchAhead(row + i + k);
       block(d, row + i, 0);
       block(d, row + i + n, n);
       block(d, row + i + 2 * n, 2 * n);

@@ -48,28 +48,27 @@ void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t perio
 
 /// Rows are combined in blocks of so many bytes.
 constexpr size_t kBlockBytes = 128;
-constexpr size_t kCacheLine = 64;
 static_assert(kBlockBytes >= 2 * kLanes<Bytes>);
 
-/// Combines a row that is at most a vector long: with the widest lanes that fit, from either end.
-template <class Rop, class D>
-HWY_INLINE void combineShortRow(D d, uint8* dst, const uint8* src, size_t bytes) {
-  constexpr size_t n = kLanes<D>;
-  if (bytes > n) {
-    const auto last = combined<Rop>(d, src + bytes - n, dst + bytes - n);
-    combine<Rop>(d, src, dst);
-    storeLanes(d, last, dst + bytes - n);
-  } else if (bytes == n) {
-    combine<Rop>(d, src, dst);
-  } else if constexpr (n > 1) {
-    combineShortRow<Rop>(hn::Half<D>(), dst, src, bytes);
+/// Combines whole blocks from `dst` to less than a block before `end` with one that repeats.
+/// Returns where it stopped. The block stays in registers.
+template <class Rop>
+HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* pattern) {
+  const Bytes d;
+  constexpr size_t n = kLanes<Bytes>;
+  hn::Vec<Bytes> block[kBlockBytes / n];
+  for (size_t k = 0; k < kBlockBytes; k += n) block[k / n] = loadLanes(d, pattern + k);
+  for (; static_cast<size_t>(end - dst) >= kBlockBytes; dst += kBlockBytes) {
+    for (size_t k = 0; k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
+    for (size_t k = 0; k < kBlockBytes; k += n)
+      storeLanes(d, combinedWith<Rop>(d, block[k / n], dst + k), dst + k);
   }
+  return dst;
 }
 
 /// Combines a row of at least a vector with a pattern that repeats after `period` bytes, at least
 /// a block, and is there for another block. The byte `lastPhase` of the pattern falls on the start
-/// of the row's last vector. The first and the last vector lie across what is stored between them,
-/// at vector boundaries, so they are made before anything is stored.
+/// of the row's last vector.
 template <class Rop>
 HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                                size_t lastPhase) {
@@ -79,6 +78,8 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
   const auto last = combined<Rop>(d, pattern + lastPhase, dst + bytes - n);
   size_t i = n - reinterpret_cast<uintptr_t>(dst) % n;
   size_t phase = i;
+  if (period == kBlockBytes && bytes - i >= kBlockBytes)
+    i = static_cast<size_t>(combineBlocks<Rop>(dst + i, dst + bytes, pattern + phase) - dst);
   for (; bytes - i > kBlockBytes; i += kBlockBytes) {
     for (size_t k = 0; k < kBlockBytes; k += kCacheLine) fetchAhead(dst + i + k);
     for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, pattern + phase + k, dst + i + k);

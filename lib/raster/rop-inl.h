@@ -66,12 +66,16 @@ inline constexpr bool kReadsDst = (kTruthTable<Rop> & 5) != (kTruthTable<Rop> >>
 
 /// What an operation makes of one block of lanes; reads only what it depends on.
 template <class Rop, class D>
-HWY_INLINE hn::Vec<D> combined(D d, const uint8* src, const uint8* dst) {
-  auto s = hn::Zero(d);
+HWY_INLINE hn::Vec<D> combinedWith(D d, hn::Vec<D> s, const uint8* dst) {
   auto t = hn::Zero(d);
-  if constexpr (kReadsSrc<Rop>) s = loadLanes(d, src);
   if constexpr (kReadsDst<Rop>) t = loadLanes(d, dst);
   return Rop{}(s, t);
+}
+template <class Rop, class D>
+HWY_INLINE hn::Vec<D> combined(D d, const uint8* src, const uint8* dst) {
+  auto s = hn::Zero(d);
+  if constexpr (kReadsSrc<Rop>) s = loadLanes(d, src);
+  return combinedWith<Rop>(d, s, dst);
 }
 
 /// Combines one block of lanes.
@@ -79,34 +83,91 @@ template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uin
   storeLanes(d, combined<Rop>(d, src, dst), dst);
 }
 
-/// Rows of fewer bytes are not worth the blocks that bring the stores to vector boundaries.
-inline constexpr size_t kWorthAligning = 8 * kLanes<hn::ScalableTag<uint8>>;
-
 /// Combines a row from left to right, a vector at a time.
 template <class Rop> HWY_INLINE void combineToRight(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d8;
-  const auto block = [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); };
-  const size_t head = (0 - reinterpret_cast<uintptr_t>(dst)) % hn::Lanes(d8);
-  if (head != 0 && bytes >= kWorthAligning) {
-    forLanes(d8, head, block);
-    dst += head;
-    src += head;
-    bytes -= head;
-  }
-  forLanes(d8, bytes, block);
+  forLanes(d8, bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
 }
 
 /// Combines a row from right to left, a vector at a time.
 template <class Rop> HWY_INLINE void combineToLeft(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d8;
-  const size_t tail = (reinterpret_cast<uintptr_t>(dst) + bytes) % hn::Lanes(d8);
-  if (tail != 0 && bytes >= kWorthAligning) {
-    bytes -= tail;
-    forLanesFromRight(d8, tail,
-                      [&](auto d, size_t i) { combine<Rop>(d, src + bytes + i, dst + bytes + i); });
-  }
   forLanesFromRight(d8, bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
 }
+
+// Where no step of a row reads what an earlier one stored, vectors may lie across each other, if
+// each is made before the one that it lies across is stored. So the two at the ends of a row lie
+// where the row does, those between them at vector boundaries, and rows of any length and place
+// take the same few branches.
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <class Rop> void combineFreshToRight(uint8* dst, const uint8* src, size_t bytes) {
+  combineToRight<Rop>(dst, src, bytes);
+}
+template <class Rop> void combineFreshToLeft(uint8* dst, const uint8* src, size_t bytes) {
+  combineToLeft<Rop>(dst, src, bytes);
+}
+
+#else
+
+/// Combines a row that is at most a vector long: with the widest lanes that fit, from either end.
+template <class Rop, class D>
+HWY_INLINE void combineShortRow(D d, uint8* dst, const uint8* src, size_t bytes) {
+  constexpr size_t n = kLanes<D>;
+  if (bytes > n) {
+    const auto first = combined<Rop>(d, src, dst);
+    const auto last = combined<Rop>(d, src + bytes - n, dst + bytes - n);
+    storeLanes(d, first, dst);
+    storeLanes(d, last, dst + bytes - n);
+  } else if (bytes == n) {
+    combine<Rop>(d, src, dst);
+  } else if constexpr (n > 1) {
+    combineShortRow<Rop>(hn::Half<D>(), dst, src, bytes);
+  }
+}
+
+/// combineToRight where no step reads what an earlier one stored.
+template <class Rop>
+HWY_INLINE void combineFreshToRight(uint8* dst, const uint8* src, size_t bytes) {
+  const hn::ScalableTag<uint8> d;
+  constexpr size_t n = kLanes<decltype(d)>;
+  if (bytes <= n) return combineShortRow<Rop>(d, dst, src, bytes);
+  const size_t lastAt = bytes - n;
+  const auto last = combined<Rop>(d, src + lastAt, dst + lastAt);
+  auto block = combined<Rop>(d, src, dst);
+  size_t at = 0;
+  for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < lastAt; i += n) {
+    const auto next = combined<Rop>(d, src + i, dst + i);
+    storeLanes(d, block, dst + at);
+    block = next;
+    at = i;
+  }
+  storeLanes(d, block, dst + at);
+  storeLanes(d, last, dst + lastAt);
+}
+
+/// combineToLeft where no step reads what an earlier one stored.
+template <class Rop>
+HWY_INLINE void combineFreshToLeft(uint8* dst, const uint8* src, size_t bytes) {
+  const hn::ScalableTag<uint8> d;
+  constexpr size_t n = kLanes<decltype(d)>;
+  if (bytes <= n) return combineShortRow<Rop>(d, dst, src, bytes);
+  const auto first = combined<Rop>(d, src, dst);
+  size_t at = bytes - n;
+  auto block = combined<Rop>(d, src + at, dst + at);
+  for (size_t end = bytes - 1 - (reinterpret_cast<uintptr_t>(dst) + bytes - 1) % n; end > n;
+       end -= n) {
+    const auto next = combined<Rop>(d, src + end - n, dst + end - n);
+    storeLanes(d, block, dst + at);
+    block = next;
+    at = end - n;
+  }
+  storeLanes(d, block, dst + at);
+  storeLanes(d, first, dst);
+}
+
+#endif
 
 /// A table by code of what `entry` makes of each operation.
 template <class Entry> constexpr auto ropTable(Entry entry) {

@@ -49,6 +49,9 @@ template <class D> HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) 
 #endif
 }
 
+/// What fetchAhead asks for at once.
+inline constexpr size_t kCacheLine = 64;
+
 /// Asks for the memory that a loop over a long row comes to soon: processors do not fetch far ahead
 /// of stores by themselves. It is only a hint, so the end of the row does not matter.
 HWY_INLINE void fetchAhead(const uint8* at) {
