@@ -105,13 +105,13 @@ HWY_INLINE void putCount(uint8* code, EncoderProgress& at, size_t count) {
   putWord(code, at.out++, static_cast<uint32>(count));
 }
 
-/// Encodes literals up to a pair, and the run that it begins.
+/// Encodes literals up to a pair, and the run that it begins. A code that has become as long as the
+/// pixels is given up by the caller.
 void encodeStep(const uint8* src, size_t total, uint8* code, EncoderProgress& at) {
   const size_t most = std::min(total - at.in - 1, total - at.out);
   const size_t literals = copyUpToPair(src + 4 * at.in, code + 4 * at.out, most, most);
   at.in += literals;
   at.out += literals;
-  if (at.out == total) return;
   const uint32 pixel = wordAt(src, at.in++);
   putWord(code, at.out++, pixel);
   if (literals == most) return;
