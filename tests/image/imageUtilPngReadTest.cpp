@@ -32,6 +32,7 @@ struct Interposed {
   bool failInfoStruct = false;
   bool failFileSize = false;
   bool failFileRead = false;
+  size_t unreported = 0;  // bytes that FileIO_Read reads but does not count
   int closedFiles = 0;
 } interposed;
 
@@ -68,7 +69,9 @@ FileIOResult FileIO_Read(const FileIODescriptor* file, void* bytes, size_t size,
     if (actual != nullptr) *actual = size;
     return FILEIO_ERROR;
   }
-  return next<decltype(&FileIO_Read)>("FileIO_Read")(file, bytes, size, actual);
+  const auto result = next<decltype(&FileIO_Read)>("FileIO_Read")(file, bytes, size, actual);
+  if (actual != nullptr) *actual -= interposed.unreported;
+  return result;
 }
 
 FileIOResult FileIO_Close(FileIODescriptor* file) {
@@ -248,6 +251,17 @@ TEST_F(ImageUtil_ReadPNGBuffer, UnpacksPalettesOfOneTwoAndFourBitsToBytes) {
     EXPECT_EQ(decoded.image.numColors, 1u << bits);
     expectPixels(decoded.image, p, false);
   }
+}
+
+TEST_F(ImageUtil_ReadPNGBuffer, GivesLibpngNoReasonToWarnOfInterlacing) {
+  Random random(17);
+  PngPicture p = noise(random, 7, 5, PNG_COLOR_TYPE_PALETTE, 4);
+  p.interlace = PNG_INTERLACE_ADAM7;
+  testing::internal::CaptureStderr();
+  const Decoded decoded(makePng(p));
+  EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+  ASSERT_TRUE(decoded.result);
+  expectPixels(decoded.image, p, false);
 }
 
 TEST_F(ImageUtil_ReadPNGBuffer, TakesTheNumberOfColorsFromThePaletteChunk) {
@@ -554,6 +568,16 @@ TEST_F(ImageUtil_ReadPNG, FailsAtEveryLengthOfATruncatedFile) {
       ASSERT_TRUE(readsAsFile(png));
     }
   }
+}
+
+TEST_F(ImageUtil_ReadPNG, EndsWithTheBytesThatWereReadWhateverFollowsThem) {
+  const WithoutStandardError quiet;
+  Random random(16);
+  const Bytes png = makePng(noise(random, 5, 4, PNG_COLOR_TYPE_RGB, 8));
+  for (interposed.unreported = 1; interposed.unreported < png.size(); ++interposed.unreported)
+    ASSERT_FALSE(readsAsFile(png)) << "but for " << interposed.unreported << " bytes";
+  interposed.unreported = 0;
+  EXPECT_TRUE(readsAsFile(png));
 }
 
 TEST_F(ImageUtil_ReadPNG, SurvivesRandomDamage) {
