@@ -10,6 +10,9 @@
 #define RASTER_BLEND_MEMORY_INL_H
 #endif
 
+#include <algorithm>
+#include <type_traits>
+
 #include "rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -44,18 +47,29 @@ HWY_INLINE void storePart(D d, hn::Vec<D> lanes, uint8* block, WholeBlock /*part
 struct FirstPixels {
   size_t count;
 };
+
+/// What a mask counts: pixels, or bytes of pixels of three. Fewer bits are quicker to find.
+template <size_t kBytes>
+using MaskUnit =
+    std::conditional_t<kBytes == 4, uint32, std::conditional_t<kBytes == 2, uint16, uint8>>;
+
 template <size_t kBytes, class D>
 HWY_INLINE hn::Vec<D> loadPart(D d, const uint8* block, size_t offset, FirstPixels part) {
-  const hn::Repartition<uint8, D> d8;
-  const size_t bytes = part.count * kBytes;
-  if (offset > bytes) offset = bytes;
-  const auto lanes = hn::MaskedLoad(hn::FirstN(d8, bytes - offset), d8, block + offset);
-  return inRegister(hn::BitCast(d, lanes));
+  using Unit = MaskUnit<kBytes>;
+  const hn::Repartition<Unit, D> units;
+  const size_t count = part.count * kBytes / sizeof(Unit);
+  const size_t first = std::min(offset / sizeof(Unit), count);
+  const void* from = block + first * sizeof(Unit);
+  const auto mask = hn::FirstN(units, count - first);
+  return inRegister(hn::BitCast(d, hn::MaskedLoad(mask, units, static_cast<const Unit*>(from))));
 }
 template <size_t kBytes, class D>
 HWY_INLINE void storePart(D d, hn::Vec<D> lanes, uint8* block, FirstPixels part) {
-  const hn::Repartition<uint8, D> d8;
-  hn::BlendedStore(hn::BitCast(d8, lanes), hn::FirstN(d8, part.count * kBytes), d8, block);
+  using Unit = MaskUnit<kBytes>;
+  const hn::Repartition<Unit, D> units;
+  void* const to = block;
+  const auto mask = hn::FirstN(units, part.count * kBytes / sizeof(Unit));
+  hn::BlendedStore(hn::BitCast(units, lanes), mask, units, static_cast<Unit*>(to));
 }
 
 #endif
