@@ -62,19 +62,35 @@ struct Patterns {
   PixelPattern background;
 };
 
+/// The bits for as many pixels as `d` has lanes, repeated over the vector. They are loaded at their
+/// own width: put together in memory first, they would be waited for.
+template <class D> HWY_INLINE hn::Vec<D> planeBits(D d, const uint8* bits) {
+  using Unit = std::conditional_t<kLanes<D> == 8, uint8,
+                                  std::conditional_t<kLanes<D> == 16, uint16, uint32>>;
+  const hn::Repartition<Unit, D> units;
+  const auto unitAt = [&](size_t i) HWY_ATTR {
+    Unit unit;
+    memcpy(&unit, bits + i * sizeof unit, sizeof unit);
+    return hn::Set(units, unit);
+  };
+  if constexpr (kLanes<D> == 64)
+    return hn::BitCast(d, hn::OddEven(unitAt(1), unitAt(0)));
+  else
+    return hn::BitCast(d, unitAt(0));
+}
+
 /// Expands as many pixels as `d` has lanes, which takes kBytes vectors.
 template <unsigned kBytes, bool kStencil, class D>
 HWY_INLINE void expandGroup(D d, const uint8* bits, uint8* dst, const Patterns& patterns) {
-  const hn::Repartition<uint64, D> d64;
-  uint64 plane = 0;
-  memcpy(&plane, bits, kLanes<D> / 8);
-  const auto everywhere = hn::BitCast(d, hn::Set(d64, plane));
+  const auto everywhere = planeBits(d, bits);
   for (size_t i = 0; i < kBytes * kLanes<D>; i += kLanes<D>) {
     if (i % kCacheLine == 0) fetchAhead(dst + i);
-    const auto bit = hn::LoadU(d, kBitOfByte<kBytes>.bit + i);
+    const size_t ofPixel = kBytes == 3 ? i : 0;
+    const size_t ofByte = kBytes == 3 ? i : i % (8 * kBytes);
+    const auto bit = hn::LoadU(d, kBitOfByte<kBytes>.bit + ofByte);
     const auto byte = hn::TableLookupBytes(everywhere, hn::LoadU(d, kBitOfByte<kBytes>.byte + i));
-    const auto clear = hn::LoadU(d, kStencil ? dst + i : patterns.background.bytes + i);
-    const auto set = hn::LoadU(d, patterns.foreground.bytes + i);
+    const auto clear = hn::LoadU(d, kStencil ? dst + i : patterns.background.bytes + ofPixel);
+    const auto set = hn::LoadU(d, patterns.foreground.bytes + ofPixel);
     hn::StoreU(hn::IfThenElse(hn::TestBit(byte, bit), set, clear), d, dst + i);
   }
 }

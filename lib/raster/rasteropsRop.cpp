@@ -61,8 +61,8 @@ template <class Rop> void rowsToLeft(const RopRows& rows) {
 
 #if HWY_TARGET == HWY_SCALAR
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords keep,
-              PixelWords flip) {
+void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
+              const PixelWords& flip) {
   for (; height != 0; --height, row = nextRow(row, step)) {
     for (size_t i = 0; i < bytes; i += sizeof keep) {
       const size_t count = bytes - i < sizeof keep ? bytes - i : sizeof keep;
@@ -76,8 +76,8 @@ void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords
 
 #else
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords keep,
-              PixelWords flip) {
+void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
+              const PixelWords& flip) {
   const Bytes d;
   const size_t n = hn::Lanes(d);
   const PixelPattern keeps = patternOf(keep);

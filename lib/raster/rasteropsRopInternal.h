@@ -36,8 +36,8 @@ struct RopKernels {
   /// A kernel handles at most so many bytes of a row before it stores them.
   size_t stepBytes;
   /// d = d & keep ^ flip.
-  void (*fillRows)(uint8* row, intptr_t step, size_t bytes, uint32 height, PixelWords keep,
-                   PixelWords flip);
+  void (*fillRows)(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
+                   const PixelWords& flip);
   /// By operation. Rows are walked to the right, or to the left.
   const RopRowsKernel* toRight;
   const RopRowsKernel* toLeft;
