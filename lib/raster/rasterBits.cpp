@@ -79,12 +79,13 @@ template <class D> HWY_INLINE hn::Vec<D> planeBits(D d, const uint8* bits) {
     return hn::BitCast(d, unitAt(0));
 }
 
-/// Expands as many pixels as `d` has lanes, which takes kBytes vectors.
-template <unsigned kBytes, bool kStencil, class D>
+/// Expands as many pixels as `d` has lanes, which takes kBytes vectors. `far` ones are fetched
+/// ahead.
+template <unsigned kBytes, bool kStencil, bool kFar, class D>
 HWY_INLINE void expandGroup(D d, const uint8* bits, uint8* dst, const Patterns& patterns) {
   const auto everywhere = planeBits(d, bits);
   for (size_t i = 0; i < kBytes * kLanes<D>; i += kLanes<D>) {
-    if (i % kCacheLine == 0) fetchAhead(dst + i);
+    if (kFar && i % kCacheLine == 0) fetchAhead(dst + i);
     const size_t ofPixel = kBytes == 3 ? i : 0;
     const size_t ofByte = kBytes == 3 ? i : i % (8 * kBytes);
     const auto bit = hn::LoadU(d, kBitOfByte<kBytes>.bit + ofByte);
@@ -97,28 +98,38 @@ HWY_INLINE void expandGroup(D d, const uint8* bits, uint8* dst, const Patterns& 
 
 /// Expands the pixels of a row from `x` on in groups of the lanes of `d` and then of smaller ones;
 /// returns the first pixel that is left.
-template <unsigned kBytes, bool kStencil, class D>
+template <unsigned kBytes, bool kStencil, bool kFar, class D>
 HWY_INLINE size_t expandGroups(D d, const uint8* bits, uint8* dst, size_t x, size_t width,
                                const Patterns& patterns) {
   for (; width - x >= kLanes<D>; x += kLanes<D>)
-    expandGroup<kBytes, kStencil>(d, bits + x / 8, dst + x * kBytes, patterns);
+    expandGroup<kBytes, kStencil, kFar>(d, bits + x / 8, dst + x * kBytes, patterns);
   if constexpr (kLanes < D >> 8) {
     if (width - x >= 8)
-      x = expandGroups<kBytes, kStencil>(hn::Half<D>(), bits, dst, x, width, patterns);
+      x = expandGroups<kBytes, kStencil, false>(hn::Half<D>(), bits, dst, x, width, patterns);
   }
   return x;
 }
 
-template <unsigned kBytes, bool kStencil>
-void expandRows(const Expansion& e, const BitColors& colors) {
+template <unsigned kBytes, bool kStencil, bool kFar>
+HWY_INLINE void expandRowsFrom(const Expansion& e, const BitColors& colors) {
   const Patterns patterns = {patternOf(repeatPixel(colors.foreground, kBytes)),
                              patternOf(repeatPixel(colors.background, kBytes))};
   const uint8* bits = e.bits;
   uint8* dst = e.dst;
   for (uint32 y = e.height; y != 0;
        --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch)) {
-    const size_t x = expandGroups<kBytes, kStencil>(Bytes(), bits, dst, 0, e.width, patterns);
+    const size_t x = expandGroups<kBytes, kStencil, kFar>(Bytes(), bits, dst, 0, e.width, patterns);
     expandOneByOne<kBytes, kStencil>(bits, dst, x, e.width, colors);
+  }
+}
+
+template <unsigned kBytes, bool kStencil>
+void expandRows(const Expansion& e, const BitColors& colors) {
+  constexpr bool kMayBeFar = kBytes > 1;  // pixels of one byte come slowly enough as it is
+  if (kMayBeFar && isFar(e.width * kBytes, e.height)) {
+    expandRowsFrom<kBytes, kStencil, kMayBeFar>(e, colors);
+  } else {
+    expandRowsFrom<kBytes, kStencil, false>(e, colors);
   }
 }
 

@@ -26,7 +26,7 @@ using Copy = std::remove_const_t<decltype(kCopy)>;
 constexpr size_t kBlockBytes = 1024;
 
 /// Combines a row with a source of the same length.
-template <class Rop> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+template <class Rop, bool kFar> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   combineToRight<Rop>(dst, src, bytes);
 }
 
@@ -37,7 +37,7 @@ void repeatShortRow(Bytes /*d*/, uint8* dst, const uint8* src, size_t period, si
 }
 
 /// Combines a row with a pattern that repeats after `period` bytes.
-template <class Rop>
+template <class Rop, bool kFar>
 void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                     size_t /*lastPhase*/) {
   for (size_t i = 0; i != bytes; i += std::min(bytes - i, period))
@@ -51,15 +51,15 @@ constexpr size_t kBlockBytes = 128;
 static_assert(kBlockBytes >= 2 * kLanes<Bytes>);
 
 /// Combines whole blocks from `dst` to less than a block before `end` with one that repeats.
-/// Returns where it stopped. The block stays in registers.
-template <class Rop>
+/// Returns where it stopped. The block stays in registers. With kFar, memory is fetched ahead.
+template <class Rop, bool kFar>
 HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* pattern) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   hn::Vec<Bytes> block[kBlockBytes / n];
   for (size_t k = 0; k < kBlockBytes; k += n) block[k / n] = loadLanes(d, pattern + k);
   for (; static_cast<size_t>(end - dst) >= kBlockBytes; dst += kBlockBytes) {
-    for (size_t k = 0; k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
+    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
     for (size_t k = 0; k < kBlockBytes; k += n)
       storeLanes(d, combinedWith<Rop>(d, block[k / n], dst + k), dst + k);
   }
@@ -69,32 +69,37 @@ HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* patte
 /// Combines a row of at least a vector with a pattern that repeats after `period` bytes, at least
 /// a block, and is there for another block. The byte `lastPhase` of the pattern falls on the start
 /// of the row's last vector.
-template <class Rop>
+template <class Rop, bool kFar>
 HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                                size_t lastPhase) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   const auto first = combined<Rop>(d, pattern, dst);
   const auto last = combined<Rop>(d, pattern + lastPhase, dst + bytes - n);
-  size_t i = n - reinterpret_cast<uintptr_t>(dst) % n;
-  size_t phase = i;
-  if (period == kBlockBytes && bytes - i >= kBlockBytes)
-    i = static_cast<size_t>(combineBlocks<Rop>(dst + i, dst + bytes, pattern + phase) - dst);
-  for (; bytes - i > kBlockBytes; i += kBlockBytes) {
-    for (size_t k = 0; k < kBlockBytes; k += kCacheLine) fetchAhead(dst + i + k);
-    for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, pattern + phase + k, dst + i + k);
-    phase += kBlockBytes;
-    if (phase >= period) phase -= period;
+  uint8* const end = dst + bytes;
+  const size_t phase = n - reinterpret_cast<uintptr_t>(dst) % n;
+  uint8* at = dst + phase;
+  const uint8* source = pattern + phase;
+  const uint8* const wrap = pattern + period;
+  const auto left = [&] { return static_cast<size_t>(end - at); };
+  if (period == kBlockBytes && left() >= kBlockBytes)
+    at = combineBlocks<Rop, kFar>(at, end, source);
+  for (; left() > kBlockBytes; at += kBlockBytes) {
+    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(at + k);
+    for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, source + k, at + k);
+    source += kBlockBytes;
+    if (source >= wrap) source -= period;
   }
-  for (; bytes - i > n; i += n, phase += n) combine<Rop>(d, pattern + phase, dst + i);
+  for (; left() > n; at += n, source += n) combine<Rop>(d, source, at);
   storeLanes(d, first, dst);
   storeLanes(d, last, dst + bytes - n);
 }
 
 /// Combines a row with a source of the same length.
-template <class Rop> HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+template <class Rop, bool kFar>
+HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   if (bytes > kLanes<Bytes>) {
-    combinePeriods<Rop>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
+    combinePeriods<Rop, kFar>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
   } else {
     combineShortRow<Rop>(Bytes(), dst, src, bytes);
   }
@@ -147,7 +152,8 @@ template <class Rop> void tileRows(const TileRows& t) {
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   for (uint32 y = t.height; y != 0; --y, dst = nextRow(dst, t.dstStep)) {
-    tileRow(dst, rowAt(t.src, t.srcStep, srcY, 0, 0), t.bytes, t.period, t.phase, combineRow<Rop>);
+    tileRow(dst, rowAt(t.src, t.srcStep, srcY, 0, 0), t.bytes, t.period, t.phase,
+            combineRow<Rop, true>);
     srcY = srcY + 1 == t.srcRows ? 0 : srcY + 1;
   }
 }
@@ -208,7 +214,7 @@ HWY_NOINLINE void widenRows(const uint8* src, intptr_t srcStep, size_t period, u
 }
 
 /// Combines rows with `wideRows` widened ones, from the one with the number `y` on.
-template <class Rop>
+template <class Rop, bool kFar>
 HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, uint32 height,
                                   const uint8* wide, size_t wideStep, uint32 wideRows, uint32 y,
                                   size_t period) {
@@ -218,9 +224,9 @@ HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, ui
   const size_t lastPhase = bytes <= n ? 0 : period == bytes ? bytes - n : (bytes - n) % period;
   for (; height != 0; --height, dst = nextRow(dst, dstStep)) {
     if (bytes <= n) {
-      combineRow<Rop>(dst, pattern, bytes);
+      combineRow<Rop, kFar>(dst, pattern, bytes);
     } else {
-      combinePeriods<Rop>(dst, pattern, bytes, period, lastPhase);
+      combinePeriods<Rop, kFar>(dst, pattern, bytes, period, lastPhase);
     }
     pattern += wideStep;
     if (pattern == end) pattern = wide;
@@ -235,6 +241,8 @@ template <class Rop> void tileWidened(const TileRows& t) {
   const size_t bytes = t.height / 2 >= t.srcRows ? kBufferBytes : kBufferBytes / 4;
   const auto room = static_cast<uint32>((bytes - kLongestVector) / w.step);
   const bool all = t.srcRows <= room && t.srcRows <= t.height;
+  const auto combineRows =
+      isFar(t.bytes, t.height) ? combineWideRows<Rop, true> : combineWideRows<Rop, false>;
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   uint32 height = t.height;
@@ -245,8 +253,8 @@ template <class Rop> void tileWidened(const TileRows& t) {
     // The rows of the buffer lie to vector boundaries as those of the destination do.
     uint8* wide = buffer + (reinterpret_cast<uintptr_t>(dst) - w.start) % kLongestVector;
     widenRows(rowAt(t.src, t.srcStep, first, 0, 0), t.srcStep, t.period, rows, w, wide);
-    combineWideRows<Rop>(dst, t.dstStep, t.bytes, slice, wide + w.start, w.step, rows, srcY - first,
-                         w.period);
+    combineRows(dst, t.dstStep, t.bytes, slice, wide + w.start, w.step, rows, srcY - first,
+                w.period);
     dst = rowAt(dst, t.dstStep, slice, 0, 0);
     srcY = srcY + slice == t.srcRows ? 0 : srcY + slice;
     height -= slice;

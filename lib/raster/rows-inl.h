@@ -52,6 +52,12 @@ template <class D> HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) 
 /// What fetchAhead asks for at once.
 inline constexpr size_t kCacheLine = 64;
 
+/// Whether rows are together too much for the inner caches, so that it pays to fetch ahead.
+HWY_INLINE bool isFar(size_t bytes, uint32 height) {
+  constexpr uint64 kInnerCaches = uint64{512} * 1024;
+  return uint64{bytes} * height >= kInnerCaches;
+}
+
 /// Asks for the memory that a loop over a long row comes to soon: processors do not fetch far ahead
 /// of stores by themselves. It is only a hint, so the end of the row does not matter.
 HWY_INLINE void fetchAhead(const uint8* at) {
