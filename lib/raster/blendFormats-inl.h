@@ -239,7 +239,8 @@ struct Bytes3 : WholeBytes {
     return loadPart<kBytes>(Lanes(), at, 0, part);
   }
   static HWY_INLINE Vector loadQuarters(const uint8* at, WholeBlock /*part*/) {
-    return loadQuarters(at, FirstPixels{kLanes<Lanes>});
+    constexpr size_t kWords = kLanes<Lanes> / 4 * 3;
+    return loadPart<sizeof(uint32)>(Lanes(), at, 0, FirstPixels{kWords});
   }
   static HWY_INLINE void storeQuarters(Vector v, uint8* at, FirstPixels part) {
     storePart<kBytes>(Lanes(), v, at, part);
