@@ -23,15 +23,46 @@ namespace {
 
 using Bytes = hn::ScalableTag<uint8>;
 
-/// Runs row(dst, src, bytes) from the first row to the last one.
+/// Runs row(dst, src, bytes) from the first row to the last one. The steps of several rows are
+/// equal: one register less.
 template <class Row> HWY_INLINE void forRows(const RopRows& rows, const Row& row) {
   const size_t bytes = rows.bytes;
+  const intptr_t step = rows.dstStep;
   uint8* dst = rows.dst;
   const uint8* src = rows.src;
-  for (uint32 y = rows.height; y != 0;
-       --y, dst = nextRow(dst, rows.dstStep), src = nextRow(src, rows.srcStep))
+  for (uint32 y = rows.height; y != 0; --y, dst = nextRow(dst, step), src = nextRow(src, step))
     row(dst, src, bytes);
 }
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <class Rop> void freshRowsToRight(const RopRows& rows) {
+  forRows(rows, combineToRight<Rop>);
+}
+template <class Rop> void freshRowsToLeft(const RopRows& rows) {
+  forRows(rows, combineToLeft<Rop>);
+}
+
+#else
+
+/// Where no step of a row reads what an earlier one stored: short rows in a loop of their own.
+template <class Rop, class LongRow>
+HWY_INLINE void freshRows(const RopRows& rows, const LongRow& combineLong) {
+  if (rows.bytes > 2 * kLanes<Bytes>) {
+    forRows(rows, combineLong);
+  } else {
+    withShortRow(Bytes(), rows.bytes, CombinedAt<Rop>(),
+                 [&](auto row) HWY_ATTR { forRows(rows, row); });
+  }
+}
+template <class Rop> HWY_INLINE void freshRowsToRight(const RopRows& rows) {
+  freshRows<Rop>(rows, combineLongToRight<Rop>);
+}
+template <class Rop> HWY_INLINE void freshRowsToLeft(const RopRows& rows) {
+  freshRows<Rop>(rows, combineLongToLeft<Rop>);
+}
+
+#endif
 
 /// Whether no step of a row reads what an earlier one stored, `ahead` bytes in the direction of the
 /// walk from where it read.
@@ -43,7 +74,7 @@ template <class Rop> void rowsToRight(const RopRows& rows) {
   const uintptr_t ahead =
       reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
   if (staysFresh<Rop>(ahead, rows.bytes)) {
-    forRows(rows, combineFreshToRight<Rop>);
+    freshRowsToRight<Rop>(rows);
   } else {
     forRows(rows, combineToRight<Rop>);
   }
@@ -53,7 +84,7 @@ template <class Rop> void rowsToLeft(const RopRows& rows) {
   const uintptr_t ahead =
       reinterpret_cast<uintptr_t>(rows.src) - reinterpret_cast<uintptr_t>(rows.dst);
   if (staysFresh<Rop>(ahead, rows.bytes)) {
-    forRows(rows, combineFreshToLeft<Rop>);
+    freshRowsToLeft<Rop>(rows);
   } else {
     forRows(rows, combineToLeft<Rop>);
   }
@@ -76,26 +107,49 @@ void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const Pixe
 
 #else
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
-              const PixelWords& flip) {
+/// d = d & keep ^ flip.
+struct FillPatterns {
+  PixelPattern keep;
+  PixelPattern flip;
+
+  /// The lanes at an offset of a row, and of the patterns.
+  template <class D>
+  HWY_INLINE hn::Vec<D> operator()(D d, const uint8* /*src*/, const uint8* dst, size_t at) const {
+    const auto kept = hn::And(loadLanes(d, dst + at), loadLanes(d, keep.bytes + at));
+    return hn::Xor(kept, loadLanes(d, flip.bytes + at));
+  }
+};
+
+/// Fills rows of more than two vectors.
+HWY_NOINLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 height,
+                               const PixelWords& keep, const PixelWords& flip) {
+  const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
   const Bytes d;
-  const size_t n = hn::Lanes(d);
-  const PixelPattern keeps = patternOf(keep);
-  const PixelPattern flips = patternOf(flip);
-  const auto block = [&](auto tag, uint8* at, size_t phase) HWY_ATTR {
-    const auto kept = hn::And(loadLanes(tag, at), loadLanes(tag, keeps.bytes + phase));
-    storeLanes(tag, hn::Xor(kept, loadLanes(tag, flips.bytes + phase)), at);
-  };
+  constexpr size_t n = kLanes<Bytes>;
+  const auto fill = [&](auto tag, uint8* dst, size_t at)
+                        HWY_ATTR { storeLanes(tag, filledAt(tag, nullptr, dst, at), dst + at); };
   for (; height != 0; --height, row = nextRow(row, step)) {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
       for (size_t k = 0; k < 3 * n; k += kCacheLine) fetchAhead(row + i + k);
-      block(d, row + i, 0);
-      block(d, row + i + n, n);
-      block(d, row + i + 2 * n, 2 * n);
+      fill(d, row + i, 0);
+      fill(d, row + i, n);
+      fill(d, row + i, 2 * n);
     }
-    forLanes(d, bytes - i, [&](auto tag, size_t k) { block(tag, row + i + k, k); });
+    forLanes(d, bytes - i, [&](auto tag, size_t k) HWY_ATTR { fill(tag, row + i, k); });
   }
+}
+
+void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
+              const PixelWords& flip) {
+  if (bytes > 2 * kLanes<Bytes>) {
+    fillLongRows(row, step, bytes, height, keep, flip);
+    return;
+  }
+  const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
+  withShortRow(Bytes(), bytes, filledAt, [&](auto shortRow) HWY_ATTR {
+    for (uint32 y = height; y != 0; --y, row = nextRow(row, step)) shortRow(row, nullptr, bytes);
+  });
 }
 
 #endif

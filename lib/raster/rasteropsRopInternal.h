@@ -28,7 +28,8 @@ struct RopRows {
   uint32 height;
 };
 
-/// Runs over rows of one instruction-set level, from the first row to the last one.
+/// Runs over rows of one instruction-set level, from the first row to the last one. Where there is
+/// more than one row, both steps are equal.
 using RopRowsKernel = void (*)(const RopRows& rows);
 
 /// What the kernels of one instruction-set level offer.

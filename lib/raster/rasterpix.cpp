@@ -101,7 +101,8 @@ HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   if (bytes > kLanes<Bytes>) {
     combinePeriods<Rop, kFar>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
   } else {
-    combineShortRow<Rop>(Bytes(), dst, src, bytes);
+    withShortRow(Bytes(), bytes, CombinedAt<Rop>(),
+                 [&](auto row) HWY_ATTR { row(dst, src, bytes); });
   }
 }
 

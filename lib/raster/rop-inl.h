@@ -100,39 +100,41 @@ template <class Rop> HWY_INLINE void combineToLeft(uint8* dst, const uint8* src,
 // where the row does, those between them at vector boundaries, and rows of any length and place
 // take the same few branches.
 
-#if HWY_TARGET == HWY_SCALAR
+#if HWY_TARGET != HWY_SCALAR
 
-template <class Rop> void combineFreshToRight(uint8* dst, const uint8* src, size_t bytes) {
-  combineToRight<Rop>(dst, src, bytes);
-}
-template <class Rop> void combineFreshToLeft(uint8* dst, const uint8* src, size_t bytes) {
-  combineToLeft<Rop>(dst, src, bytes);
-}
+/// What an operation makes of the lanes at an offset of a row.
+template <class Rop> struct CombinedAt {
+  template <class D>
+  HWY_INLINE hn::Vec<D> operator()(D d, const uint8* src, const uint8* dst, size_t at) const {
+    return combined<Rop>(d, src + at, dst + at);
+  }
+};
 
-#else
-
-/// Combines a row that is at most a vector long: with the widest lanes that fit, from either end.
-template <class Rop, class D>
-HWY_INLINE void combineShortRow(D d, uint8* dst, const uint8* src, size_t bytes) {
+/// Calls body(row), where row(dst, src, bytes) combines rows of `bytes`, at most two vectors: with
+/// the widest lanes that fit, from either end. combinedAt(tag, src, dst, offset) makes the lanes.
+template <class D, class CombinedAt, class Body>
+HWY_INLINE void withShortRow(D d, size_t bytes, const CombinedAt& combinedAt, const Body& body) {
   constexpr size_t n = kLanes<D>;
   if (bytes > n) {
-    const auto first = combined<Rop>(d, src, dst);
-    const auto last = combined<Rop>(d, src + bytes - n, dst + bytes - n);
-    storeLanes(d, first, dst);
-    storeLanes(d, last, dst + bytes - n);
+    body([&, d](uint8* dst, const uint8* src, size_t size) HWY_ATTR {
+      const auto first = combinedAt(d, src, dst, 0);
+      const auto last = combinedAt(d, src, dst, size - n);
+      storeLanes(d, first, dst);
+      storeLanes(d, last, dst + size - n);
+    });
   } else if (bytes == n) {
-    combine<Rop>(d, src, dst);
+    body([&, d](uint8* dst, const uint8* src, size_t)
+             HWY_ATTR { storeLanes(d, combinedAt(d, src, dst, 0), dst); });
   } else if constexpr (n > 1) {
-    combineShortRow<Rop>(hn::Half<D>(), dst, src, bytes);
+    withShortRow(hn::Half<D>(), bytes, combinedAt, body);
   }
 }
 
-/// combineToRight where no step reads what an earlier one stored.
+/// combineToRight where no step reads what an earlier one stored, for rows longer than a vector.
 template <class Rop>
-HWY_INLINE void combineFreshToRight(uint8* dst, const uint8* src, size_t bytes) {
+HWY_INLINE void combineLongToRight(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d;
   constexpr size_t n = kLanes<decltype(d)>;
-  if (bytes <= n) return combineShortRow<Rop>(d, dst, src, bytes);
   const size_t lastAt = bytes - n;
   const auto last = combined<Rop>(d, src + lastAt, dst + lastAt);
   auto block = combined<Rop>(d, src, dst);
@@ -147,12 +149,10 @@ HWY_INLINE void combineFreshToRight(uint8* dst, const uint8* src, size_t bytes) 
   storeLanes(d, last, dst + lastAt);
 }
 
-/// combineToLeft where no step reads what an earlier one stored.
-template <class Rop>
-HWY_INLINE void combineFreshToLeft(uint8* dst, const uint8* src, size_t bytes) {
+/// combineToLeft where no step reads what an earlier one stored, for rows longer than a vector.
+template <class Rop> HWY_INLINE void combineLongToLeft(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d;
   constexpr size_t n = kLanes<decltype(d)>;
-  if (bytes <= n) return combineShortRow<Rop>(d, dst, src, bytes);
   const auto first = combined<Rop>(d, src, dst);
   size_t at = bytes - n;
   auto block = combined<Rop>(d, src + at, dst + at);
