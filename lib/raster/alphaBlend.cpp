@@ -10,7 +10,6 @@
 
 #include "panicPlace.h"
 #include "raster.h"
-#include "rasteropsInternal.h"
 
 namespace raster {
 namespace {
@@ -135,34 +134,27 @@ void blendInPlace(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel
   blend(rect, bytes, kernel);
 }
 
-/// Rows of fewer bytes are quicker to blend when they are copied next to each other first.
-constexpr size_t kLongRow = 256;
-
-/// Copies rows by blocks.
-void copyRows(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, size_t bytes,
-              uint32 rows) {
-  if (bytes >= kLongRow) {
-    blendStageKernels().copyRows(to, toStep, from, fromStep, bytes, rows);
-  } else {
-    rectCopy(to, toStep, from, fromStep, 1, 0, 0, 0, 0, static_cast<uint32>(bytes), rows);
-  }
+/// How far apart the buffer holds rows: whole cache lines, so that what is stored at the end of one
+/// is not waited for at the start of the next.
+constexpr size_t stageStep(size_t span) {
+  constexpr size_t kLine = 64;
+  return (span + kLine - 1) & ~(kLine - 1);
 }
 
-/// Blends rows through a buffer that holds them. A kernel that reads long rows as a block copy does
+/// Blends rows through a buffer that holds them. A kernel that reads rows as a block copy does
 /// takes the place of the copy into the buffer.
 void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel& kernel) {
   uint8* const dst = std::exchange(rect.dst, stage);
   const intptr_t dstStep = rect.dstStep;
+  const auto copyRows = blendStageKernels().copyRows;
   const size_t span = rect.width * bytes;
-  rect.dstStep = static_cast<intptr_t>(span);
-  if (kernel.readsBlocks && span >= kLongRow) {
-    kernel.blend(rect);
-  } else {
+  rect.dstStep = static_cast<intptr_t>(stageStep(span));
+  if (!kernel.readsBlocks) {
     copyRows(stage, rect.dstStep, dst, dstStep, span, rect.height);
     rect.before = stage;
     rect.beforeStep = rect.dstStep;
-    blendRows(rect, bytes, kernel);
   }
+  kernel.blend(rect);
   copyRows(dst, dstStep, stage, rect.dstStep, span, rect.height);
 }
 
@@ -173,7 +165,7 @@ uint32 rowsAtOnce(const BlendRect& rect, uint32 bytes) {
   const Span src = spanOf(rect.src, rect.srcStep, rect.width * 4, rect.height);
   const auto step = static_cast<size_t>(rect.dstStep < 0 ? -rect.dstStep : rect.dstStep);
   if (span > kStageBytes || step < span || overlap(dst, src)) return 1;
-  return static_cast<uint32>(kStageBytes / span);
+  return static_cast<uint32>(kStageBytes / stageStep(span));
 }
 
 /// Moves the destination through a buffer, so that frame-buffer memory is touched by block copies
