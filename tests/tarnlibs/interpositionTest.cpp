@@ -92,7 +92,7 @@ TEST(Interposition, TakesTheHostsWarningAndPanicForTheRasterLibrary) {
 
 TEST(Interposition, TakesTheHostsPanicForTheUtilityLibrary) {
   heard.clear();
-  static volatile size_t tooMuch = SIZE_MAX / 2 + 1;
+  static volatile size_t tooMuch = SIZE_MAX / 16 * 15;
   if (setjmp(afterPanic) == 0) UtilSafeMalloc0(tooMuch);
   EXPECT_EQ(heard, "panic: Out of memory: " + std::to_string(tooMuch) + " bytes\n");
 }

@@ -15,8 +15,9 @@
 
 namespace {
 
-/// More than any process has: half of the address space.
-volatile size_t tooMuch = SIZE_MAX / 2 + 1;
+/// More than any process has, under sanitizers too; and a number whose double is 2.
+volatile size_t tooMuch = SIZE_MAX / 16 * 15;
+volatile size_t overHalf = SIZE_MAX / 2 + 2;
 
 TEST(UtilSafeMalloc0, ReturnsWritableMemory) {
   void* block = UtilSafeMalloc0(1000);
@@ -62,8 +63,8 @@ TEST(UtilSafeCalloc0, PanicsWhenMemoryIsExhaustedOrTheProductOverflows) {
   EXPECT_EQ(tests::messagesOf([] { UtilSafeCalloc0(1, tooMuch); }).panic,
             "Out of memory: 1 x " + std::to_string(tooMuch) + " bytes\n");
   // The product is 2 modulo the address size.
-  EXPECT_EQ(tests::messagesOf([] { UtilSafeCalloc0(2, tooMuch + 1); }).panic,
-            "Out of memory: 2 x " + std::to_string(tooMuch + 1) + " bytes\n");
+  EXPECT_EQ(tests::messagesOf([] { UtilSafeCalloc0(2, overHalf); }).panic,
+            "Out of memory: 2 x " + std::to_string(overHalf) + " bytes\n");
 }
 
 }  // namespace
