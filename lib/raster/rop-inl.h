@@ -136,7 +136,6 @@ HWY_INLINE void combineLongToRight(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d;
   constexpr size_t n = kLanes<decltype(d)>;
   const size_t lastAt = bytes - n;
-  const auto last = combined<Rop>(d, src + lastAt, dst + lastAt);
   auto block = combined<Rop>(d, src, dst);
   size_t at = 0;
   for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < lastAt; i += n) {
@@ -145,6 +144,7 @@ HWY_INLINE void combineLongToRight(uint8* dst, const uint8* src, size_t bytes) {
     block = next;
     at = i;
   }
+  const auto last = combined<Rop>(d, src + lastAt, dst + lastAt);
   storeLanes(d, block, dst + at);
   storeLanes(d, last, dst + lastAt);
 }
@@ -153,7 +153,6 @@ HWY_INLINE void combineLongToRight(uint8* dst, const uint8* src, size_t bytes) {
 template <class Rop> HWY_INLINE void combineLongToLeft(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d;
   constexpr size_t n = kLanes<decltype(d)>;
-  const auto first = combined<Rop>(d, src, dst);
   size_t at = bytes - n;
   auto block = combined<Rop>(d, src + at, dst + at);
   for (size_t end = bytes - 1 - (reinterpret_cast<uintptr_t>(dst) + bytes - 1) % n; end > n;
@@ -163,6 +162,7 @@ template <class Rop> HWY_INLINE void combineLongToLeft(uint8* dst, const uint8* 
     block = next;
     at = end - n;
   }
+  const auto first = combined<Rop>(d, src, dst);
   storeLanes(d, block, dst + at);
   storeLanes(d, first, dst);
 }
