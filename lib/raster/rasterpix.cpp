@@ -75,24 +75,24 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   const auto first = combined<Rop>(d, pattern, dst);
-  const auto last = combined<Rop>(d, pattern + lastPhase, dst + bytes - n);
   uint8* const end = dst + bytes;
   const size_t phase = n - reinterpret_cast<uintptr_t>(dst) % n;
   uint8* at = dst + phase;
   const uint8* source = pattern + phase;
   const uint8* const wrap = pattern + period;
   const auto left = [&] { return static_cast<size_t>(end - at); };
-  if (period == kBlockBytes && left() >= kBlockBytes)
-    at = combineBlocks<Rop, kFar>(at, end, source);
-  for (; left() > kBlockBytes; at += kBlockBytes) {
+  if (period == kBlockBytes && left() >= kBlockBytes + n)
+    at = combineBlocks<Rop, kFar>(at, end - n, source);
+  for (; left() > kBlockBytes + n; at += kBlockBytes) {
     for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(at + k);
     for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, source + k, at + k);
     source += kBlockBytes;
     if (source >= wrap) source -= period;
   }
+  const auto last = combined<Rop>(d, pattern + lastPhase, end - n);
   for (; left() > n; at += n, source += n) combine<Rop>(d, source, at);
   storeLanes(d, first, dst);
-  storeLanes(d, last, dst + bytes - n);
+  storeLanes(d, last, end - n);
 }
 
 /// Combines a row with a source of the same length.
