@@ -81,12 +81,18 @@ Span spanOf(const uint8* row, intptr_t step, size_t bytes, uint32 height) {
 }
 bool overlap(const Span& a, const Span& b) { return a.first < b.end && b.first < a.end; }
 
+/// Whether destination and source, with what lies between their rows, share no byte.
+bool isApart(const BlendRect& rect, uint32 bytes) {
+  return !overlap(spanOf(rect.dst, rect.dstStep, rect.width * bytes, rect.height),
+                  spanOf(rect.src, rect.srcStep, rect.width * 4, rect.height));
+}
+
 /// Whether a kernel, which reads some pixels ahead of those that it has written, gives what the
 /// walk from pixel to pixel gives.
 bool mayReadAhead(const BlendRect& r, uint32 bytes) {
-  const Span dst = spanOf(r.dst, r.dstStep, r.width * bytes, r.height);
-  const Span src = spanOf(r.src, r.srcStep, r.width * 4, r.height);
-  return !overlap(dst, src) || (bytes == 4 && r.height == 1 && dst.first <= src.first);
+  if (isApart(r, bytes)) return true;
+  const auto dst = reinterpret_cast<uintptr_t>(r.dst);
+  return bytes == 4 && r.height == 1 && dst <= reinterpret_cast<uintptr_t>(r.src);
 }
 
 /// Blends one pixel after the other.
@@ -115,18 +121,26 @@ void blendOverlapping(const BlendRect& all, uint32 bytes, const BlendKernel& ker
   }
 }
 
-/// Blends rows that do not overlap their sources, as one long row where that is the same.
+/// Whether there is nothing between the rows.
+bool isGapless(const BlendRect& rect, uint32 bytes) {
+  return rect.dstStep == static_cast<intptr_t>(rect.width * bytes) &&
+         rect.srcStep == static_cast<intptr_t>(rect.width * 4);
+}
+
+/// Rows without gaps as one long row.
+BlendRect joined(BlendRect rect) {
+  rect.width *= rect.height;
+  rect.height = 1;
+  return rect;
+}
+
+/// Blends rows that do not overlap their sources.
 void blendRows(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {
-  const bool gapless = rect.dstStep == static_cast<intptr_t>(rect.width * bytes) &&
-                       rect.srcStep == static_cast<intptr_t>(rect.width * 4);
-  if (!gapless) {
+  if (isGapless(rect, bytes)) {
+    kernel.blend(joined(rect));
+  } else {
     kernel.blend(rect);
-    return;
   }
-  BlendRect row = rect;
-  row.width *= row.height;
-  row.height = 1;
-  kernel.blend(row);
 }
 
 void blendInPlace(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {
@@ -158,22 +172,23 @@ void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel&
   copyRows(dst, dstStep, stage, rect.dstStep, span, rect.height);
 }
 
-/// How many rows the buffer may hold at once: one where a row depends on those before it.
+/// How many rows, apart from their sources, the buffer may hold at once: one where they overlap
+/// each other.
 uint32 rowsAtOnce(const BlendRect& rect, uint32 bytes) {
   const size_t span = rect.width * bytes;
-  const Span dst = spanOf(rect.dst, rect.dstStep, span, rect.height);
-  const Span src = spanOf(rect.src, rect.srcStep, rect.width * 4, rect.height);
   const auto step = static_cast<size_t>(rect.dstStep < 0 ? -rect.dstStep : rect.dstStep);
-  if (span > kStageBytes || step < span || overlap(dst, src)) return 1;
+  if (span > kStageBytes || step < span) return 1;
   return static_cast<uint32>(kStageBytes / stageStep(span));
 }
 
 /// Moves the destination through a buffer, so that frame-buffer memory is touched by block copies
 /// only, of at most kStageBytes each.
-void blendStaged(const BlendRect& all, uint32 bytes, const BlendKernel& kernel) {
+void blendStaged(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel) {
   alignas(64) uint8 stage[kStageBytes];
   const size_t pixels = kStageBytes / bytes;
-  const uint32 rows = rowsAtOnce(all, bytes);
+  const bool apart = isApart(rect, bytes);
+  const BlendRect all = apart && isGapless(rect, bytes) ? joined(rect) : rect;
+  const uint32 rows = apart ? rowsAtOnce(all, bytes) : 1;
   for (uint32 y = 0; y < all.height; y += rows) {
     BlendRect part = all;
     part.height = std::min(rows, all.height - y);
