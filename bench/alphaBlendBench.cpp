@@ -34,61 +34,48 @@ namespace {
 using bench::Contenders;
 using bench::Extent;
 
-enum Operator {
-  kSrc = 1,
-  kOver = 3,
-  kOverRev,
-  kIn,
-  kInRev,
-  kOutRev = 8,
-  kAtop,
-  kAtopRev,
-  kAdd = 12,
-  kSaturate
-};
-
 /// A row of the table: what is blended onto what, and how.
 struct Job {
   const char* name;
   uint32 depth, bpp;
-  Operator op;
+  uint32 op;
   uint32 flags;
   bool sprite;
   uint8 staged;
 };
 
-constexpr uint32 kSrcAlpha = 1;
-constexpr uint32 kDstAlpha = 2;
-
 constexpr Job kJobs[] = {
-    {"over-32", 24, 32, kOver, 0, false, 0},
-    {"over-32-sprite", 24, 32, kOver, 0, true, 0},
-    {"over-32-staged", 24, 32, kOver, 0, false, 1},
-    {"over-32-srcalpha", 24, 32, kOver, kSrcAlpha, false, 0},
-    {"over-32-srcalpha-dstalpha", 24, 32, kOver, kSrcAlpha | kDstAlpha, false, 0},
-    {"over-24", 24, 24, kOver, 0, false, 0},
-    {"over-16", 16, 16, kOver, 0, false, 0},
-    {"over-16-sprite", 16, 16, kOver, 0, true, 0},
-    {"over-16-staged", 16, 16, kOver, 0, false, 1},
-    {"over-15", 15, 16, kOver, 0, false, 0},
-    {"over-8", 8, 8, kOver, 0, false, 0},
-    {"over-6", 6, 8, kOver, 0, false, 0},
-    {"src-32", 24, 32, kSrc, 0, false, 0},
-    {"overrev-32-dstalpha", 24, 32, kOverRev, kDstAlpha, false, 0},
-    {"in-32", 24, 32, kIn, 0, false, 0},
-    {"inrev-32", 24, 32, kInRev, 0, false, 0},
-    {"outrev-32", 24, 32, kOutRev, 0, false, 0},
-    {"atop-32-dstalpha", 24, 32, kAtop, kDstAlpha, false, 0},
-    {"atoprev-32-dstalpha", 24, 32, kAtopRev, kDstAlpha, false, 0},
-    {"add-32", 24, 32, kAdd, 0, false, 0},
-    {"saturate-32-dstalpha", 24, 32, kSaturate, kDstAlpha, false, 0},
-    {"inrev-16", 16, 16, kInRev, 0, false, 0},
-    {"add-16", 16, 16, kAdd, 0, false, 0},
-    {"add-24", 24, 24, kAdd, 0, false, 0},
-    {"add-15", 15, 16, kAdd, 0, false, 0},
-    {"atop-16-dstalpha", 16, 16, kAtop, kDstAlpha, false, 0},
-    {"outrev-24", 24, 24, kOutRev, 0, false, 0},
-    {"src-16", 16, 16, kSrc, 0, false, 0},
+    {"over-32", 24, 32, RASTER_BLEND_OVER, 0, false, 0},
+    {"over-32-sprite", 24, 32, RASTER_BLEND_OVER, 0, true, 0},
+    {"over-32-staged", 24, 32, RASTER_BLEND_OVER, 0, false, 1},
+    {"over-32-srcalpha", 24, 32, RASTER_BLEND_OVER, RASTER_BLEND_USE_SRC_ALPHA, false, 0},
+    {"over-32-srcalpha-dstalpha", 24, 32, RASTER_BLEND_OVER,
+     RASTER_BLEND_USE_SRC_ALPHA | RASTER_BLEND_USE_DST_ALPHA, false, 0},
+    {"over-24", 24, 24, RASTER_BLEND_OVER, 0, false, 0},
+    {"over-16", 16, 16, RASTER_BLEND_OVER, 0, false, 0},
+    {"over-16-sprite", 16, 16, RASTER_BLEND_OVER, 0, true, 0},
+    {"over-16-staged", 16, 16, RASTER_BLEND_OVER, 0, false, 1},
+    {"over-15", 15, 16, RASTER_BLEND_OVER, 0, false, 0},
+    {"over-8", 8, 8, RASTER_BLEND_OVER, 0, false, 0},
+    {"over-6", 6, 8, RASTER_BLEND_OVER, 0, false, 0},
+    {"src-32", 24, 32, RASTER_BLEND_SOURCE, 0, false, 0},
+    {"overrev-32-dstalpha", 24, 32, RASTER_BLEND_OVER_REVERSE, RASTER_BLEND_USE_DST_ALPHA, false,
+     0},
+    {"in-32", 24, 32, RASTER_BLEND_IN, 0, false, 0},
+    {"inrev-32", 24, 32, RASTER_BLEND_IN_REVERSE, 0, false, 0},
+    {"outrev-32", 24, 32, RASTER_BLEND_OUT_REVERSE, 0, false, 0},
+    {"atop-32-dstalpha", 24, 32, RASTER_BLEND_ATOP, RASTER_BLEND_USE_DST_ALPHA, false, 0},
+    {"atoprev-32-dstalpha", 24, 32, RASTER_BLEND_ATOP_REVERSE, RASTER_BLEND_USE_DST_ALPHA, false,
+     0},
+    {"add-32", 24, 32, RASTER_BLEND_ADD, 0, false, 0},
+    {"saturate-32-dstalpha", 24, 32, RASTER_BLEND_SATURATE, RASTER_BLEND_USE_DST_ALPHA, false, 0},
+    {"inrev-16", 16, 16, RASTER_BLEND_IN_REVERSE, 0, false, 0},
+    {"add-16", 16, 16, RASTER_BLEND_ADD, 0, false, 0},
+    {"add-24", 24, 24, RASTER_BLEND_ADD, 0, false, 0},
+    {"add-15", 15, 16, RASTER_BLEND_ADD, 0, false, 0},
+    {"atop-16-dstalpha", 16, 16, RASTER_BLEND_ATOP, RASTER_BLEND_USE_DST_ALPHA, false, 0},
+    {"outrev-24", 24, 24, RASTER_BLEND_OUT_REVERSE, 0, false, 0},
+    {"src-16", 16, 16, RASTER_BLEND_SOURCE, 0, false, 0},
 };
 
 constexpr uint32 kAlpha = 0xB0;  // both constants
@@ -116,7 +103,7 @@ pixman_image_t* pixmanImage(pixman_format_code_t format, uint8* pixels, Extent e
 }
 
 void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, uint32 pitch) {
-  const bool dstAlpha = (job.flags & kDstAlpha) != 0;
+  const bool dstAlpha = (job.flags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   const auto format = job.depth == 6    ? PIXMAN_a2r2g2b2
                       : job.depth == 8  ? PIXMAN_b2g3r3
                       : job.depth == 15 ? (dstAlpha ? PIXMAN_a1r5g5b5 : PIXMAN_x1r5g5b5)
@@ -128,7 +115,9 @@ void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
   auto* to = pixmanImage(format, dst, e, pitch);
   auto* from = pixmanImage(PIXMAN_a8r8g8b8, src, e, e.width * 4);
   const pixman_color_t faded = {0, 0, 0, kAlpha * 0x101};
-  auto* mask = (job.flags & kSrcAlpha) != 0 ? pixman_image_create_solid_fill(&faded) : nullptr;
+  auto* mask = (job.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0
+                   ? pixman_image_create_solid_fill(&faded)
+                   : nullptr;
   c.add(dstAlpha ? "pixman~dst" : "pixman", [=, op = static_cast<pixman_op_t>(job.op)] {
     pixman_image_composite32(op, from, mask, to, 0, 0, 0, 0, 0, 0, static_cast<int>(e.width),
                              static_cast<int>(e.height));
@@ -138,8 +127,8 @@ void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
 
 #ifdef HAVE_QT6
 void addQt(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, uint32 pitch) {
-  const bool dstAlpha = (job.flags & kDstAlpha) != 0;
-  if (job.bpp == 8 || job.op == kSaturate) return;
+  const bool dstAlpha = (job.flags & RASTER_BLEND_USE_DST_ALPHA) != 0;
+  if (job.bpp == 8 || job.op == RASTER_BLEND_SATURATE) return;
   static constexpr QPainter::CompositionMode kModes[] = {QPainter::CompositionMode_Clear,
                                                          QPainter::CompositionMode_Source,
                                                          QPainter::CompositionMode_Destination,
@@ -163,7 +152,7 @@ void addQt(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, uint
   const QImage from(src, w, h, static_cast<int>(e.width * 4), QImage::Format_ARGB32_Premultiplied);
   QImage to(dst, w, h, static_cast<int>(pitch), format);
   const auto mode = kModes[job.op];
-  const double opacity = (job.flags & kSrcAlpha) != 0 ? kAlpha / 255.0 : 1.0;
+  const double opacity = (job.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0 ? kAlpha / 255.0 : 1.0;
   c.add(dstAlpha ? "Qt6~dst" : "Qt6~x", [=]() mutable {
     QPainter painter(&to);
     painter.setCompositionMode(mode);
@@ -179,13 +168,13 @@ void addOthers(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
   const int srcPitch = w * 4;
   const int dstPitch = static_cast<int>(pitch);
 #ifdef HAVE_LIBYUV
-  if (job.op == kOver && job.bpp == 32 && job.flags == 0) {
+  if (job.op == RASTER_BLEND_OVER && job.bpp == 32 && job.flags == 0) {
     c.add("libyuv~x",
           [=] { libyuv::ARGBBlend(src, srcPitch, dst, dstPitch, dst, dstPitch, w, h); });
   }
 #endif
 #ifdef HAVE_SDL2
-  if (job.op == kOver && job.flags == 0 && job.bpp != 8) {
+  if (job.op == RASTER_BLEND_OVER && job.flags == 0 && job.bpp != 8) {
     const auto format = job.depth == 15   ? SDL_PIXELFORMAT_RGB555
                         : job.depth == 16 ? SDL_PIXELFORMAT_RGB565
                         : job.bpp == 24   ? SDL_PIXELFORMAT_BGR24
@@ -199,7 +188,7 @@ void addOthers(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
   }
 #endif
 #ifdef HAVE_OPENCV
-  if (job.op == kAdd && job.bpp == 32) {
+  if (job.op == RASTER_BLEND_ADD && job.bpp == 32) {
     c.add("OpenCV~x", [from = cv::Mat(h, w, CV_8UC4, src),
                        to = cv::Mat(h, w, CV_8UC4, dst)]() mutable { cv::add(from, to, to); });
   }

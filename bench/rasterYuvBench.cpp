@@ -49,7 +49,7 @@ struct Job {
 };
 
 uint32 codeOf(Layout layout) {
-  static constexpr uint32 kCodes[] = {0x32595559, 0x59565955, 0x32315659};
+  static constexpr uint32 kCodes[] = {RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY, RASTER_VIDEO_YV12};
   return kCodes[static_cast<int>(layout)];
 }
 

@@ -23,32 +23,21 @@ using bench::Extent;
 
 constexpr uint32 kPixel = 0x5A3C21F7;
 
-enum Rop : uint32 {
-  kAnd = 1,
-  kAndReverse = 2,
-  kCopy = 3,
-  kAndInverted = 4,
-  kXor = 6,
-  kInvert = 10,
-  kCopyInverted = 12,
-  kNand = 14
-};
-
 /// The operations that write and depend on source or destination.
 constexpr uint32 kThirteen[] = {1, 2, 3, 4, 6, 7, 8, 9, 10, 11, 12, 13, 14};
 
 #ifdef HAVE_OPENCV
 void addOpenCv(Contenders& c, uint32 rop, const cv::Mat& src, const cv::Mat& dst) {
-  if (rop == kXor) c.add("OpenCV", [=] { cv::bitwise_xor(src, dst, dst); });
-  if (rop == kAnd) c.add("OpenCV", [=] { cv::bitwise_and(src, dst, dst); });
-  if (rop == kInvert) c.add("OpenCV", [=] { cv::bitwise_not(dst, dst); });
-  if (rop == kCopyInverted) c.add("OpenCV", [=] { cv::bitwise_not(src, dst); });
+  if (rop == RASTER_ROP_XOR) c.add("OpenCV", [=] { cv::bitwise_xor(src, dst, dst); });
+  if (rop == RASTER_ROP_AND) c.add("OpenCV", [=] { cv::bitwise_and(src, dst, dst); });
+  if (rop == RASTER_ROP_INVERT) c.add("OpenCV", [=] { cv::bitwise_not(dst, dst); });
+  if (rop == RASTER_ROP_COPY_INVERTED) c.add("OpenCV", [=] { cv::bitwise_not(src, dst); });
 }
 
 void addOpenCv(Contenders& c, uint32 rop, const cv::Scalar& pixel, const cv::Mat& dst) {
-  if (rop == kXor) c.add("OpenCV", [=] { cv::bitwise_xor(dst, pixel, dst); });
-  if (rop == kAnd) c.add("OpenCV", [=] { cv::bitwise_and(dst, pixel, dst); });
-  if (rop == kInvert) c.add("OpenCV", [=] { cv::bitwise_not(dst, dst); });
+  if (rop == RASTER_ROP_XOR) c.add("OpenCV", [=] { cv::bitwise_xor(dst, pixel, dst); });
+  if (rop == RASTER_ROP_AND) c.add("OpenCV", [=] { cv::bitwise_and(dst, pixel, dst); });
+  if (rop == RASTER_ROP_INVERT) c.add("OpenCV", [=] { cv::bitwise_not(dst, dst); });
 }
 
 constexpr int kTypes[] = {0, CV_8UC1, CV_16UC1, CV_8UC3, CV_8UC4};
@@ -163,7 +152,7 @@ void right1Job(const std::string& name, uint32 bytes) {
     const uint32 pitch = (e.width + 1) * bytes;
     c.add("raster", [=] {
       Raster_RectROPcopy(fb, static_cast<int32>(pitch), fb, static_cast<int32>(pitch), bytes, 0, 0,
-                         kXor, 1, 0, e.width, e.height);
+                         RASTER_ROP_XOR, 1, 0, e.width, e.height);
     });
     c.add("limit", [=] { memmove(fb + bytes, fb, size_t{e.width} * bytes * e.height); });
   });
@@ -172,22 +161,22 @@ void right1Job(const std::string& name, uint32 bytes) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  fillJob("32-xor", 4, kXor);
-  fillJob("32-and", 4, kAnd);
-  fillJob("32-invert", 4, kInvert);
-  fillJob("32-andrev", 4, kAndReverse);
-  fillJob("24-xor", 3, kXor);
-  fillJob("16-xor", 2, kXor);
-  fillJob("8-xor", 1, kXor);
-  copyJob("32-xor", 4, kXor);
-  copyJob("32-and", 4, kAnd);
-  copyJob("32-nand", 4, kNand);
-  copyJob("32-copyinv", 4, kCopyInverted);
-  copyJob("32-andinv", 4, kAndInverted);
-  copyJob("24-xor", 3, kXor);
-  copyJob("16-xor", 2, kXor);
-  copyJob("8-xor", 1, kXor);
-  copyJob("24-andinv", 3, kAndInverted);
+  fillJob("32-xor", 4, RASTER_ROP_XOR);
+  fillJob("32-and", 4, RASTER_ROP_AND);
+  fillJob("32-invert", 4, RASTER_ROP_INVERT);
+  fillJob("32-andrev", 4, RASTER_ROP_AND_REVERSE);
+  fillJob("24-xor", 3, RASTER_ROP_XOR);
+  fillJob("16-xor", 2, RASTER_ROP_XOR);
+  fillJob("8-xor", 1, RASTER_ROP_XOR);
+  copyJob("32-xor", 4, RASTER_ROP_XOR);
+  copyJob("32-and", 4, RASTER_ROP_AND);
+  copyJob("32-nand", 4, RASTER_ROP_NAND);
+  copyJob("32-copyinv", 4, RASTER_ROP_COPY_INVERTED);
+  copyJob("32-andinv", 4, RASTER_ROP_AND_INVERTED);
+  copyJob("24-xor", 3, RASTER_ROP_XOR);
+  copyJob("16-xor", 2, RASTER_ROP_XOR);
+  copyJob("8-xor", 1, RASTER_ROP_XOR);
+  copyJob("24-andinv", 3, RASTER_ROP_AND_INVERTED);
   all13Job();
   right1Job("32-xor-right1", 4);
   right1Job("24-xor-right1", 3);

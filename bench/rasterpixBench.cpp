@@ -22,8 +22,6 @@ namespace {
 using bench::Contenders;
 using bench::Extent;
 
-constexpr uint32 kCopy = 3;
-constexpr uint32 kXor = 6;
 constexpr uint32 kTileX = 3;
 constexpr uint32 kTileY = 5;
 
@@ -67,8 +65,8 @@ void addQt(Contenders& c, uint8* dst, uint8* tile, uint32 bytes, uint32 size, ui
       QImage(dst, static_cast<int>(e.width), static_cast<int>(e.height),
              static_cast<qsizetype>(e.width * bytes), format),
       QImage(tile, side, side, static_cast<qsizetype>(tilePitch(size, bytes)), format));
-  canvas->painter.setCompositionMode(rop == kXor ? QPainter::RasterOp_SourceXorDestination
-                                                 : QPainter::CompositionMode_Source);
+  canvas->painter.setCompositionMode(rop == RASTER_ROP_XOR ? QPainter::RasterOp_SourceXorDestination
+                                                           : QPainter::CompositionMode_Source);
   c.add("Qt6~x", [=] { canvas->painter.fillRect(canvas->picture.rect(), canvas->brush); });
 }
 #endif
@@ -84,10 +82,11 @@ void tileJob(const std::string& name, uint32 bytes, uint32 size, uint32 rop) {
     });
     c.add("limit", [=] { memset(dst, 0x5A, size_t{pitch} * e.height); });
 #ifdef HAVE_PIXMAN
-    if (rop == kCopy) addPixman(c, dst, tile, bytes, size, e);
+    if (rop == RASTER_ROP_COPY) addPixman(c, dst, tile, bytes, size, e);
 #endif
 #ifdef HAVE_QT6
-    if (bytes == 4 || (bytes == 2 && rop == kCopy)) addQt(c, dst, tile, bytes, size, rop, e);
+    if (bytes == 4 || (bytes == 2 && rop == RASTER_ROP_COPY))
+      addQt(c, dst, tile, bytes, size, rop, e);
 #endif
   });
 }
@@ -95,14 +94,14 @@ void tileJob(const std::string& name, uint32 bytes, uint32 size, uint32 rop) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  tileJob("32-copy-64x64", 4, 64, kCopy);
-  tileJob("32-copy-8x8", 4, 8, kCopy);
-  tileJob("24-copy-16x16", 3, 16, kCopy);
-  tileJob("16-copy-8x8", 2, 8, kCopy);
-  tileJob("8-copy-8x8", 1, 8, kCopy);
-  tileJob("32-xor-64x64", 4, 64, kXor);
-  tileJob("32-xor-8x8", 4, 8, kXor);
-  tileJob("24-xor-16x16", 3, 16, kXor);
-  tileJob("16-xor-8x8", 2, 8, kXor);
+  tileJob("32-copy-64x64", 4, 64, RASTER_ROP_COPY);
+  tileJob("32-copy-8x8", 4, 8, RASTER_ROP_COPY);
+  tileJob("24-copy-16x16", 3, 16, RASTER_ROP_COPY);
+  tileJob("16-copy-8x8", 2, 8, RASTER_ROP_COPY);
+  tileJob("8-copy-8x8", 1, 8, RASTER_ROP_COPY);
+  tileJob("32-xor-64x64", 4, 64, RASTER_ROP_XOR);
+  tileJob("32-xor-8x8", 4, 8, RASTER_ROP_XOR);
+  tileJob("24-xor-16x16", 3, 16, RASTER_ROP_XOR);
+  tileJob("16-xor-8x8", 2, 8, RASTER_ROP_XOR);
   return bench::run(argc, argv);
 }

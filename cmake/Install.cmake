@@ -4,7 +4,8 @@ include(CMakePackageConfigHelpers)
 install(TARGETS raster tarnlibs EXPORT rasterTargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
 install(FILES
-  lib/raster/raster.h lib/rect/rect.h lib/image/imageUtil.h
+  lib/raster/raster.h lib/raster/rasterExport.h ${RASTER_GENERATED_HEADERS}/rasterVersion.h
+  lib/rect/rect.h lib/image/imageUtil.h
   lib/tarnlibs/baseTypes.h lib/tarnlibs/message.h lib/tarnlibs/utilAlloc.h
   lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h
   DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/raster)

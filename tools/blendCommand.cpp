@@ -16,17 +16,15 @@ namespace tool {
 namespace {
 
 /// By number.
-constexpr const char* kOperatorNames[] = {
+constexpr const char* kOperatorNames[RASTER_BLEND_COUNT] = {
     "clear", "source",     "destination", "over",        "overReverse", "in",  "inReverse",
     "out",   "outReverse", "atop",        "atopReverse", "xor",         "add", "saturate"};
-constexpr uint32 kSaturate = 13;
-enum BlendFlags : uint32 { kScaleSource = 1, kScaleDestination = 2 };
 
 struct BlendOptions {
   std::string destination;
   std::string source;
   OutputOptions output;
-  uint32 op = 3;
+  uint32 op = RASTER_BLEND_OVER;
   std::optional<uint32> srcAlpha;
   std::optional<uint32> dstAlpha;
   Point at = {0, 0};
@@ -36,14 +34,15 @@ struct BlendOptions {
 
 int blend(const BlendOptions& options) {
   const SaveOptions saving = options.output.forSave();
-  if (options.op == kSaturate && options.dstAlpha == 0u)
+  if (options.op == RASTER_BLEND_SATURATE && options.dstAlpha == 0u)
     throw CLI::ValidationError("saturate divides by the destination's alpha: --dst-alpha 0");
   Picture picture = Picture::loadAs(options.code, options.destination);
   Picture source = Picture::loadAs(32, options.source, true);
   premultiply(source);
   const Placement placed = place(source, options.at, picture);
-  const uint32 flags =
-      (options.srcAlpha ? kScaleSource : 0u) | (options.dstAlpha ? kScaleDestination : 0u);
+  uint32 flags = 0;
+  if (options.srcAlpha) flags |= RASTER_BLEND_USE_SRC_ALPHA;
+  if (options.dstAlpha) flags |= RASTER_BLEND_USE_DST_ALPHA;
   Raster_AlphaBlend(picture.data(), static_cast<uint32>(placed.onTarget.left),
                     static_cast<uint32>(placed.onTarget.top), picture.pitch(), source.data(),
                     placed.srcX, placed.srcY, source.pitch(), widthOf(placed.onTarget),

@@ -11,6 +11,7 @@
 
 #include "commands.h"
 #include "message.h"
+#include "rasterVersion.h"
 
 namespace tool {
 namespace {
@@ -54,7 +55,7 @@ int runChosen(Commands& commands) {
 int runCommandLine(int argc, char** argv) {
   CLI::App app("Screenshots of an X display, and raster graphics on PNG pictures.", "rastertool");
   app.require_subcommand(1);
-  app.set_version_flag("--version", "rastertool 1.0.0");
+  app.set_version_flag("--version", "rastertool " RASTER_VERSION);
   Commands commands(app);
   for (const auto addFamily :
        {addScreenCommands, addImageCommands, addRopCommand, addBlendCommand, addCursorCommand,

@@ -16,14 +16,14 @@ namespace tool {
 namespace {
 
 /// By number.
-constexpr const char* kRopNames[] = {
+constexpr const char* kRopNames[RASTER_ROP_COUNT] = {
     "clear", "and",   "andReverse", "copy",      "andInverted",  "noop",       "xor",  "or",
     "nor",   "equiv", "invert",     "orReverse", "copyInverted", "orInverted", "nand", "set"};
 
 struct RopOptions {
   std::string destination;
   OutputOptions output;
-  uint32 rop = 0;
+  uint32 rop = RASTER_ROP_CLEAR;
   std::string source;
   Point at = {0, 0};
   std::optional<uint32> colour;

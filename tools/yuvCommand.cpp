@@ -20,7 +20,7 @@ namespace {
 
 struct Layout {
   const char* name;
-  uint32 code;  // the name's characters, first one in the low byte
+  uint32 code;
   uint64 (*frameSize)(uint64 width, uint64 height);
 };
 
@@ -31,9 +31,9 @@ uint64 planarSize(uint64 width, uint64 height) {
   return ((width + 1) & ~uint64{1}) * ((height + 1) & ~uint64{1}) + 2 * chroma;
 }
 
-constexpr Layout kLayouts[] = {{"YUY2", 0x32595559, packedSize},
-                               {"UYVY", 0x59565955, packedSize},
-                               {"YV12", 0x32315659, planarSize}};
+constexpr Layout kLayouts[] = {{"YUY2", RASTER_VIDEO_YUY2, packedSize},
+                               {"UYVY", RASTER_VIDEO_UYVY, packedSize},
+                               {"YV12", RASTER_VIDEO_YV12, planarSize}};
 
 const Layout& layoutOfName(const std::string& name) {
   for (const Layout& layout : kLayouts)

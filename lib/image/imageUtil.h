@@ -16,14 +16,13 @@
 
 #include "baseTypes.h"
 #include "dynBuf.h"
+#include "rasterExport.h"
 
 #ifdef __cplusplus
 extern "C" {
 #endif
 
 struct png_struct_def;  // libpng's structure; png_structp is a pointer to it
-
-// NOLINTBEGIN(modernize-use-using)
 
 /// One palette entry, in the order of memory of a 32-bit pixel.
 typedef struct ImageUtilColor {
@@ -87,8 +86,6 @@ typedef struct ImageUtilBufferWriteCtx {
   const ImageUtilMemOps* memops;  ///< where the buffer comes from
 } ImageUtilBufferWriteCtx;
 
-// NOLINTEND(modernize-use-using)
-
 // ---- Reading -----------------------------------------------------------------------------------
 
 /// Decodes the PNG stream of `size` bytes at `png`. True on success.
@@ -113,23 +110,21 @@ typedef struct ImageUtilBufferWriteCtx {
 /// - filled, with the rows decoded so far, when libpng finds an error in the pixels or after them:
 ///   call ImageUtil_FreeImageData also then (in all three cases it does no harm on a record that
 ///   was valid before). Sizes that memory cannot address fail with the fields filled and no data.
-TARNLIBS_EXPORT bool ImageUtil_ReadPNGBuffer(ImageUtilImage* image, const uint8* png, uint32 size,
-                                             uint8 readFlags);
+RASTER_EXPORT bool ImageUtil_ReadPNGBuffer(ImageUtilImage* image, const uint8* png, uint32 size,
+                                           uint8 readFlags);
 
 /// Reads the file at `pathName` and decodes it as ImageUtil_ReadPNGBuffer does. A file that cannot
 /// be read, is empty or has 4 GiB or more gives false with `*image` as it was. The end of the file
 /// is the end of the stream: a file that was cut off is an error of libpng's kind.
-TARNLIBS_EXPORT bool ImageUtil_ReadPNG(ImageUtilImage* image, const char* pathName,
-                                       uint8 readFlags);
+RASTER_EXPORT bool ImageUtil_ReadPNG(ImageUtilImage* image, const char* pathName, uint8 readFlags);
 
 /// Releases `image->data`, which may be null, and sets it to null. Other fields stay.
-TARNLIBS_EXPORT void ImageUtil_FreeImageData(ImageUtilImage* image);
+RASTER_EXPORT void ImageUtil_FreeImageData(ImageUtilImage* image);
 
 /// The read function given to libpng, for hosts that drive libpng themselves: copies `length` bytes
 /// from the stream of the ImageUtilReadPngCtx behind libpng's I/O pointer. Deliberate: it knows no
 /// end of the stream.
-TARNLIBS_EXPORT void ImageUtilReadPngCallback(struct png_struct_def* png, uint8* dest,
-                                              size_t length);
+RASTER_EXPORT void ImageUtilReadPngCallback(struct png_struct_def* png, uint8* dest, size_t length);
 
 // ---- Encoding ----------------------------------------------------------------------------------
 
@@ -146,32 +141,31 @@ TARNLIBS_EXPORT void ImageUtilReadPngCallback(struct png_struct_def* png, uint8*
 /// when memory is exhausted, `numColors` is over 256 (up to 8 bpp), or libpng refuses the image (no
 /// rows, no columns, no palette entries, over a million of either). A format that
 /// Raster_ConvertPixels does not know is fatal as it says.
-TARNLIBS_EXPORT bool ImageUtil_ConstructPNGBuffer(const ImageUtilImage* image,
-                                                  const ImageUtilPNGWriteParams* params,
-                                                  DynBuf* out);
+RASTER_EXPORT bool ImageUtil_ConstructPNGBuffer(const ImageUtilImage* image,
+                                                const ImageUtilPNGWriteParams* params, DynBuf* out);
 
 /// As ImageUtil_ConstructPNGBuffer, into a buffer from the host's memory. On success `*outBuffer`
 /// and `*outSize` are set, and the caller releases the buffer with its `free` operation (the block
 /// is larger than the file). On failure `*outSize` is 0, `*outBuffer` stays as it was, and `free`
 /// has been called with what was allocated so far, which may be null. A null `outBuffer`, `outSize`
 /// or `memops` gives false and nothing else.
-TARNLIBS_EXPORT bool ImageUtil_ConstructPNGBufferWithMemOps(const ImageUtilImage* image,
-                                                            const ImageUtilPNGWriteParams* params,
-                                                            uint8** outBuffer, uint32* outSize,
-                                                            const ImageUtilMemOps* memops);
+RASTER_EXPORT bool ImageUtil_ConstructPNGBufferWithMemOps(const ImageUtilImage* image,
+                                                          const ImageUtilPNGWriteParams* params,
+                                                          uint8** outBuffer, uint32* outSize,
+                                                          const ImageUtilMemOps* memops);
 
 /// A write function for libpng: appends to the buffer of the ImageUtilBufferWriteCtx behind
 /// libpng's I/O pointer. When the bytes do not fit, the buffer is reallocated to twice the bytes
 /// then used plus 1024. When that fails, or the result would not fit the record, the buffer is
 /// released, the context has none, and libpng's error "Unable to append data: Out of memory" is
 /// raised.
-TARNLIBS_EXPORT void ImageUtilBufferWriteCallback(struct png_struct_def* png, uint8* data,
-                                                  size_t length);
+RASTER_EXPORT void ImageUtilBufferWriteCallback(struct png_struct_def* png, uint8* data,
+                                                size_t length);
 
 /// A write function for libpng: appends to the DynBuf that is libpng's I/O pointer. When that fails
 /// libpng's error "Unable to append data" is raised.
-TARNLIBS_EXPORT void ImageUtilDynBufWriteCallback(struct png_struct_def* png, uint8* data,
-                                                  size_t length);
+RASTER_EXPORT void ImageUtilDynBufWriteCallback(struct png_struct_def* png, uint8* data,
+                                                size_t length);
 
 /// Encodes an image as an uncompressed BMP file, bottom row first, into `out`, which is initialised
 /// here and is the caller's to destroy.
@@ -186,7 +180,7 @@ TARNLIBS_EXPORT void ImageUtilDynBufWriteCallback(struct png_struct_def* png, ui
 /// to 8 bpp), the file would have 4 GiB or more, or working memory is exhausted; false, with `out`
 /// destroyed, when it cannot grow. A format that Raster_ConvertPixels does not know is fatal as it
 /// says.
-TARNLIBS_EXPORT bool ImageUtil_ConstructBMPBuffer(const ImageUtilImage* image, DynBuf* out);
+RASTER_EXPORT bool ImageUtil_ConstructBMPBuffer(const ImageUtilImage* image, DynBuf* out);
 
 // ---- Writing to files --------------------------------------------------------------------------
 
@@ -200,12 +194,12 @@ TARNLIBS_EXPORT bool ImageUtil_ConstructBMPBuffer(const ImageUtilImage* image, D
 ///   Log("%s: Wrong number of image bytes written to '%s': %s (%d)\n", "ImageUtilWriteBuf", path,
 ///       text, 0)
 /// with FileIO's code and text (the last one with those of success).
-TARNLIBS_EXPORT bool ImageUtil_WriteImage(const ImageUtilImage* image, const char* pathName,
-                                          uint32 imageType);
+RASTER_EXPORT bool ImageUtil_WriteImage(const ImageUtilImage* image, const char* pathName,
+                                        uint32 imageType);
 
 /// As ImageUtil_WriteImage for PNG, with parameters (may be null).
-TARNLIBS_EXPORT bool ImageUtil_WritePNG(const ImageUtilImage* image, const char* pathName,
-                                        const ImageUtilPNGWriteParams* params);
+RASTER_EXPORT bool ImageUtil_WritePNG(const ImageUtilImage* image, const char* pathName,
+                                      const ImageUtilPNGWriteParams* params);
 
 // ---- Putting together and cutting --------------------------------------------------------------
 
@@ -223,8 +217,8 @@ TARNLIBS_EXPORT bool ImageUtil_WritePNG(const ImageUtilImage* image, const char*
 /// equal area cancel out; and every image is taken to have the format of the first.
 ///
 /// False, with `*result` as it was, when memory does not suffice.
-TARNLIBS_EXPORT bool ImageUtil_Combine(const ImageUtilImage* images, const int32* positions,
-                                       uint32 count, ImageUtilImage* result);
+RASTER_EXPORT bool ImageUtil_Combine(const ImageUtilImage* images, const int32* positions,
+                                     uint32 count, ImageUtilImage* result);
 
 /// Cuts the rectangle [left, right) x [top, bottom) out of an image and scales it, smoothly where
 /// Raster_Scale can, to `newWidth` x `newHeight`.
@@ -243,10 +237,10 @@ TARNLIBS_EXPORT bool ImageUtil_Combine(const ImageUtilImage* images, const int32
 /// the near one or is beyond the image, a new size of 0, a shape to keep where the crop is empty,
 /// or a result that memory cannot address. An empty crop (`left` at the width with `right` -1) and
 /// a new size that truncates to 0 give an empty image and true.
-TARNLIBS_EXPORT bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 left, int32 top,
-                                                 int32 right, int32 bottom, int32 dstX, int32 dstY,
-                                                 int32 newWidth, int32 newHeight,
-                                                 ImageUtilImage* result);
+RASTER_EXPORT bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 left, int32 top,
+                                               int32 right, int32 bottom, int32 dstX, int32 dstY,
+                                               int32 newWidth, int32 newHeight,
+                                               ImageUtilImage* result);
 
 #ifdef __cplusplus
 }

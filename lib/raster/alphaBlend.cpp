@@ -18,8 +18,6 @@ constexpr char kSource[] = "lib/raster/alphaBlend";
 constexpr int kBadFormatLine = 205;  // part of the message, whatever line the call stands on
 constexpr int kBadFormatBug = 19864;
 
-constexpr uint32 kSaturate = 13;
-
 /// A destination format: its pixel size and where its kernels are.
 struct Format {
   uint32 bytes;
@@ -45,8 +43,8 @@ uint8 saturateShare(uint32 da) {
 }
 
 BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
-  const bool scalesSrc = (call.flags & kFlagSrcAlpha) != 0;
-  const bool scalesDst = (call.flags & kFlagDstAlpha) != 0;
+  const bool scalesSrc = (call.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0;
+  const bool scalesDst = (call.flags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   const auto dstAlpha = static_cast<uint8>(scalesDst ? call.dstAlpha : 255);
   BlendRect rect{};
   rect.dstStep = pitchOf(call.dstPitch);
@@ -59,14 +57,14 @@ BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
   rect.height = call.height;
   rect.srcAlpha = static_cast<uint8>(scalesSrc ? call.srcAlpha : 255);
   rect.dstAlpha = dstAlpha;
-  rect.saturateShare = op == kSaturate ? saturateShare(dstAlpha) : uint8{0};
+  rect.saturateShare = op == RASTER_BLEND_SATURATE ? saturateShare(dstAlpha) : uint8{0};
   return rect;
 }
 
 /// The kernel for the constants of a call: those of 255 change nothing.
 const BlendKernel& kernelFor(const FormatKernels& kernels, uint32 op, const BlendRect& rect) {
-  const uint32 flags =
-      (rect.srcAlpha != 255 ? kFlagSrcAlpha : 0) | (rect.dstAlpha != 255 ? kFlagDstAlpha : 0);
+  const uint32 flags = (rect.srcAlpha != 255 ? RASTER_BLEND_USE_SRC_ALPHA : 0) |
+                       (rect.dstAlpha != 255 ? RASTER_BLEND_USE_DST_ALPHA : 0);
   return kernels[op][flags];
 }
 
@@ -226,7 +224,7 @@ constexpr Row tableRow(std::index_sequence<kOps...> /*operators*/) {
 }
 template <size_t... kIndex>
 constexpr std::array<Row, sizeof...(kIndex)> tableOf(std::index_sequence<kIndex...> /*formats*/) {
-  return {tableRow<kIndex>(std::make_index_sequence<kBlendOperators>())...};
+  return {tableRow<kIndex>(std::make_index_sequence<RASTER_BLEND_COUNT>())...};
 }
 constexpr auto kTable = tableOf(std::make_index_sequence<std::size(kFormats)>());
 
@@ -268,7 +266,7 @@ void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch
                            uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
                            uint32 depth, uint32 bpp, uint8 staged) {
   raster::alphaBlend(dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch, width, height, depth,
-                     bpp, raster::kBlendOver, 0, 0, 0, staged);
+                     bpp, RASTER_BLEND_OVER, 0, 0, 0, staged);
 }
 
 }  // extern "C"

@@ -8,18 +8,12 @@
 #include <array>
 
 #include "frameBuffer.h"
+#include "raster.h"
 
 namespace raster {
 
-inline constexpr size_t kBlendOperators = 14;
-inline constexpr uint32 kBlendOver = 3;
-
 /// The most bytes that the staged variant moves at once: whole pixels of every format.
 inline constexpr size_t kStageBytes = 3072;
-
-/// The flags of a blend that the kernels know.
-inline constexpr uint32 kFlagSrcAlpha = 1;
-inline constexpr uint32 kFlagDstAlpha = 2;
 
 /// A rectangle to blend, as rows.
 struct BlendRect {
@@ -31,8 +25,8 @@ struct BlendRect {
   intptr_t srcStep;
   size_t width;
   uint32 height;
-  uint8 srcAlpha;       ///< 255 without kFlagSrcAlpha
-  uint8 dstAlpha;       ///< 255 without kFlagDstAlpha
+  uint8 srcAlpha;       ///< 255 without RASTER_BLEND_USE_SRC_ALPHA
+  uint8 dstAlpha;       ///< 255 without RASTER_BLEND_USE_DST_ALPHA
   uint8 saturateShare;  ///< the source's share of Saturate
 };
 
@@ -46,7 +40,7 @@ struct BlendKernel {
 using BlendVariants = std::array<BlendKernel, 4>;
 
 /// By operator.
-using FormatKernels = std::array<BlendVariants, kBlendOperators>;
+using FormatKernels = std::array<BlendVariants, RASTER_BLEND_COUNT>;
 
 /// The kernels of the formats, for the processor.
 const FormatKernels& blendKernels6();

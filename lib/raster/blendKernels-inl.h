@@ -34,7 +34,7 @@ template <class Format, uint32 kFlags, uint32 kReads, class Part>
 HWY_INLINE auto loadSource(const BlendRect& rect, const uint8* src, Part part) {
   if constexpr ((kReads & kUsesSource) == 0) {
     return Nothing();
-  } else if constexpr ((kFlags & kFlagSrcAlpha) == 0) {
+  } else if constexpr ((kFlags & RASTER_BLEND_USE_SRC_ALPHA) == 0) {
     return Format::loadSource(src, part);
   } else {
     return mul(Format::loadSource(src, part), Format::factorOf(rect.srcAlpha));
@@ -54,7 +54,7 @@ template <class Format, uint32 kFlags, uint32 kReads, class P>
 HWY_INLINE auto scaleDestination(const BlendRect& rect, P before) {
   if constexpr ((kReads & kUsesDestination) == 0) {
     return Nothing();
-  } else if constexpr ((kFlags & kFlagDstAlpha) == 0) {
+  } else if constexpr ((kFlags & RASTER_BLEND_USE_DST_ALPHA) == 0) {
     return before;
   } else {
     return mul(before, Format::factorOf(rect.dstAlpha));
@@ -63,7 +63,7 @@ HWY_INLINE auto scaleDestination(const BlendRect& rect, P before) {
 
 template <class Format, uint32 kFlags, class Opaque>
 HWY_INLINE auto constantFactor(uint8 value, Opaque opaque) {
-  if constexpr ((kFlags & kFlagDstAlpha) == 0) {
+  if constexpr ((kFlags & RASTER_BLEND_USE_DST_ALPHA) == 0) {
     return opaque;
   } else {
     return Format::factorOf(value);
@@ -159,12 +159,12 @@ template <class Format, auto kOperator, uint32 kFlags> void blendRect(const Blen
 /// The flags that make a difference to an operator. One pixel at a time, the constants are always
 /// applied (255 where there is none), for the size of the code.
 template <auto kOperator> constexpr uint32 effective(uint32 flags) {
-  constexpr uint32 kInputsWith = kInputs<kOperator, kFlagDstAlpha>;
+  constexpr uint32 kInputsWith = kInputs<kOperator, RASTER_BLEND_USE_DST_ALPHA>;
   constexpr uint32 kInputsWithout = kInputs<kOperator, 0>;
-  if (HWY_TARGET == HWY_SCALAR) flags = kFlagSrcAlpha | kFlagDstAlpha;
-  if ((kInputsWith & (kUsesDestination | kUsesDstAlpha)) == 0) flags &= ~kFlagDstAlpha;
-  const uint32 inputs = (flags & kFlagDstAlpha) != 0 ? kInputsWith : kInputsWithout;
-  if ((inputs & kUsesSource) == 0) flags &= ~kFlagSrcAlpha;
+  if (HWY_TARGET == HWY_SCALAR) flags = RASTER_BLEND_USE_SRC_ALPHA | RASTER_BLEND_USE_DST_ALPHA;
+  if ((kInputsWith & (kUsesDestination | kUsesDstAlpha)) == 0) flags &= ~RASTER_BLEND_USE_DST_ALPHA;
+  const uint32 inputs = (flags & RASTER_BLEND_USE_DST_ALPHA) != 0 ? kInputsWith : kInputsWithout;
+  if ((inputs & kUsesSource) == 0) flags &= ~RASTER_BLEND_USE_SRC_ALPHA;
   return flags;
 }
 
@@ -187,7 +187,8 @@ constexpr FormatKernels kernelsOf(std::index_sequence<kOps...> /*operators*/) {
   return {variantsOf<Format, std::get<kOps>(kOperators)>()...};
 }
 template <class Format>
-constexpr FormatKernels kKernelsOf = kernelsOf<Format>(std::make_index_sequence<kBlendOperators>());
+constexpr FormatKernels kKernelsOf =
+    kernelsOf<Format>(std::make_index_sequence<RASTER_BLEND_COUNT>());
 
 }  // namespace
 }  // namespace raster::HWY_NAMESPACE

@@ -49,12 +49,13 @@ constexpr auto kSaturate = [](const auto& c) { return add(c.d, mul(c.s, c.f)); }
 constexpr auto kOperators =
     std::make_tuple(kClear, kSource, kDestination, kOver, kOverReverse, kIn, kInReverse, kOut,
                     kOutReverse, kAtop, kAtopReverse, kXor, kAdd, kSaturate);
-static_assert(std::tuple_size_v<decltype(kOperators)> == kBlendOperators);
+static_assert(std::tuple_size_v<decltype(kOperators)> == RASTER_BLEND_COUNT);
 
-/// The inputs that an operator reads, with (kFlagDstAlpha) or without a constant destination alpha.
+/// The inputs that an operator reads, with (RASTER_BLEND_USE_DST_ALPHA) or without a constant
+/// destination alpha.
 template <auto kOperator, uint32 kFlags>
 constexpr uint32 kInputs = [] {
-  constexpr bool kConstant = (kFlags & kFlagDstAlpha) != 0;
+  constexpr bool kConstant = (kFlags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   struct {
     Nothing nothing;
     UsesOf<kUsesSource> s, sa;

@@ -4,10 +4,12 @@
 // planes, format conversion, comparison, blending, scaling, cursors, video and compression.
 //
 // Conventions that hold for every function unless it says otherwise:
-// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next)
-// and
-//   a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel. Base and
-//   pitch may have any alignment. Nothing outside the named rectangle is read or written.
+// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next),
+//   and a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel. Base
+//   and pitch may have any alignment. Nothing outside the named rectangle is read or written.
+// - No pointer may be null unless its function says so, not even where nothing is drawn.
+// - Memory that is read and memory that is written must not overlap unless the function says what
+//   happens then.
 // - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
 // - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
 //   the lowest address.
@@ -19,6 +21,8 @@
 #define RASTER_RASTER_H
 
 #include "baseTypes.h"
+#include "rasterExport.h"
+#include "rasterVersion.h"
 #include "rect.h"
 
 #ifdef __cplusplus
@@ -31,7 +35,7 @@ extern "C" {
 /// before its first copy, on processors with MMX and the non-temporal 64-bit store: copies of at
 /// least 32 bytes by 16 rows then bypass the cache. The pixels are the same either way. The library
 /// never writes it.
-extern TARNLIBS_EXPORT uint32 rasterops_mmx;
+extern RASTER_EXPORT uint32 rasterops_mmx;
 
 /// Stores `pixel` in every pixel of a rectangle.
 ///
@@ -42,8 +46,8 @@ extern TARNLIBS_EXPORT uint32 rasterops_mmx;
 ///
 /// Deliberate: for 2- and 4-byte pixels the first row is found with the full pitch, and rows after
 /// it step by the pitch rounded down to a multiple of the pixel size.
-TARNLIBS_EXPORT void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPixel, uint32 pixel,
-                                     uint32 x, uint32 y, uint32 width, uint32 height);
+RASTER_EXPORT void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPixel, uint32 pixel,
+                                   uint32 x, uint32 y, uint32 width, uint32 height);
 
 /// Copies a rectangle within a frame buffer or between two with the same pixel size.
 ///
@@ -52,14 +56,14 @@ TARNLIBS_EXPORT void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPix
 /// within the other's is moved as by memmove. `bytesPerPixel` may have any value, since bytes are
 /// copied. With rasterops_mmx set, rows that do not overlap bypass the cache when the rectangle has
 /// at least 32 bytes a row and 16 rows.
-TARNLIBS_EXPORT void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPitch,
-                                     uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
-                                     uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPitch,
+                                   uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX,
+                                   uint32 dstY, uint32 width, uint32 height);
 
 /// Sets bits 24-31 of every pixel of a rectangle of 4-byte pixels to `alpha`; bits 0-23 stay.
 /// Rows step by the full pitch.
-TARNLIBS_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y,
-                                          uint32 width, uint32 height);
+RASTER_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y,
+                                        uint32 width, uint32 height);
 
 // ---- Raster operations -------------------------------------------------------------------------
 
@@ -79,6 +83,27 @@ TARNLIBS_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, 
 // error: nothing is written, as for noop. Operations that do not depend on the source do not read
 // it, and those that do not depend on the destination do not read that.
 
+/// The operation codes by name, for parameters called `rop`.
+enum {
+  RASTER_ROP_CLEAR = 0,
+  RASTER_ROP_AND = 1,
+  RASTER_ROP_AND_REVERSE = 2,
+  RASTER_ROP_COPY = 3,
+  RASTER_ROP_AND_INVERTED = 4,
+  RASTER_ROP_NOOP = 5,
+  RASTER_ROP_XOR = 6,
+  RASTER_ROP_OR = 7,
+  RASTER_ROP_NOR = 8,
+  RASTER_ROP_EQUIV = 9,
+  RASTER_ROP_INVERT = 10,
+  RASTER_ROP_OR_REVERSE = 11,
+  RASTER_ROP_COPY_INVERTED = 12,
+  RASTER_ROP_OR_INVERTED = 13,
+  RASTER_ROP_NAND = 14,
+  RASTER_ROP_SET = 15,
+  RASTER_ROP_COUNT = 16
+};
+
 /// Combines `pixel` with every pixel of a rectangle through operation `rop`.
 ///
 /// `pitch` is in bytes and may be negative; `bytesPerPixel` is 1, 2, 3 or 4, and the low bytes of
@@ -88,9 +113,9 @@ TARNLIBS_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, 
 ///
 /// Deliberate: for 2- and 4-byte pixels the first row is found with the full pitch, and rows after
 /// it step by the pitch rounded down (toward minus infinity) to a multiple of the pixel size.
-TARNLIBS_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pixel,
-                                        uint32 rop, uint32 x, uint32 y, uint32 width,
-                                        uint32 height);
+RASTER_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pixel,
+                                      uint32 rop, uint32 x, uint32 y, uint32 width, uint32 height);
+
 /// Combines a source rectangle with a destination rectangle of the same size through operation
 /// `rop`, within a frame buffer or between two with the same pixel size.
 ///
@@ -110,10 +135,9 @@ TARNLIBS_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerP
 /// Deliberate: `rop` stands between the coordinates. For 2- and 4-byte pixels the first row is
 /// found with the full pitch, and rows after it step by the pitch, negated where rows run up, and
 /// then rounded down (toward minus infinity) to a multiple of the pixel size.
-TARNLIBS_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src,
-                                        int32 srcPitch, uint32 bytesPerPixel, uint32 srcX,
-                                        uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY,
-                                        uint32 width, uint32 height);
+RASTER_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch,
+                                      uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop,
+                                      uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
 // ---- Tiling ------------------------------------------------------------------------------------
 
@@ -127,10 +151,11 @@ TARNLIBS_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8*
 // rows after it step by the pitches rounded down to a multiple of the pixel size.
 
 /// Fills a rectangle with a repeated pixmap. As Raster_RectPixmapROPcopy with operation 3.
-TARNLIBS_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
-                                           uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
-                                           uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
-                                           uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
+                                         uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
+                                         uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
+                                         uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+
 /// Combines a repeated pixmap with a rectangle through operation `rop` (0 to 15, see above; higher
 /// ones write nothing).
 ///
@@ -138,32 +163,29 @@ TARNLIBS_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const ui
 /// zero, before anything else is looked at. A `bytesPerPixel` other than 1, 2, 3 or 4 calls
 /// Warning("Raster: Unsupported frame buffer depth\n") and then Panic("NOT_IMPLEMENTED %s:%d\n")
 /// with "lib/raster/rasterpix". A width or height of 0 writes nothing.
-TARNLIBS_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
-                                              uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
-                                              uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
-                                              uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                                              uint32 height);
+RASTER_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
+                                            uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
+                                            uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
+                                            uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
+                                            uint32 height);
+
 /// The blocks of Raster_RectPixmapROPcopy by pixel size (8, 16, 24, 32 bits): combine the rectangle
 /// at (srcX, srcY) of `src` into the one at (dstX, dstY) of `dst`, without wrapping, always top
 /// down and from left to right. Nothing looks for overlap: where `src` lies in what has been
 /// written already, the new pixels are the source. Operation 3 is such a walk too, not
 /// Raster_RectCopy.
-TARNLIBS_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
-                                              uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
-                                              uint32 dstX, uint32 dstY, uint32 width,
-                                              uint32 height);
-TARNLIBS_EXPORT void RasterRectPixmapROPcopy16(uint8* dst, uint32 dstPitch, const uint8* src,
-                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
-                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                                               uint32 height);
-TARNLIBS_EXPORT void RasterRectPixmapROPcopy24(uint8* dst, uint32 dstPitch, const uint8* src,
-                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
-                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                                               uint32 height);
-TARNLIBS_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, const uint8* src,
-                                               uint32 srcPitch, uint32 srcX, uint32 srcY,
-                                               uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                                               uint32 height);
+RASTER_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
+                                            uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
+                                            uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void RasterRectPixmapROPcopy16(uint8* dst, uint32 dstPitch, const uint8* src,
+                                             uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
+                                             uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void RasterRectPixmapROPcopy24(uint8* dst, uint32 dstPitch, const uint8* src,
+                                             uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
+                                             uint32 dstX, uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, const uint8* src,
+                                             uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
+                                             uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
 // ---- Bit planes --------------------------------------------------------------------------------
 
@@ -180,40 +202,43 @@ TARNLIBS_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, cons
 // warning.
 
 /// Writes `foreground` where a bit of the plane is set and `background` where it is clear.
-TARNLIBS_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                         uint32 dstPitch, int32 bytesPerPixel, int32 width,
-                                         int32 height, uint32 foreground, uint32 background);
+RASTER_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                       uint32 dstPitch, int32 bytesPerPixel, int32 width,
+                                       int32 height, uint32 foreground, uint32 background);
+
 /// Writes `foreground` where a bit of the plane is set; pixels of clear bits stay.
-TARNLIBS_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                                uint32 dstPitch, int32 bytesPerPixel, int32 width,
-                                                int32 height, uint32 foreground);
+RASTER_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                              uint32 dstPitch, int32 bytesPerPixel, int32 width,
+                                              int32 height, uint32 foreground);
+
 /// Raster_BitsToPixels for one pixel size (8, 16, 24, 32 bits), of which the low bits of the values
 /// are used.
-TARNLIBS_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                         uint32 dstPitch, int32 width, int32 height,
-                                         uint32 foreground, uint32 background);
-TARNLIBS_EXPORT void RasterBitsToPixels16(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                          uint32 dstPitch, int32 width, int32 height,
-                                          uint32 foreground, uint32 background);
-TARNLIBS_EXPORT void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                          uint32 dstPitch, int32 width, int32 height,
-                                          uint32 foreground, uint32 background);
-TARNLIBS_EXPORT void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                          uint32 dstPitch, int32 width, int32 height,
-                                          uint32 foreground, uint32 background);
+RASTER_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                       uint32 dstPitch, int32 width, int32 height,
+                                       uint32 foreground, uint32 background);
+RASTER_EXPORT void RasterBitsToPixels16(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                        uint32 dstPitch, int32 width, int32 height,
+                                        uint32 foreground, uint32 background);
+RASTER_EXPORT void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                        uint32 dstPitch, int32 width, int32 height,
+                                        uint32 foreground, uint32 background);
+RASTER_EXPORT void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                        uint32 dstPitch, int32 width, int32 height,
+                                        uint32 foreground, uint32 background);
+
 /// Raster_BitsToPixelsStencil for one pixel size (8, 16, 24, 32 bits).
-TARNLIBS_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                                uint32 dstPitch, int32 width, int32 height,
-                                                uint32 foreground);
-TARNLIBS_EXPORT void RasterBitsToPixelsStencil16(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                                 uint32 dstPitch, int32 width, int32 height,
-                                                 uint32 foreground);
-TARNLIBS_EXPORT void RasterBitsToPixelsStencil24(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                                 uint32 dstPitch, int32 width, int32 height,
-                                                 uint32 foreground);
-TARNLIBS_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPitch, uint8* dst,
-                                                 uint32 dstPitch, int32 width, int32 height,
-                                                 uint32 foreground);
+RASTER_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                              uint32 dstPitch, int32 width, int32 height,
+                                              uint32 foreground);
+RASTER_EXPORT void RasterBitsToPixelsStencil16(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                               uint32 dstPitch, int32 width, int32 height,
+                                               uint32 foreground);
+RASTER_EXPORT void RasterBitsToPixelsStencil24(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                               uint32 dstPitch, int32 width, int32 height,
+                                               uint32 foreground);
+RASTER_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPitch, uint8* dst,
+                                               uint32 dstPitch, int32 width, int32 height,
+                                               uint32 foreground);
 
 // ---- Pixel formats and conversion --------------------------------------------------------------
 //
@@ -234,16 +259,27 @@ TARNLIBS_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsP
 // true colour. Narrowing a channel keeps its top bits, without rounding or dithering; widening
 // repeats the top bits in the new low ones.
 
+/// The format codes by name: the bits of red, green and blue, from the top.
+enum {
+  RASTER_FORMAT_111 = 3,
+  RASTER_FORMAT_222 = 6,
+  RASTER_FORMAT_233 = 8,  ///< blue is on top here
+  RASTER_FORMAT_555 = 15,
+  RASTER_FORMAT_565 = 16,
+  RASTER_FORMAT_888 = 24,
+  RASTER_FORMAT_8888 = 32
+};
+
 /// Whether a frame buffer of this colour depth and these bits per pixel is one that the library can
 /// work with: pseudo-colour with 8 bits (the depth is not looked at), depth 24 with 24 or 32 bits,
 /// depth 15 or 16 with 16 bits.
 ///
 /// Deliberate: depth 32 is refused; pixels with an unused byte have depth 24.
-TARNLIBS_EXPORT bool Raster_IsModeReasonable(uint32 depth, uint32 bpp, bool pseudoColor);
+RASTER_EXPORT bool Raster_IsModeReasonable(uint32 depth, uint32 bpp, bool pseudoColor);
 
 /// The format code of a depth and a pixel size: 32 for depth 24 in 32 bits, else the depth itself,
 /// whatever it is.
-TARNLIBS_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
+RASTER_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
 
 /// Converts one pixel value. `srcDepth` (15, 16, 24, 32) and `dstDepth` (3, 6, 8, 15, 16, 24, 32)
 /// are format codes; 24 and 32 mean the same value here. With `pseudoColor`, `srcDepth` must be 8
@@ -261,8 +297,8 @@ TARNLIBS_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
 /// - "Raster convert pixels invalid depth for pseudo color %d\n" (srcDepth)
 /// - "Raster convert one pixel invalid source depth %d\n" (srcDepth)
 /// - "Raster convert one pixel invalid depth %d\n" (dstDepth)
-TARNLIBS_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
-                                              bool pseudoColor, const uint32* palette);
+RASTER_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
+                                            bool pseudoColor, const uint32* palette);
 
 /// Converts a rectangle of pixels from one frame buffer into another, which must not overlap it.
 ///
@@ -282,24 +318,22 @@ TARNLIBS_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int3
 /// - "Raster convert pixels invalid depth for pseudo color %d\n" (srcDepth)
 /// - "Raster convert pixels invalid source depth %d\n" (srcDepth)
 /// - "Raster convert pixels invalid depth %d\n" (dstDepth, after srcDepth)
-TARNLIBS_EXPORT void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth,
-                                          const void* src, uint32 srcPitch, int32 srcDepth,
-                                          bool pseudoColor, const uint32* palette, uint32 srcX,
-                                          uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
-                                          uint32 height);
+RASTER_EXPORT void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth, const void* src,
+                                        uint32 srcPitch, int32 srcDepth, bool pseudoColor,
+                                        const uint32* palette, uint32 srcX, uint32 srcY,
+                                        uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
 /// Raster_ConvertPixels with destination code 32.
-TARNLIBS_EXPORT void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src,
-                                              uint32 srcPitch, int32 srcDepth, bool pseudoColor,
-                                              const uint32* palette, uint32 srcX, uint32 srcY,
-                                              uint32 dstX, uint32 dstY, uint32 width,
-                                              uint32 height);
+RASTER_EXPORT void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src,
+                                            uint32 srcPitch, int32 srcDepth, bool pseudoColor,
+                                            const uint32* palette, uint32 srcX, uint32 srcY,
+                                            uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
 /// Raster_ConvertPixels with source code 32 and no palette.
-TARNLIBS_EXPORT void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth,
-                                                const uint32* src, uint32 srcPitch, uint32 srcX,
-                                                uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
-                                                uint32 height);
+RASTER_EXPORT void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth,
+                                              const uint32* src, uint32 srcPitch, uint32 srcX,
+                                              uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
+                                              uint32 height);
 
 /// Copies a rectangle of pixels into another frame buffer, which must not overlap it.
 ///
@@ -307,13 +341,11 @@ TARNLIBS_EXPORT void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int3
 /// Rows step by the full pitch.
 ///
 /// Deliberate: the depth is not checked; one below 8 that is no format copies nothing.
-TARNLIBS_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src, uint32 srcPitch,
-                                       int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
-                                       uint32 dstY, uint32 width, uint32 height);
+RASTER_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src, uint32 srcPitch,
+                                     int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
+                                     uint32 dstY, uint32 width, uint32 height);
 
 // ---- Rect lists --------------------------------------------------------------------------------
-
-// NOLINTBEGIN(modernize-use-using)
 
 /// One rectangle of a list, by origin and size.
 typedef struct RectListEntry {
@@ -330,8 +362,6 @@ typedef struct RectList {
   RectListEntry rects[RASTER_RECT_LIST_SIZE];
 } RectList;
 
-// NOLINTEND(modernize-use-using)
-
 // A sweep over the scanlines where rectangles begin or end rebuilds the whole list: a rectangle of
 // the result goes on downwards exactly as long as the region has the same horizontal extent there,
 // touching rectangles are joined, and rectangles are listed by top, then by x. The result has at
@@ -340,7 +370,7 @@ typedef struct RectList {
 // list must not be used by two threads at once.
 
 /// Sets all 16 entries to zero.
-TARNLIBS_EXPORT void Raster_ClearRectList(RectList* list);
+RASTER_EXPORT void Raster_ClearRectList(RectList* list);
 
 /// Adds a rectangle to the region and returns the area of the whole in pixels (modulo 2^32, as all
 /// areas here). When that takes more than 15 rectangles, the region becomes its bounding box.
@@ -354,7 +384,7 @@ TARNLIBS_EXPORT void Raster_ClearRectList(RectList* list);
 /// come to life by that, but their tops and bottoms do not count as scanlines of the sweep.
 /// Deliberate: when all 16 entries are in use, the new rectangle is dropped and the list only
 /// rebuilt.
-TARNLIBS_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
+RASTER_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
 
 /// Takes a rectangle out of the region and returns the area that is left. A width or height of 0,
 /// or a list whose first entry is empty by width or by height, changes nothing and returns 0.
@@ -365,7 +395,7 @@ TARNLIBS_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 wi
 /// negative width a span that holds both x + width and x is left as two spans that overlap.
 /// Deliberate: when all 16 entries are in use, the tops and bottoms of the list alone are scanlines
 /// of the sweep, and the subtraction takes effect from one to the next of these.
-TARNLIBS_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
+RASTER_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
 
 // ---- Comparison --------------------------------------------------------------------------------
 //
@@ -376,9 +406,9 @@ TARNLIBS_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 wi
 /// Compares the rectangle at (aX, aY) of `a` with the one at (bX, bY) of `b`, row by row from the
 /// top: 0 when they are equal, otherwise a number with memcmp's sign for the first byte that
 /// differs. Both bits per pixel must be the same multiple of 8, whatever the size of the rectangle.
-TARNLIBS_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 aBpp, const void* b,
-                                           uint32 bPitch, int32 bBpp, uint32 aX, uint32 aY,
-                                           uint32 bX, uint32 bY, uint32 width, uint32 height);
+RASTER_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 aBpp, const void* b,
+                                         uint32 bPitch, int32 bBpp, uint32 aX, uint32 aY, uint32 bX,
+                                         uint32 bY, uint32 width, uint32 height);
 
 /// Compares every rectangle of a list at the same position in both buffers: 0, or the first result
 /// of Raster_ComparePixels that is not 0. The bits per pixel are not looked at when the list is
@@ -386,8 +416,8 @@ TARNLIBS_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 a
 ///
 /// Deliberate: the walk ends at the first entry whose height or width is not positive and nowhere
 /// else, so after a full list there must be such an entry in memory.
-TARNLIBS_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aBpp, const void* b,
-                                          uint32 bPitch, int32 bBpp, const RectList* rects);
+RASTER_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aBpp, const void* b,
+                                        uint32 bPitch, int32 bBpp, const RectList* rects);
 
 /// Whether two whole images agree under a mask, but for `maxDiffs` pixels' worth of bytes.
 ///
@@ -399,12 +429,37 @@ TARNLIBS_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aB
 ///
 /// Deliberate: differing bytes are counted, not pixels, against `maxDiffs` times the bytes per
 /// pixel; in 4-byte pixels (25 to 32 bits) the fourth byte is not counted but stands in the limit.
-TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 aBpp, const uint8* b,
-                                          uint32 bPitch, int32 bBpp, const uint8* mask,
-                                          uint32 maskPitch, int32 maskBpp, int32 x, int32 y,
-                                          uint32 width, uint32 height, int32 maxDiffs);
+RASTER_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 aBpp, const uint8* b,
+                                        uint32 bPitch, int32 bBpp, const uint8* mask,
+                                        uint32 maskPitch, int32 maskBpp, int32 x, int32 y,
+                                        uint32 width, uint32 height, int32 maxDiffs);
 
 // ---- Alpha blending ----------------------------------------------------------------------------
+
+/// The operators of Raster_AlphaBlend by name, for its parameter `op`.
+enum {
+  RASTER_BLEND_CLEAR = 0,
+  RASTER_BLEND_SOURCE = 1,
+  RASTER_BLEND_DESTINATION = 2,
+  RASTER_BLEND_OVER = 3,
+  RASTER_BLEND_OVER_REVERSE = 4,
+  RASTER_BLEND_IN = 5,
+  RASTER_BLEND_IN_REVERSE = 6,
+  RASTER_BLEND_OUT = 7,
+  RASTER_BLEND_OUT_REVERSE = 8,
+  RASTER_BLEND_ATOP = 9,
+  RASTER_BLEND_ATOP_REVERSE = 10,
+  RASTER_BLEND_XOR = 11,
+  RASTER_BLEND_ADD = 12,
+  RASTER_BLEND_SATURATE = 13,
+  RASTER_BLEND_COUNT = 14
+};
+
+/// The bits of its parameter `flags`.
+enum {
+  RASTER_BLEND_USE_SRC_ALPHA = 1,  ///< scale the source by `srcAlpha`
+  RASTER_BLEND_USE_DST_ALPHA = 2   ///< scale the destination by `dstAlpha`, which is its alpha then
+};
 
 /// Composites a rectangle of 4-byte source pixels with alpha onto a frame buffer without.
 ///
@@ -459,24 +514,25 @@ TARNLIBS_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 a
 ///   channel 0 is in the top bits, in all other depths in the lowest.
 /// - Operator 13 with bit 1 of `flags` and `dstAlpha` 0 divides by zero: where there is a pixel to
 ///   blend the call raises SIGFPE, and traps should a handler return.
-TARNLIBS_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
-                                       const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
-                                       uint32 width, uint32 height, uint32 depth, uint32 bpp,
-                                       uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
-                                       uint8 staged);
+RASTER_EXPORT void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
+                                     const uint8* src, uint32 srcX, uint32 srcY, uint32 srcPitch,
+                                     uint32 width, uint32 height, uint32 depth, uint32 bpp,
+                                     uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
+                                     uint8 staged);
+
 /// Raster_AlphaBlend with operator 3 (Over) and without constant alphas.
-TARNLIBS_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
-                                           const uint8* src, uint32 srcX, uint32 srcY,
-                                           uint32 srcPitch, uint32 width, uint32 height,
-                                           uint32 depth, uint32 bpp, uint8 staged);
+RASTER_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch,
+                                         const uint8* src, uint32 srcX, uint32 srcY,
+                                         uint32 srcPitch, uint32 width, uint32 height, uint32 depth,
+                                         uint32 bpp, uint8 staged);
 
 // ---- Scaling -----------------------------------------------------------------------------------
 
 /// Always true. Nothing needs to be set up before Raster_Scale.
-TARNLIBS_EXPORT bool Raster_ScaleInit(void);
+RASTER_EXPORT bool Raster_ScaleInit(void);
 
 /// Does nothing.
-TARNLIBS_EXPORT void Raster_ScaleExit(void);
+RASTER_EXPORT void Raster_ScaleExit(void);
 
 /// Draws a rectangle of a scaled picture: the destination rectangle (x1, y1)-(x2, y2), x2 and y2
 /// exclusive, of the source enlarged or reduced by `scaleX` and `scaleY` (destination pixels per
@@ -513,23 +569,29 @@ TARNLIBS_EXPORT void Raster_ScaleExit(void);
 /// Returns true when the rectangle was drawn or there was nothing to draw (an empty rectangle, a
 /// size of 0). Returns false, and draws nothing, in this order:
 /// - when x1 or y1 is negative, or x2 or y2 beyond the destination;
+
 /// - when dstBpp < dstDepth, with
 ///   Log("%s: Dest color format (depth %d, BPP %d) is not supported.\n");
+
 /// - when the formats are no pair from above, with
 ///   Log("%s: Color depth conversion from D%dB%d to D%dB%d is not supported.\n");
+
 /// - when dstBpp is no multiple of 8;
+
 /// - when dstDepth is no multiple of 8 (so depth 15 is refused), with
 ///   Log("Raster_Scale: Dest depth %d is not supported.\n");
+
 /// - when a size is 32768 or more;
+
 /// - when a factor is not greater than 1/32767.
 /// %s is "Raster_Scale". Each message is logged at most once per process (a race of threads cannot
 /// repeat it); that is all the state there is. Working memory comes from UtilSafeMalloc0.
-TARNLIBS_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth,
-                                  uint32 dstWidth, uint32 dstHeight, uint32 dstIgnored, int32 x1,
-                                  int32 y1, int32 x2, int32 y2, const void* srcBits, int32 srcPitch,
-                                  uint32 srcBpp, int32 srcDepth, uint32 srcIgnored, uint32 srcWidth,
-                                  uint32 srcHeight, uint32 ignored, double scaleX, double scaleY,
-                                  int32 smooth);
+RASTER_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth,
+                                uint32 dstWidth, uint32 dstHeight, uint32 dstIgnored, int32 x1,
+                                int32 y1, int32 x2, int32 y2, const void* srcBits, int32 srcPitch,
+                                uint32 srcBpp, int32 srcDepth, uint32 srcIgnored, uint32 srcWidth,
+                                uint32 srcHeight, uint32 ignored, double scaleX, double scaleY,
+                                int32 smooth);
 
 /// Maps a rectangle of a scaled picture, in place, to the rectangle of the unscaled picture that
 /// contributes to it, and returns its new bottom.
@@ -540,12 +602,10 @@ TARNLIBS_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp,
 /// ceil(side * invScale + m), at most the truncated size * invScale. So there is a margin of one
 /// source pixel (of one step when reducing) for what smoothing mixes in. Only the near sides are
 /// bounded below and only the far sides above. Numbers beyond 32 bits saturate.
-TARNLIBS_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 height,
-                                                 double invScaleX, double invScaleY);
+RASTER_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 height,
+                                               double invScaleX, double invScaleY);
 
 // ---- Cursors -----------------------------------------------------------------------------------
-
-// NOLINTBEGIN(modernize-use-using)
 
 /// The kinds of cursor: an AND and an XOR plane in the frame buffer's format, or pixels with alpha.
 enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
@@ -592,33 +652,35 @@ typedef struct RasterCursorBox {
   int32 srcY;
 } RasterCursorBox;
 
-// NOLINTEND(modernize-use-using)
-
 /// The bytes of a cursor plane whose rows are padded to a multiple of 32 bits:
 /// (width x bitsPerPixel + 31) / 32 x 4 bytes a row. 0xFFFFFFFF where the product, the sum or the
 /// whole does not fit 32 bits; rows are checked even when there are none.
-TARNLIBS_EXPORT uint32 Raster_CalculateCursorSize(uint32 width, uint32 height, uint32 bitsPerPixel);
+RASTER_EXPORT uint32 Raster_CalculateCursorSize(uint32 width, uint32 height, uint32 bitsPerPixel);
+
 /// Expands a plane of 1-bit pixels to pixels of `bitsPerPixel` / 8 bytes (1 to 4; nothing happens
 /// for other sizes): a set bit gives a pixel of ones, a clear bit one of zeros. Bits are taken from
 /// the highest down. Rows of both planes are padded as by Raster_CalculateCursorSize; the padding
 /// of `dst` is not written. Ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor"
 /// when the plane has more than `dstSize` bytes.
-TARNLIBS_EXPORT void Raster_ExpandCursorBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel,
-                                                 const uint8* bits, uint8* dst, uint32 dstSize);
+RASTER_EXPORT void Raster_ExpandCursorBitPlane(uint32 width, uint32 height, uint32 bitsPerPixel,
+                                               const uint8* bits, uint8* dst, uint32 dstSize);
+
 /// Stores the AND plane and behind it the XOR plane of a cursor in `dst`, each of
 /// Raster_CalculateCursorSize(width, height, bitsPerPixel) bytes. A plane of depth 1 is expanded as
 /// by Raster_ExpandCursorBitPlane, one of depth `bitsPerPixel` copied with its padding. Ends in
 /// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor" when both planes need more than
 /// `dstSize` bytes, or for any other depth; the AND plane is stored before `xorDepth` is looked at.
-TARNLIBS_EXPORT void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
-                                                   const uint8* andBits, uint32 xorDepth,
-                                                   const uint8* xorBits, uint32 bitsPerPixel,
-                                                   uint8* dst, uint32 dstSize);
+RASTER_EXPORT void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
+                                                 const uint8* andBits, uint32 xorDepth,
+                                                 const uint8* xorBits, uint32 bitsPerPixel,
+                                                 uint8* dst, uint32 dstSize);
+
 /// Clips a cursor, placed with its hot spot at (x, y), to the frame buffer. Returns false, and
 /// leaves `box` alone, when nothing of it is visible. Sizes above 2^31 - 1 count as negative.
-TARNLIBS_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
-                                             const RasterCursor* cursor, int32 x, int32 y,
-                                             RasterCursorBox* box);
+RASTER_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
+                                           const RasterCursor* cursor, int32 x, int32 y,
+                                           RasterCursorBox* box);
+
 /// Draws the part of a cursor that `box` (from Raster_ComputeCursorBox) names.
 ///
 /// When `saveBits` is null the cursor is drawn into the frame buffer. Otherwise the area of the box
@@ -630,38 +692,39 @@ TARNLIBS_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
 ///
 /// Ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCursor", after the copy, for a
 /// mask cursor whose depth or bpp is not the frame buffer's and for any other type.
-TARNLIBS_EXPORT void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb,
-                                       uint8* saveBits, uint32 savePitch,
-                                       const RasterCursor* cursor, const RasterCursorBox* box);
+RASTER_EXPORT void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb,
+                                     uint8* saveBits, uint32 savePitch, const RasterCursor* cursor,
+                                     const RasterCursorBox* box);
+
 /// The sizes of a cursor of 4-byte pixels scaled by `scaleX` and `scaleY`, and its hot spot there.
 ///
 /// For smoothing to spread, the cursor gets a margin of max(1 / scale, scale) + 1 pixels on every
 /// side (numbers toward zero), which gives the padded size; the scaled size is that times the
 /// factors, rounded up. `scaledHot[0]` and `[1]` are (hot spot + margin) x factor, toward zero.
 /// Returns scaledWidth x 4 x scaledHeight, the bytes of the scaled image. Sizes wrap at 2^32.
-TARNLIBS_EXPORT uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight,
-                                                  uint32* scaledWidth, uint32* scaledHeight,
-                                                  int32* scaledHot, uint32 width, uint32 height,
-                                                  double scaleX, double scaleY, int32 hotX,
-                                                  int32 hotY);
+RASTER_EXPORT uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight,
+                                                uint32* scaledWidth, uint32* scaledHeight,
+                                                int32* scaledHot, uint32 width, uint32 height,
+                                                double scaleX, double scaleY, int32 hotX,
+                                                int32 hotY);
+
 /// Scales the pixels of an alpha cursor into `dst`, smoothly and with a clear margin. Sizes are
 /// those that Raster_GetScaledCursorSize gave for the same cursor and factors; rows of `dst` are 4
 /// x scaledWidth bytes. The scaling is that of Raster_Scale, and `dst` is left alone where that
 /// refuses. Working memory comes from UtilSafeMalloc0.
-TARNLIBS_EXPORT void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX,
-                                             double scaleY, uint32 paddedWidth, uint32 paddedHeight,
-                                             uint32 scaledWidth, uint32 scaledHeight);
+RASTER_EXPORT void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX,
+                                           double scaleY, uint32 paddedWidth, uint32 paddedHeight,
+                                           uint32 scaledWidth, uint32 scaledHeight);
+
 /// Scales both planes of a mask cursor, which must be 4-byte pixels, to their nearest pixels: the
 /// AND plane with a margin of ones, the XOR plane with one of zeros. Otherwise as
 /// Raster_ScaleAlphaCursor.
-TARNLIBS_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst,
-                                             const RasterCursor* cursor, double scaleX,
-                                             double scaleY, uint32 paddedWidth, uint32 paddedHeight,
-                                             uint32 scaledWidth, uint32 scaledHeight);
+RASTER_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const RasterCursor* cursor,
+                                           double scaleX, double scaleY, uint32 paddedWidth,
+                                           uint32 paddedHeight, uint32 scaledWidth,
+                                           uint32 scaledHeight);
 
 // ---- Video -------------------------------------------------------------------------------------
-
-// NOLINTBEGIN(modernize-use-using)
 
 /// How a component is put into a channel: ((component * multiplier) >> shift) & mask.
 typedef struct RasterRGBParam {
@@ -670,7 +733,12 @@ typedef struct RasterRGBParam {
   uint32 mask;
 } RasterRGBParam;
 
-// NOLINTEND(modernize-use-using)
+/// The frame layouts of Raster_YUVtoRGB: four characters, the first one in the low byte.
+enum {
+  RASTER_VIDEO_YUY2 = 0x32595559,
+  RASTER_VIDEO_UYVY = 0x59565955,
+  RASTER_VIDEO_YV12 = 0x32315659
+};
 
 /// Converts a video frame to packed RGB by the BT.601 equation with limited range:
 ///
@@ -680,11 +748,11 @@ typedef struct RasterRGBParam {
 ///
 /// with an arithmetic shift, each limited to 0..255. `width` and `height` are in pixels.
 ///
-/// `format` is a four-character code, its first character in the low byte:
-/// - "YUY2" (0x32595559) and "UYVY" (0x59565955): width x height / 2 groups of four bytes, without
-///   row padding: Y0 Cr Y1 Cb, and Cr Y0 Cb Y1. With an odd number of pixels the last one is not
+/// `format` is one of RASTER_VIDEO_...:
+/// - "YUY2" and "UYVY": width x height / 2 groups of four bytes, without row padding: Y0 Cr Y1 Cb,
+/// and Cr Y0 Cb Y1. With an odd number of pixels the last one is not
 ///   written.
-/// - "YV12" (0x32315659): a plane of Y, one of Cb and one of Cr, each right after the other. Rows
+/// - "YV12": a plane of Y, one of Cb and one of Cr, each right after the other. Rows
 ///   of Y are `width` rounded up to even bytes apart and their number is `height` rounded up to
 ///   even; the other planes have half of both. A last odd row or column is not written.
 ///
@@ -706,13 +774,13 @@ typedef struct RasterRGBParam {
 /// in the process, Log("Raster_YUVtoRGB: bppdepth:%d not supported.\n") or
 /// Log("Raster_YUVtoRGB: format:%u not supported.\n"). Source and destination must not overlap, and
 /// may have any alignment. The size of the source is trusted.
-TARNLIBS_EXPORT void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height,
-                                     uint32 format, int32 bppdepth);
+RASTER_EXPORT void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height,
+                                   uint32 format, int32 bppdepth);
 
 /// One pixel 0x00RRGGBB of a luma, blue-difference `u` and red-difference `v`, by the equation of
 /// Raster_YUVtoRGB. Deliberate: without the rounding term 128, so that white (235, 128, 128) is
 /// 0x00FEFEFE.
-TARNLIBS_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
+RASTER_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
 
 /// Fills `param` so that a component of `bits` bits is put into the lowest run of set bits of
 /// `mask`: a narrower field gets its top bits, a wider one the component repeated. Returns the
@@ -721,7 +789,7 @@ TARNLIBS_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
 /// the run; where that is negative, the multiplier is shifted left by as much and the shift is 0.
 ///
 /// `bits` must be 1 to 32 and `mask` not 0: debug builds assert it.
-TARNLIBS_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask);
+RASTER_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask);
 
 // ---- Compression -------------------------------------------------------------------------------
 
@@ -740,8 +808,8 @@ TARNLIBS_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits
 ///
 /// Any other `bpp` ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCompress" and
 /// 114.
-TARNLIBS_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width,
-                                     uint32 height, uint8** outBlock, uint32* outSize);
+RASTER_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width,
+                                   uint32 height, uint8** outBlock, uint32* outSize);
 
 /// Unpacks a block: stores the pitch in bytes, bits per pixel, width and height of its header, and
 /// in `outData` a new buffer of height x pitch bytes from UtilSafeMalloc0, which the caller
@@ -756,8 +824,8 @@ TARNLIBS_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, 
 /// "lib/raster/rasterCompress" and 187; with any other number but 32 the buffer is returned as
 /// allocated. The block is trusted: a code that claims more pixels than the header runs over the
 /// buffer's end.
-TARNLIBS_EXPORT void Raster_Decompress(const uint8* block, uint8** outData, uint32* outPitch,
-                                       uint32* outBpp, uint32* outWidth, uint32* outHeight);
+RASTER_EXPORT void Raster_Decompress(const uint8* block, uint8** outData, uint32* outPitch,
+                                     uint32* outBpp, uint32* outWidth, uint32* outHeight);
 
 #ifdef __cplusplus
 }

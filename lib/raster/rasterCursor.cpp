@@ -28,8 +28,6 @@ static_assert(sizeof(RasterFrameBufferDesc) == 20 && sizeof(RasterCursorBox) == 
 constexpr uint32 kTooLarge = 0xFFFFFFFF;
 
 // The raster operations that draw a mask cursor.
-constexpr uint32 kAnd = 1;
-constexpr uint32 kXor = 6;
 
 /// The bytes of a plane, or kTooLarge when a step on the way does not fit 32 bits.
 uint32 planeSize(uint32 width, uint32 height, uint32 bitsPerPixel) {
@@ -88,7 +86,7 @@ void drawAlpha(const Target& to, const RasterFrameBufferDesc& fb, const RasterCu
                const RasterCursorBox& box) {
   alphaBlend(to.bits, to.x, to.y, to.pitch, cursor.image.pixels, static_cast<uint32>(box.srcX),
              static_cast<uint32>(box.srcY), 4 * cursor.width, static_cast<uint32>(box.width),
-             static_cast<uint32>(box.height), fb.depth, fb.bpp, kBlendOver, 0, 0, 0, 0);
+             static_cast<uint32>(box.height), fb.depth, fb.bpp, RASTER_BLEND_OVER, 0, 0, 0, 0);
 }
 
 void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor,
@@ -99,8 +97,8 @@ void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor
                 static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x, to.y,
                 static_cast<uint32>(box.width), static_cast<uint32>(box.height));
   };
-  combine(cursor.image.mask.andMask, kAnd);
-  combine(cursor.image.mask.xorMask, kXor);
+  combine(cursor.image.mask.andMask, RASTER_ROP_AND);
+  combine(cursor.image.mask.xorMask, RASTER_ROP_XOR);
 }
 
 }  // namespace

@@ -248,7 +248,7 @@ YuvFrame planarFrame(const uint8* src, uint8* dst, uint32 width, uint32 height, 
   uint32 size = 0;
   uint32 pitches[3];
   uint32 offsets[3];
-  RasterComputeVideoAttributes(kFormatYv12, width, height, &size, pitches, offsets);
+  RasterComputeVideoAttributes(RASTER_VIDEO_YV12, width, height, &size, pitches, offsets);
   const size_t dstPitch = size_t{width} * bytes;
   return {.luma = {src + offsets[0], 2 * size_t{pitches[0]}},
           .cb = {src + offsets[1], pitches[1]},
@@ -265,11 +265,11 @@ void yuvToRgb(const uint8* src, uint8* dst, uint32 width, uint32 height, uint32 
               Output output) {
   const YuvKernels& kernels = chosenKernels<lookUpKernels>();
   switch (format) {
-    case kFormatYuy2:
+    case RASTER_VIDEO_YUY2:
       return kernels.convert[0][output.index](packedFrame(src, dst, width, height));
-    case kFormatUyvy:
+    case RASTER_VIDEO_UYVY:
       return kernels.convert[1][output.index](packedFrame(src, dst, width, height));
-    case kFormatYv12:
+    case RASTER_VIDEO_YV12:
       return kernels.convert[2][output.index](planarFrame(src, dst, width, height, output.bytes));
     default:
       break;

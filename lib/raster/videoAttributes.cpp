@@ -4,6 +4,7 @@
 
 #include "firstTime.h"
 #include "message.h"
+#include "raster.h"
 
 namespace {
 
@@ -21,11 +22,11 @@ bool RasterComputeVideoAttributes(uint32 format, uint32 width, uint32 height, ui
   using namespace raster;
   if (offsets != nullptr) offsets[0] = 0;
   const uint32 evenWidth = roundUpToEven(width);
-  if (format == kFormatYuy2 || format == kFormatUyvy) {
+  if (format == RASTER_VIDEO_YUY2 || format == RASTER_VIDEO_UYVY) {
     *size = height * 2 * evenWidth;
     return true;
   }
-  if (format != kFormatYv12) {
+  if (format != RASTER_VIDEO_YV12) {
     static constinit std::atomic<bool> said{false};
     *size = 0;
     if (firstTime(said))

@@ -1,27 +1,11 @@
 // SPDX-License-Identifier: MIT
 //
-// The video frame layouts: their four-character codes, sizes and planes.
+// The video frame layouts: their sizes and planes.
 
 #ifndef RASTER_VIDEO_ATTRIBUTES_H
 #define RASTER_VIDEO_ATTRIBUTES_H
 
 #include "baseTypes.h"
-
-namespace raster {
-
-/// Four characters in memory order as the number that the interfaces take.
-constexpr uint32 fourCharacters(const char (&code)[5]) {
-  uint32 number = 0;
-  for (unsigned i = 0; i < 4; ++i) number |= static_cast<uint32>(code[i]) << (8 * i);
-  return number;
-}
-
-constexpr uint32 kFormatYuy2 = fourCharacters("YUY2");
-constexpr uint32 kFormatUyvy = fourCharacters("UYVY");
-constexpr uint32 kFormatYv12 = fourCharacters("YV12");
-static_assert(kFormatYuy2 == 0x32595559 && kFormatUyvy == 0x59565955 && kFormatYv12 == 0x32315659);
-
-}  // namespace raster
 
 extern "C" {
 

@@ -11,12 +11,11 @@
 #define RASTER_RECT_H
 
 #include "baseTypes.h"
+#include "rasterExport.h"
 
 #ifdef __cplusplus
 extern "C" {
 #endif
-
-// NOLINTBEGIN(modernize-use-using)
 
 /// The points (x, y) with left <= x < right and top <= y < bottom. Empty when right <= left or
 /// bottom <= top; an empty rectangle keeps whatever coordinates it has.
@@ -32,8 +31,6 @@ typedef struct Point {
   int32 y;
 } Point;
 
-// NOLINTEND(modernize-use-using)
-
 // ---- Rectangles --------------------------------------------------------------------------------
 //
 // Where a sum saturates, a + b is formed with wrap-around; when it went the wrong way the largest
@@ -42,43 +39,43 @@ typedef struct Point {
 
 /// Fills `r` from an origin and a size. True when neither size is negative and neither sum
 /// saturated. A size of 0 is valid. A negative size collapses its side to the origin.
-TARNLIBS_EXPORT bool Rect_SetFromXYWH(Rect* r, int32 x, int32 y, int32 width, int32 height);
+RASTER_EXPORT bool Rect_SetFromXYWH(Rect* r, int32 x, int32 y, int32 width, int32 height);
 
 /// Whether all four fields agree. Two empty rectangles are equal whatever their coordinates.
-TARNLIBS_EXPORT bool Rect_IsEqual(const Rect* a, const Rect* b);
+RASTER_EXPORT bool Rect_IsEqual(const Rect* a, const Rect* b);
 
 /// Whether width and height (right - left and bottom - top, with wrap-around) agree. Two empty
 /// rectangles are of equal size.
-TARNLIBS_EXPORT bool Rect_IsSizeEqual(const Rect* a, const Rect* b);
+RASTER_EXPORT bool Rect_IsSizeEqual(const Rect* a, const Rect* b);
 
 /// Stores `r` moved by `offset`. Each of the four sums saturates by itself; true when none did.
-TARNLIBS_EXPORT bool Rect_Translate(Rect* out, const Rect* r, const Point* offset);
+RASTER_EXPORT bool Rect_Translate(Rect* out, const Rect* r, const Point* offset);
 
 /// Stores `r` moved by minus `offset`: Rect_Translate with both offsets negated.
 ///
 /// Deliberate: the negation wraps around, so an offset of -0x80000000 stays what it is and moves
 /// `r` the other way.
-TARNLIBS_EXPORT bool Rect_TranslateInv(Rect* out, const Rect* r, const Point* offset);
+RASTER_EXPORT bool Rect_TranslateInv(Rect* out, const Rect* r, const Point* offset);
 
 /// Whether `a` and `b` have points in common. `out` (may be null) receives the larger left and top
 /// and the smaller right and bottom, also when that is empty.
-TARNLIBS_EXPORT bool Rect_Intersect(Rect* out, const Rect* a, const Rect* b);
+RASTER_EXPORT bool Rect_Intersect(Rect* out, const Rect* a, const Rect* b);
 
 /// Grows `acc` to the bounding box of both. An empty `acc` becomes a copy of `r`, even of an empty
 /// one; an empty `r` leaves any other `acc` alone.
-TARNLIBS_EXPORT void Rect_Union(Rect* acc, const Rect* r);
+RASTER_EXPORT void Rect_Union(Rect* acc, const Rect* r);
 
 /// Whether the edges of `inner` lie within those of `outer`.
 ///
 /// Deliberate: unlike elsewhere emptiness plays no part. An empty `inner` is contained only when
 /// its coordinates lie within, and an empty `outer` contains a rectangle of the same coordinates.
-TARNLIBS_EXPORT bool Rect_ContainsRect(const Rect* outer, const Rect* inner);
+RASTER_EXPORT bool Rect_ContainsRect(const Rect* outer, const Rect* inner);
 
 /// Whether the pixel at `p` lies in `r`.
-TARNLIBS_EXPORT bool Rect_ContainsPoint(const Rect* r, const Point* p);
+RASTER_EXPORT bool Rect_ContainsPoint(const Rect* r, const Point* p);
 
 /// Does nothing.
-TARNLIBS_EXPORT void Rect_Test(void);
+RASTER_EXPORT void Rect_Test(void);
 
 // ---- Transforms --------------------------------------------------------------------------------
 //
@@ -90,24 +87,24 @@ TARNLIBS_EXPORT void Rect_Test(void);
 
 /// Moves every edge of `r` by the difference of that edge of `to` and `from`:
 /// out = r + to - from. Edges move independently, so a difference in size carries over.
-TARNLIBS_EXPORT bool Rect_ApplyDiff(Rect* out, const Rect* to, const Rect* from, const Rect* r);
+RASTER_EXPORT bool Rect_ApplyDiff(Rect* out, const Rect* to, const Rect* from, const Rect* r);
 
 /// out = p + to - from.
-TARNLIBS_EXPORT bool Rect_ApplyDiffToPoint(Point* out, const Point* to, const Point* from,
-                                           const Point* p);
+RASTER_EXPORT bool Rect_ApplyDiffToPoint(Point* out, const Point* to, const Point* from,
+                                         const Point* p);
 
 /// Carries `r` from the frame `from` into the frame `to`: each edge's offset from the same edge of
 /// `from` is multiplied by the size of `to` and divided by that of `from`, truncated toward zero,
 /// and added to the edge of `to`. Along an axis of equal sizes the offset is not scaled. `from`
 /// must not be empty along an axis where `to` is not (a division by zero).
-TARNLIBS_EXPORT bool Rect_ApplyDiffEx(Rect* out, const Rect* to, const Rect* from, const Rect* r);
+RASTER_EXPORT bool Rect_ApplyDiffEx(Rect* out, const Rect* to, const Rect* from, const Rect* r);
 
 /// Stores the intersection of `a` and `b` in `outIntersection`, and that intersection carried from
 /// the frame `a` into the frame `c`, as by Rect_ApplyDiffEx, in `outMapped`. Either output may be
 /// null. When the intersection, `c` or the carried rectangle is empty, both outputs are set to zero
 /// and the result is false; saturation alone does not make it false.
-TARNLIBS_EXPORT bool Rect_IntersectPair(Rect* outIntersection, const Rect* a, const Rect* b,
-                                        Rect* outMapped, const Rect* c);
+RASTER_EXPORT bool Rect_IntersectPair(Rect* outIntersection, const Rect* a, const Rect* b,
+                                      Rect* outMapped, const Rect* c);
 
 /// Carries a point by scaling: along each axis its distance from the first pixel of `from` is
 /// multiplied by the size of `to`, divided by the size of `from` and rounded down (toward minus
@@ -116,11 +113,11 @@ TARNLIBS_EXPORT bool Rect_IntersectPair(Rect* outIntersection, const Rect* a, co
 /// counts as 1; the result saturates.
 ///
 /// Deliberate: the distance is taken with 32-bit wrap-around.
-TARNLIBS_EXPORT void Rect_ScalePoint(const Rect* from, const Rect* to, const Point* p, Point* out);
+RASTER_EXPORT void Rect_ScalePoint(const Rect* from, const Rect* to, const Point* p, Point* out);
 
 /// Returns the distance of `p` from `r` along the axis where it is larger: positive outside, 0 on
 /// the outermost pixels, negative inside. Differences saturate as the sums of Rect_Translate do.
-TARNLIBS_EXPORT int32 Rect_PointDistance(const Rect* r, const Point* p);
+RASTER_EXPORT int32 Rect_PointDistance(const Rect* r, const Point* p);
 
 #ifdef __cplusplus
 }

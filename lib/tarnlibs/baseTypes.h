@@ -9,7 +9,6 @@
 #include <stddef.h>
 #include <stdint.h>
 
-// NOLINTBEGIN(modernize-use-using): these headers are C as well
 typedef int8_t int8;
 typedef uint8_t uint8;
 typedef int16_t int16;
@@ -18,8 +17,6 @@ typedef int32_t int32;
 typedef uint32_t uint32;
 typedef int64_t int64;
 typedef uint64_t uint64;
-// NOLINTEND(modernize-use-using)
-
 #define TARNLIBS_EXPORT __attribute__((visibility("default")))
 
 #endif

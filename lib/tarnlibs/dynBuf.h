@@ -14,14 +14,11 @@
 extern "C" {
 #endif
 
-// NOLINTBEGIN(modernize-use-using)
 typedef struct DynBuf {
   uint8* data;       ///< the bytes, or null while none were appended; from malloc
   size_t size;       ///< bytes in use
   size_t allocated;  ///< bytes allocated
 } DynBuf;
-// NOLINTEND(modernize-use-using)
-
 /// Makes `buffer` empty without looking at what it held. Nothing is allocated.
 TARNLIBS_EXPORT void DynBuf_Init(DynBuf* buffer);
 

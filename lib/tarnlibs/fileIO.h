@@ -16,7 +16,6 @@
 extern "C" {
 #endif
 
-// NOLINTBEGIN(modernize-use-using)
 /// An open file, or none. The record is the caller's.
 typedef struct FileIODescriptor {
   int posix;  ///< the file descriptor, -1 when none is open
@@ -47,8 +46,6 @@ enum {
   FILEIO_OPEN_CREATE_SAFE = 3,   ///< it is created and must not exist
   FILEIO_OPEN_CREATE_EMPTY = 4,  ///< it is created, or truncated when it exists
 };
-// NOLINTEND(modernize-use-using)
-
 /// Marks `file` as not open, without looking at what it held.
 TARNLIBS_EXPORT void FileIO_Invalidate(FileIODescriptor* file);
 

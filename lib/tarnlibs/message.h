@@ -8,6 +8,10 @@
 // kind with the setters below, or it defines a function of the same name (Log, Warning, Panic) in
 // the program, which the dynamic linker then prefers to the one here.
 //
+// That happens to a program that has functions of these names for purposes of its own, too: they
+// receive the libraries' messages, and where their parameters are other ones the program crashes at
+// the first. Make such functions static, or compile them with hidden visibility.
+//
 // Threads: any function may be called from any thread. A setter takes effect for messages that
 // begin after it returns.
 
@@ -21,7 +25,7 @@ extern "C" {
 #endif
 
 /// Receives one formatted message, line end included. The text is valid during the call only.
-typedef void (*MessageSink)(const char* message);  // NOLINT(modernize-use-using)
+typedef void (*MessageSink)(const char* message);
 
 /// Reports something that is not an error of the program. Messages over 1023 bytes are cut.
 TARNLIBS_EXPORT void Log(const char* format, ...) __attribute__((format(printf, 1, 2)));

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// The layout of every public record, as C sees it, for 4-byte and 8-byte pointers. It compiles or
-// it does not; there is nothing to run.
+// The layout of every public record and the numbers behind the names, as C sees them, for 4-byte
+// and 8-byte pointers. It compiles or it does not; there is nothing to run.
 
 #include <stddef.h>
 
@@ -110,3 +110,44 @@ _Static_assert(IMAGE_FLAG_BOTTOM_UP == 1 && IMAGE_UTIL_READ_KEEP_ALPHA == 1, "fl
 _Static_assert(IMAGE_UTIL_TYPE_PNG == 0 && IMAGE_UTIL_TYPE_BMP == 1, "image types");
 _Static_assert(RASTER_CURSOR_MASK == 0 && RASTER_CURSOR_ALPHA == 1, "cursor types");
 _Static_assert(RASTER_RECT_LIST_SIZE == 16, "rect list");
+
+#define IS(name, number) _Static_assert((name) == (number), #name)
+#define FOUR(a, b, c, d) ((a) | (b) << 8 | (c) << 16 | (d) << 24)
+
+/* The graphics-context functions of the X protocol, and the operators of its RENDER extension. */
+IS(RASTER_ROP_CLEAR, 0x0);
+IS(RASTER_ROP_AND, 0x1);
+IS(RASTER_ROP_AND_REVERSE, 0x2);
+IS(RASTER_ROP_COPY, 0x3);
+IS(RASTER_ROP_AND_INVERTED, 0x4);
+IS(RASTER_ROP_NOOP, 0x5);
+IS(RASTER_ROP_XOR, 0x6);
+IS(RASTER_ROP_OR, 0x7);
+IS(RASTER_ROP_NOR, 0x8);
+IS(RASTER_ROP_EQUIV, 0x9);
+IS(RASTER_ROP_INVERT, 0xa);
+IS(RASTER_ROP_OR_REVERSE, 0xb);
+IS(RASTER_ROP_COPY_INVERTED, 0xc);
+IS(RASTER_ROP_OR_INVERTED, 0xd);
+IS(RASTER_ROP_NAND, 0xe);
+IS(RASTER_ROP_SET, 0xf);
+IS(RASTER_BLEND_CLEAR, 0);
+IS(RASTER_BLEND_OVER, 3);
+IS(RASTER_BLEND_IN, 5);
+IS(RASTER_BLEND_OUT, 7);
+IS(RASTER_BLEND_ATOP, 9);
+IS(RASTER_BLEND_XOR, 11);
+IS(RASTER_BLEND_ADD, 12);
+IS(RASTER_BLEND_SATURATE, 13);
+IS(RASTER_BLEND_USE_SRC_ALPHA, 1);
+IS(RASTER_BLEND_USE_DST_ALPHA, 2);
+IS(RASTER_VIDEO_YUY2, FOUR('Y', 'U', 'Y', '2'));
+IS(RASTER_VIDEO_UYVY, FOUR('U', 'Y', 'V', 'Y'));
+IS(RASTER_VIDEO_YV12, FOUR('Y', 'V', '1', '2'));
+IS(RASTER_FORMAT_111, 3);
+IS(RASTER_FORMAT_222, 6);
+IS(RASTER_FORMAT_233, 8);
+IS(RASTER_FORMAT_555, 15);
+IS(RASTER_FORMAT_565, 16);
+IS(RASTER_FORMAT_888, 24);
+IS(RASTER_FORMAT_8888, 32);

@@ -41,10 +41,10 @@ struct Layout {
   size_t frameBytes;
 };
 const Layout kLayouts[] = {
-    {"YUY2", 0x32595559, "yuyv422", AV_PIX_FMT_YUYV422, kPixels * 2},
-    {"UYVY", 0x59565955, "uyvy422", AV_PIX_FMT_UYVY422, kPixels * 2},
+    {"YUY2", RASTER_VIDEO_YUY2, "yuyv422", AV_PIX_FMT_YUYV422, kPixels * 2},
+    {"UYVY", RASTER_VIDEO_UYVY, "uyvy422", AV_PIX_FMT_UYVY422, kPixels * 2},
     // ffmpeg's planes are Y, Cb, Cr, as are ours; those of a standard YV12 frame are Y, Cr, Cb.
-    {"YV12", 0x32315659, "yuv420p", AV_PIX_FMT_YUV420P, kPixels * 3 / 2},
+    {"YV12", RASTER_VIDEO_YV12, "yuv420p", AV_PIX_FMT_YUV420P, kPixels * 3 / 2},
 };
 
 const char* const kPatterns[] = {"testsrc", "testsrc2", "smptebars", "rgbtestsrc", "yuvtestsrc"};

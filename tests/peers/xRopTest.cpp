@@ -20,7 +20,6 @@ using tests::XServer;
 
 constexpr uint16_t kWidth = 97;
 constexpr uint16_t kHeight = 61;
-constexpr uint32 kCopy = 3;
 
 std::unique_ptr<XServer> server;
 
@@ -249,7 +248,7 @@ TEST(Raster_BitsToPixels, EqualsTheServersCopyOfAPlane) {
     xcb_copy_plane(x(), plane.id(), picture.id(), picture.gc(), 0, 0, static_cast<int16_t>(a.px),
                    static_cast<int16_t>(a.py), a.width, a.height, 1);
     const auto bytesPerPixel = static_cast<int32>(picture.bytesPerPixel());
-    if (rop == kCopy) {
+    if (rop == RASTER_ROP_COPY) {
       Raster_BitsToPixels(plane.data(), plane.pitch(), picture.pixel(a.px, a.py), picture.pitch(),
                           bytesPerPixel, a.width, a.height, foreground, background);
       return;

@@ -141,7 +141,7 @@ const Case kCases[] = {
             0, 40, 30, 0, 2.0, 40.0 / 30, 1);
      }},
     {"Raster_YUVtoRGB",
-     [](Memory& m) { call(m, Raster_YUVtoRGB, m.src, m.dst, 80, 40, 0x32595559, 32); }},
+     [](Memory& m) { call(m, Raster_YUVtoRGB, m.src, m.dst, 80, 40, RASTER_VIDEO_YUY2, 32); }},
     {"Raster_Compress",
      [](Memory& m) {
        uint8* block = nullptr;

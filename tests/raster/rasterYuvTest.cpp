@@ -20,14 +20,11 @@
 namespace {
 
 using reference::Bytes;
-using reference::kUyvy;
-using reference::kYuy2;
-using reference::kYv12;
 using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Random;
 
-constexpr uint32 kFormats[] = {kYuy2, kUyvy, kYv12};
+constexpr uint32 kFormats[] = {RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY, RASTER_VIDEO_YV12};
 constexpr int kDepths[] = {15, 16, 24, 32};
 
 std::string describe(uint32 width, uint32 height, uint32 format, int bppdepth) {
@@ -39,7 +36,7 @@ std::string describe(uint32 width, uint32 height, uint32 format, int bppdepth) {
 
 /// The bytes of a frame that a conversion may read.
 size_t frameBytes(uint32 width, uint32 height, uint32 format) {
-  if (format != kYv12) return size_t{width} * height / 2 * 4;
+  if (format != RASTER_VIDEO_YV12) return size_t{width} * height / 2 * 4;
   return reference::videoAttributes(format, width, height).size;
 }
 
@@ -123,11 +120,11 @@ Bytes colourWheel(uint32 format, uint8 cr) {
     for (uint32 x = 0; x < kWheelWidth; ++x) {
       const WheelColour colour = wheelColour(x, y);
       const size_t at = size_t{y} * kWheelWidth + x;
-      if (format == kYv12) {
+      if (format == RASTER_VIDEO_YV12) {
         frame[at] = colour.y;
         frame[size_t{kWheelWidth} * kWheelHeight + y / 2 * (kWheelWidth / 2) + x / 2] = colour.cb;
       } else {
-        const bool lumaFirst = format == kYuy2;
+        const bool lumaFirst = format == RASTER_VIDEO_YUY2;
         frame[2 * at + (lumaFirst ? 0 : 1)] = colour.y;
         if (x % 2 == 1) frame[2 * at + (lumaFirst ? 1 : 0)] = colour.cb;
       }
@@ -185,35 +182,39 @@ std::pair<uint32, uint32> convertTwo(const Bytes& frame, uint32 format, int bppd
 }
 
 TEST(Raster_YUVtoRGB, MapsTheEndsOfTheLumaRangeToBlackAndWhite) {
-  EXPECT_EQ(convertTwo({16, 128, 235, 128}, kYuy2, 32), std::pair(0u, 0x00FFFFFFu));
+  EXPECT_EQ(convertTwo({16, 128, 235, 128}, RASTER_VIDEO_YUY2, 32), std::pair(0u, 0x00FFFFFFu));
 }
 
 // Deliberate: the first chroma byte of a packed group is the red-difference.
 TEST(Raster_YUVtoRGB, TakesTheFirstChromaByteOfAPackedGroupAsRedDifference) {
   constexpr uint32 kColour = 255 << 16 | 83 << 8 | 0;
-  EXPECT_EQ(convertTwo({0x80, 0xF0, 0x80, 0x10}, kYuy2, 32), std::pair(kColour, kColour));
-  EXPECT_EQ(convertTwo({0xF0, 0x80, 0x10, 0x80}, kUyvy, 32), std::pair(kColour, kColour));
+  EXPECT_EQ(convertTwo({0x80, 0xF0, 0x80, 0x10}, RASTER_VIDEO_YUY2, 32),
+            std::pair(kColour, kColour));
+  EXPECT_EQ(convertTwo({0xF0, 0x80, 0x10, 0x80}, RASTER_VIDEO_UYVY, 32),
+            std::pair(kColour, kColour));
 }
 
 // Deliberate: the plane after the luma plane is the blue-difference.
 TEST(Raster_YUVtoRGB, TakesThePlaneAfterTheLumaPlaneAsBlueDifference) {
   const Bytes frame = {0x80, 0x80, 0x80, 0x80, 0x10, 0xF0};
   uint32 pixels[4] = {};
-  Raster_YUVtoRGB(frame.data(), reinterpret_cast<uint8*>(pixels), 2, 2, kYv12, 32);
+  Raster_YUVtoRGB(frame.data(), reinterpret_cast<uint8*>(pixels), 2, 2, RASTER_VIDEO_YV12, 32);
   for (const uint32 pixel : pixels) EXPECT_EQ(pixel, uint32{255 << 16 | 83 << 8 | 0});
 }
 
 // Deliberate: one bit higher than the 5-5-5 layout of the rest of the library.
 TEST(Raster_YUVtoRGB, PacksFifteenBitsOneBitHigh) {
-  EXPECT_EQ(convertTwo({235, 128, 16, 128}, kYuy2, 15), std::pair(0xFFFEu, 0u));
-  EXPECT_EQ(convertTwo({235, 128, 16, 128}, kYuy2, 16), std::pair(0xFFFFu, 0u));
+  EXPECT_EQ(convertTwo({235, 128, 16, 128}, RASTER_VIDEO_YUY2, 15), std::pair(0xFFFEu, 0u));
+  EXPECT_EQ(convertTwo({235, 128, 16, 128}, RASTER_VIDEO_YUY2, 16), std::pair(0xFFFFu, 0u));
 }
 
 TEST(Raster_YUVtoRGB, WritesNothingForFramesWithoutAGroup) {
   struct {
     uint32 width, height, format;
-  } const frames[] = {{1, 1, kYuy2}, {1, 1, kUyvy}, {2, 1, kYv12}, {1, 2, kYv12},
-                      {0, 9, kYuy2}, {9, 0, kUyvy}, {0, 9, kYv12}, {9, 0, kYv12}};
+  } const frames[] = {{1, 1, RASTER_VIDEO_YUY2}, {1, 1, RASTER_VIDEO_UYVY},
+                      {2, 1, RASTER_VIDEO_YV12}, {1, 2, RASTER_VIDEO_YV12},
+                      {0, 9, RASTER_VIDEO_YUY2}, {9, 0, RASTER_VIDEO_UYVY},
+                      {0, 9, RASTER_VIDEO_YV12}, {9, 0, RASTER_VIDEO_YV12}};
   GuardedBuffer forbidden(16);
   forbidden.forbid();
   for (const auto& frame : frames) {
@@ -228,17 +229,17 @@ TEST(Raster_YUVtoRGB, LeavesTheLastPixelOfAnOddPackedFrame) {
   const Bytes frame(16, 128);
   uint8 pixels[36];
   memset(pixels, 0x77, sizeof pixels);
-  Raster_YUVtoRGB(frame.data(), pixels, 3, 3, kYuy2, 32);
+  Raster_YUVtoRGB(frame.data(), pixels, 3, 3, RASTER_VIDEO_YUY2, 32);
   for (size_t i = 0; i < 36; ++i) EXPECT_EQ(pixels[i] == 0x77, i >= 32) << i;
 }
 
 // Deliberate: with an odd width the output of a row pair begins one pixel early for each one
 // before.
 TEST(Raster_YUVtoRGB, StartsLaterRowPairsOfAnOddPlanarFrameOnePixelEarlier) {
-  Bytes frame(reference::videoAttributes(kYv12, 3, 4).size, 128);
+  Bytes frame(reference::videoAttributes(RASTER_VIDEO_YV12, 3, 4).size, 128);
   uint8 pixels[48];
   memset(pixels, 0x77, sizeof pixels);
-  Raster_YUVtoRGB(frame.data(), pixels, 3, 4, kYv12, 32);
+  Raster_YUVtoRGB(frame.data(), pixels, 3, 4, RASTER_VIDEO_YV12, 32);
   const std::string written =
       "**.****.**..";  // rows of three: pair 0 at 0 and 3, pair 1 at 5 and 8
   for (size_t i = 0; i < 12; ++i) EXPECT_EQ(pixels[4 * i] != 0x77, written[i] == '*') << i;
@@ -247,7 +248,7 @@ TEST(Raster_YUVtoRGB, StartsLaterRowPairsOfAnOddPlanarFrameOnePixelEarlier) {
 TEST(Raster_YUVtoRGB, StoresThreeBytesOfA24BitPixel) {
   const Bytes frame = {235, 128, 235, 128};
   GuardedBuffer pixels(6);
-  Raster_YUVtoRGB(frame.data(), pixels.data(), 2, 1, kYuy2, 24);
+  Raster_YUVtoRGB(frame.data(), pixels.data(), 2, 1, RASTER_VIDEO_YUY2, 24);
   EXPECT_EQ(pixels.bytes(), Bytes(6, 255));
 }
 
@@ -256,7 +257,7 @@ TEST(Raster_YUVtoRGB, LogsAnUnsupportedDepthOnceAndTouchesNothing) {
     GuardedBuffer forbidden(16);
     forbidden.forbid();
     for (const int bppdepth : {8, 8, 0, -1})
-      Raster_YUVtoRGB(forbidden.data(), forbidden.data(), 2, 2, kYuy2, bppdepth);
+      Raster_YUVtoRGB(forbidden.data(), forbidden.data(), 2, 2, RASTER_VIDEO_YUY2, bppdepth);
   });
   EXPECT_EQ(log, "Raster_YUVtoRGB: bppdepth:8 not supported.\n");
 }

@@ -25,9 +25,6 @@ using tests::moved;
 using tests::Random;
 using tests::rowsRange;
 
-constexpr uint32 kCopy = 3;
-constexpr uint32 kNoop = 5;
-
 /// A width that is likely to meet a boundary of some vector size.
 uint32 someWidth(Random& random) {
   return random.below(16) == 0 ? 1000 + random.below(1000) : random.below(71);
@@ -95,7 +92,7 @@ TEST(Raster_RectROPfill, EqualsRectFillForCopy) {
     Bytes filled = before;
     Bytes combined = before;
     Raster_RectFill(filled.data(), 41, bytesPerPixel, 0x12345678, 1, 2, 7, 6);
-    Raster_RectROPfill(combined.data(), 41, bytesPerPixel, 0x12345678, kCopy, 1, 2, 7, 6);
+    Raster_RectROPfill(combined.data(), 41, bytesPerPixel, 0x12345678, RASTER_ROP_COPY, 1, 2, 7, 6);
     EXPECT_EQ(combined, filled);
   }
 }
@@ -107,7 +104,8 @@ void expectUnsupported(const Messages& said) {
 }
 
 TEST(Raster_RectROPfill, PanicsForAPixelSizeOfFiveBeforeAnythingElseIsLookedAt) {
-  for (const uint32 rop : {0u, kCopy, kNoop, 6u, 16u, 0xFFFFFFFFu}) {
+  for (const uint32 rop :
+       std::initializer_list<uint32>{0u, RASTER_ROP_COPY, RASTER_ROP_NOOP, 6u, 16u, 0xFFFFFFFFu}) {
     for (const uint32 bytesPerPixel : {0u, 5u, 0xFFFFFFFFu}) {
       expectUnsupported(tests::messagesOf(
           [&] { Raster_RectROPfill(nullptr, 0, bytesPerPixel, 0, rop, 0, 0, 0, 0); }));
@@ -118,7 +116,8 @@ TEST(Raster_RectROPfill, PanicsForAPixelSizeOfFiveBeforeAnythingElseIsLookedAt) 
 TEST(Raster_RectROPfill, LeavesTheBufferAloneForNoopAndForUnknownOperations) {
   GuardedBuffer forbidden(64);
   forbidden.forbid();
-  for (const uint32 rop : {kNoop, 16u, 17u, 0x80000006u, 0xFFFFFFFFu}) {
+  for (const uint32 rop :
+       std::initializer_list<uint32>{RASTER_ROP_NOOP, 16u, 17u, 0x80000006u, 0xFFFFFFFFu}) {
     for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
       const Messages said = tests::messagesOf(
           [&] { Raster_RectROPfill(forbidden.data(), 8, bytesPerPixel, 1, rop, 0, 0, 2, 8); });
@@ -244,7 +243,7 @@ TEST(Raster_RectROPcopy, EqualsTheModelAtEveryByteDistanceInEveryWalk) {
     for (uint32 rop = 0; rop < 16; ++rop) {
       for (int64 distance = -130; distance <= 130; ++distance) {
         const uint32 walk = random.below(3);
-        if (rop == kCopy) continue;  // not a walk: below
+        if (rop == RASTER_ROP_COPY) continue;  // not a walk: below
         for (const uint32 w : {walk, 2u}) {
           Copy c = someCopy(random, bytesPerPixel, rop, w);
           // The first rows to be processed lie `distance` apart.
@@ -264,7 +263,7 @@ TEST(Raster_RectROPcopy, EqualsTheModelWithinOneFrameBuffer) {
   for (int round = 0; round < 6000; ++round) {
     const uint32 bytesPerPixel = 1 + random.below(4);
     uint32 rop = random.below(16);
-    if (rop == kCopy) rop = 6;
+    if (rop == RASTER_ROP_COPY) rop = 6;
     Copy c = someCopy(random, bytesPerPixel, rop, random.below(3));
     c.srcPitch = c.dstPitch;
     checkCopy(random, c);
@@ -276,7 +275,7 @@ TEST(Raster_RectROPcopy, EqualsTheModelBetweenFrameBuffers) {
   Random random(5);
   for (int round = 0; round < 4000; ++round) {
     Copy c = someCopy(random, 1 + random.below(4), random.below(16), random.below(3));
-    if (c.rop == kCopy) c.dstPitch = c.srcPitch = static_cast<int32>(c.width * 4 + 4);
+    if (c.rop == RASTER_ROP_COPY) c.dstPitch = c.srcPitch = static_cast<int32>(c.width * 4 + 4);
     c.src = -c.range(c.src, c.srcPitch, c.srcX, c.srcY).begin;
     const ByteRange source = c.range(c.src, c.srcPitch, c.srcX, c.srcY);
     const ByteRange target = c.range(c.dst, c.dstPitch, c.dstX, c.dstY);
@@ -310,7 +309,7 @@ TEST(Raster_RectROPcopy, EqualsRectCopyForCopyAlsoWithAPixelSizeOfFive) {
   Random random(6);
   for (const uint32 bytesPerPixel : {1u, 2u, 3u, 4u, 5u}) {
     for (int round = 0; round < 200; ++round) {
-      Copy c = someCopy(random, bytesPerPixel, kCopy, random.below(3));
+      Copy c = someCopy(random, bytesPerPixel, RASTER_ROP_COPY, random.below(3));
       c.width = random.below(40);
       c.srcPitch = c.dstPitch = 320;
       Bytes plain = random.bytes(320 * 40);
@@ -319,7 +318,7 @@ TEST(Raster_RectROPcopy, EqualsRectCopyForCopyAlsoWithAPixelSizeOfFive) {
                       c.dstY, c.width, c.height);
       const Messages said = tests::messagesOf([&] {
         Raster_RectROPcopy(combined.data(), 320, combined.data(), 320, bytesPerPixel, c.srcX,
-                           c.srcY, kCopy, c.dstX, c.dstY, c.width, c.height);
+                           c.srcY, RASTER_ROP_COPY, c.dstX, c.dstY, c.width, c.height);
       });
       ASSERT_EQ(combined, plain) << c.text();
       ASSERT_EQ(said.warning + said.panic, "");
@@ -329,13 +328,13 @@ TEST(Raster_RectROPcopy, EqualsRectCopyForCopyAlsoWithAPixelSizeOfFive) {
 
 TEST(Raster_RectROPcopy, CopiesWithNegativePitches) {
   Bytes memory = {1, 2, 3, 4, 0, 0, 0, 0};
-  Raster_RectROPcopy(&memory[6], -2, &memory[2], -2, 1, 0, 0, kCopy, 0, 0, 2, 2);
+  Raster_RectROPcopy(&memory[6], -2, &memory[2], -2, 1, 0, 0, RASTER_ROP_COPY, 0, 0, 2, 2);
   EXPECT_EQ(memory, (Bytes{1, 2, 3, 4, 1, 2, 3, 4}));
 }
 
 TEST(Raster_RectROPcopy, PanicsForAPixelSizeOfFiveOnTwoLines) {
   std::string lines[2];
-  for (const uint32 rop : {0u, kNoop, 6u, 20u}) {
+  for (const uint32 rop : std::initializer_list<uint32>{0u, RASTER_ROP_NOOP, 6u, 20u}) {
     for (const uint32 dstX : {0u, 1u}) {
       const Messages said = tests::messagesOf(
           [&] { Raster_RectROPcopy(nullptr, 0, nullptr, 0, 5, 0, 0, rop, dstX, 0, 0, 0); });
@@ -349,7 +348,7 @@ TEST(Raster_RectROPcopy, PanicsForAPixelSizeOfFiveOnTwoLines) {
 TEST(Raster_RectROPcopy, LeavesTheDestinationAloneForNoopAndForUnknownOperations) {
   GuardedBuffer forbidden(64);
   forbidden.forbid();
-  for (const uint32 rop : {kNoop, 16u, 20u, 0xFFFFFFFFu}) {
+  for (const uint32 rop : std::initializer_list<uint32>{RASTER_ROP_NOOP, 16u, 20u, 0xFFFFFFFFu}) {
     for (const uint32 dstX : {0u, 1u}) {
       Raster_RectROPcopy(forbidden.data(), 8, forbidden.data(), 8, 1, 0, 0, rop, dstX, 0, 2, 2);
     }

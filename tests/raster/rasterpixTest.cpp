@@ -24,9 +24,6 @@ using tests::moved;
 using tests::Random;
 using tests::rowsRange;
 
-constexpr uint32 kCopy = 3;
-constexpr uint32 kNoop = 5;
-
 Guard someGuard(Random& random) { return random.oneOf({Guard::kBefore, Guard::kAfter}); }
 
 uint32 roundedPitch(uint32 pitch, uint32 bytesPerPixel) {
@@ -104,7 +101,7 @@ void checkTiling(Random& random, Tiling t) {
   uint8* dst = moved(actual.data(), t.dst);
   uint8* pixmap = moved(actual.data(), t.pixmap);
   const auto bytesPerPixel = static_cast<int32>(t.bytesPerPixel);
-  if (t.rop == kCopy && random.below(2) == 0) {
+  if (t.rop == RASTER_ROP_COPY && random.below(2) == 0) {
     Raster_RectPixmapCopy(dst, t.dstPitch, pixmap, t.pixmapPitch, bytesPerPixel, t.tileX, t.tileY,
                           t.pixmapWidth, t.pixmapHeight, t.dstX, t.dstY, t.width, t.height);
   } else {
@@ -129,7 +126,8 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelForEveryPixmapWidthAlsoWithTallPixm
   Random random(6);
   for (uint32 width = 1; width <= 70; ++width) {
     for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
-      Tiling t = someTiling(random, random.oneOf({kCopy, 1 + random.below(14)}));
+      Tiling t = someTiling(random, random.oneOf(std::initializer_list<uint32>{
+                                        RASTER_ROP_COPY, 1 + random.below(14)}));
       t.bytesPerPixel = bytesPerPixel;
       t.pixmapWidth = width;
       t.pixmapHeight = random.oneOf({1 + random.below(4), 1 + random.below(80)});
@@ -213,7 +211,7 @@ TEST(RasterRectPixmapROPcopy, WritesNothingForNoopAndForUnknownOperations) {
   GuardedBuffer forbidden(64);
   forbidden.forbid();
   for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
-    for (const uint32 rop : {kNoop, 16u, 0xFFFFFFFFu})
+    for (const uint32 rop : std::initializer_list<uint32>{RASTER_ROP_NOOP, 16u, 0xFFFFFFFFu})
       kWorkers[bytesPerPixel](forbidden.data(), 16, forbidden.data(), 16, 0, 0, rop, 0, 0, 2, 2);
   }
 }
@@ -250,7 +248,7 @@ TEST(Raster_RectPixmapROPcopy, EqualsPixmapCopyForCopy) {
     Raster_RectPixmapCopy(copied.data(), 150, pixmap.data(), 30, bytesPerPixel, 4, 9, 6, 5, 1, 2,
                           30, 15);
     Raster_RectPixmapROPcopy(combined.data(), 150, pixmap.data(), 30, bytesPerPixel, 4, 9, 6, 5,
-                             kCopy, 1, 2, 30, 15);
+                             RASTER_ROP_COPY, 1, 2, 30, 15);
     EXPECT_EQ(combined, copied);
   }
 }
@@ -283,7 +281,8 @@ TEST(Raster_RectPixmapROPcopy, ReadsThePixmapOnlyWhereTheOperationDependsOnIt) {
 
 TEST(Raster_RectPixmapROPcopy, PanicsForAPixelSizeOfFiveAlsoWithNothingToDo) {
   for (const int32 bytesPerPixel : {0, 5, -1}) {
-    for (const uint32 rop : {0u, kCopy, kNoop, 16u}) {
+    for (const uint32 rop :
+         std::initializer_list<uint32>{0u, RASTER_ROP_COPY, RASTER_ROP_NOOP, 16u}) {
       for (const uint32 height : {0u, 1u}) {
         const Messages said = tests::messagesOf([&] {
           Raster_RectPixmapROPcopy(nullptr, 0, nullptr, 0, bytesPerPixel, 0, 0, 1, 1, rop, 0, 0, 0,

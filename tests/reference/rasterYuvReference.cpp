@@ -37,7 +37,7 @@ void packedToRgb(const Bytes& src, Bytes& dst, size_t groups, GroupOrder at, int
 }
 
 void planarToRgb(const Bytes& src, Bytes& dst, uint32 width, uint32 height, int bppdepth) {
-  const VideoAttributes frame = videoAttributes(kYv12, width, height);
+  const VideoAttributes frame = videoAttributes(RASTER_VIDEO_YV12, width, height);
   size_t out = 0;  // the top left pixel of the row pair
   for (uint32 j = 0; j < height / 2; ++j) {
     for (uint32 i = 0; i < width / 2; ++i) {
@@ -61,7 +61,7 @@ VideoAttributes videoAttributes(uint32 format, uint32 width, uint32 height) {
   VideoAttributes frame;
   const uint32 evenWidth = (width + 1) / 2 * 2;
   const uint32 evenHeight = (height + 1) / 2 * 2;
-  if (format != kYv12) {
+  if (format != RASTER_VIDEO_YV12) {
     frame.size = height * 2 * evenWidth;
     return frame;
   }
@@ -93,11 +93,11 @@ uint32 bytesOf(int bppdepth) { return static_cast<uint32>(bppdepth + 1) / 8; }
 void yuvToRgb(const Bytes& src, Bytes& dst, uint32 width, uint32 height, uint32 format,
               int bppdepth) {
   const size_t groups = size_t{width} * height / 2;
-  if (format == kYuy2) {
+  if (format == RASTER_VIDEO_YUY2) {
     packedToRgb(src, dst, groups, {.y0 = 0, .y1 = 2, .cr = 1, .cb = 3}, bppdepth);
-  } else if (format == kUyvy) {
+  } else if (format == RASTER_VIDEO_UYVY) {
     packedToRgb(src, dst, groups, {.y0 = 1, .y1 = 3, .cr = 0, .cb = 2}, bppdepth);
-  } else if (format == kYv12) {
+  } else if (format == RASTER_VIDEO_YV12) {
     planarToRgb(src, dst, width, height, bppdepth);
   } else {
     abort();

@@ -10,14 +10,11 @@
 #include <vector>
 
 #include "baseTypes.h"
+#include "raster.h"
 
 namespace reference {
 
 using Bytes = std::vector<uint8>;
-
-inline constexpr uint32 kYuy2 = 0x32595559;
-inline constexpr uint32 kUyvy = 0x59565955;
-inline constexpr uint32 kYv12 = 0x32315659;
 
 struct VideoAttributes {
   uint32 size = 0;
