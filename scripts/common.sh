@@ -17,16 +17,36 @@ asRoot() {
 
 installed() { [ "$(dpkg-query -W -f='${db:Status-Status}' "$1" 2>/dev/null)" = installed ]; }
 
-# Installs those of the named Debian packages that are missing. An index that is partly out of reach
-# may still be good enough, so only the packages decide.
+# The files of the tree, in an unpacked archive too.
+treeFiles() {
+  if [ -e "$root/.git" ] && command -v git >/dev/null; then
+    git -C "$root" ls-files "$@"
+  else
+    local names=() pattern
+    for pattern in "$@"; do names+=(-o -name "$pattern"); done
+    (cd "$root" && find -- * \( -path build -prune \) -o -type f \( "${names[@]:1}" \) -print) | sort
+  fi
+}
+
+# Of the lines that match a pattern, lets one through every 15 seconds, so that a long job shows that it
+# lives; of the others, those that do not match the second pattern.
+heartbeat() {
+  awk -v often="$1" -v never="${2:-^$}" '
+    $0 ~ often { if (systime() - last >= 15) { print; fflush(); last = systime() }; next }
+    $0 !~ never { print; fflush() }'
+}
+
+# Installs those of the named Debian packages that are missing, and waits for another package manager
+# that is at work. An index that is partly out of reach may still be good enough, so only the packages
+# decide.
 needPackages() {
   local missing=() package
   for package in "$@"; do installed "$package" || missing+=("$package"); done
   [ ${#missing[@]} = 0 ] && return
   say "installing ${missing[*]}"
-  asRoot apt-get update -qq || true
-  asRoot env DEBIAN_FRONTEND=noninteractive \
-    apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
+  asRoot apt-get -o DPkg::Lock::Timeout=600 update -qq || true
+  asRoot env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=600 \
+    install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
   for package in "${missing[@]}"; do installed "$package" || die "package $package did not install"; done
 }
 

@@ -23,7 +23,7 @@ run() {
 buildProject() {
   folder=$1
   shift
-  "$CMAKE" -S "$folder" -B "$work/build" ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} "$@" \
+  "$CMAKE" -G Ninja -S "$folder" -B "$work/build" ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} "$@" \
     >"$work/log" 2>&1 && "$CMAKE" --build "$work/build" >>"$work/log" 2>&1 ||
     { cat "$work/log"; exit 1; }
 }
