@@ -8,6 +8,7 @@
 #include <array>
 #include <utility>
 
+#include "divisionByZero.h"
 #include "panicPlace.h"
 #include "raster.h"
 

@@ -2,8 +2,6 @@
 
 #include "panicPlace.h"
 
-#include <csignal>
-
 #include "message.h"
 
 namespace raster {
@@ -24,11 +22,6 @@ void unsupportedPixelSize(Place at) {
 void unsupportedNumber(const char* format, int32 number, Place at) {
   Warning(format, number);
   notImplemented(at);
-}
-
-void divisionByZero() {
-  static_cast<void>(raise(SIGFPE));
-  __builtin_trap();
 }
 
 }  // namespace raster

@@ -33,9 +33,6 @@ struct Place {
 /// A warning about a number, for which `format` has a %d, and then notImplemented.
 [[noreturn]] void unsupportedNumber(const char* format, int32 number, Place at);
 
-/// Ends as an integer division by zero does.
-[[noreturn]] void divisionByZero();
-
 }  // namespace raster
 
 #endif

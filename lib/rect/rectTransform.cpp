@@ -6,6 +6,7 @@
 // Everything is worked out one axis at a time, in exact 64-bit arithmetic that saturates at the
 // end.
 
+#include "divisionByZero.h"
 #include "rect.h"
 #include "rectArithmetic.h"
 
@@ -25,10 +26,11 @@ Axis horizontal(const Rect& r) { return {r.left, r.right}; }
 Axis vertical(const Rect& r) { return {r.top, r.bottom}; }
 
 /// The offset d from one edge of `from`, in the scale of `to`: exact, truncated toward zero. An
-/// empty `from` cannot be scaled up; that is the caller's fault and divides by zero.
+/// empty `from` cannot be scaled up; that is the caller's fault.
 int64 scaledOffset(int64 d, const Axis& to, const Axis& from) {
   if (to.size() == from.size()) return d;
-  return d * to.size() / from.size();  // NOLINT(clang-analyzer-core.DivideZero): see above
+  if (from.size() == 0) divisionByZero();
+  return d * to.size() / from.size();
 }
 
 /// An axis carried from one frame into another, and whether both of its ends fit.

@@ -1,6 +1,7 @@
 #!/bin/sh
 # What the file of a shared library promises to its hosts: its soname, no text relocations, read-only
-# relocations bound at load time, a stack that is not executable, and no C++ run-time library.
+# relocations bound at load time, a stack that is not executable, no C++ run-time library, and no
+# instructions that a compiler puts where it takes a path for impossible.
 # usage: sharedObject.sh LIBRARY SONAME sanitized|plain
 set -eu
 library=$1
@@ -25,5 +26,8 @@ has "$segments" 'GNU_STACK.* RW ' || fail "the stack is executable, or nothing s
 ! has "$segments" 'LOAD.* RWE ' || fail "a segment is writable and executable"
 if [ "$build" = plain ]; then
   ! has "$dynamic" 'NEEDED.*(libstdc\+\+|libgcc_s|libc\+\+)' || fail "it needs a C++ run-time library"
+  ! objdump -d --no-show-raw-insn "$library" |
+    awk '/^[0-9a-f]+ </ { name = $2 } $2 == "ud2" { print name, $0 }' |
+    grep . || fail "it ends in illegal instructions"
 fi
 [ "$failures" = 0 ]

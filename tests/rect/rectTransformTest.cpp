@@ -5,8 +5,11 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
+
 #include "rect.h"
 #include "reference/rectTransformReference.h"
+#include "support/ownProcess.h"
 #include "support/rectValues.h"
 
 namespace {
@@ -136,6 +139,19 @@ TEST(Rect_ApplyDiffEx, DoesNotScaleBetweenEmptyFrames) {
   Rect out = {};
   EXPECT_TRUE(Rect_ApplyDiffEx(&out, &to, &from, &r));
   EXPECT_EQ(out, (Rect{5, 5, 5, 5}));
+}
+
+TEST(Rect_ApplyDiffEx, DividesByTheSizeOfAnEmptyFrame) {
+  const Rect one = {0, 0, 1, 1};
+  const Rect frame = {0, 0, 5, 5};
+  for (const Rect& empty : {Rect{0, 0, 0, 5}, Rect{0, 0, 5, 0}, Rect{9, 0, 3, 5}, Rect{}}) {
+    EXPECT_EQ(tests::signalOfOwnProcess([&] {
+                Rect out = {};
+                Rect_ApplyDiffEx(&out, &frame, &empty, &one);
+              }),
+              SIGFPE)
+        << empty;
+  }
 }
 
 TEST(Rect_ApplyDiffEx, EqualsTheModelWithAnyInputAsOutput) {

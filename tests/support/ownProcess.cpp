@@ -5,6 +5,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <cstdlib>
 #include <cstring>
 
@@ -27,6 +28,12 @@ std::string readAll(int from) {
   return all;
 }
 
+int statusOf(pid_t child) {
+  int status = 0;
+  if (waitpid(child, &status, 0) != child) abort();
+  return status;
+}
+
 }  // namespace
 
 std::string logOfOwnProcess(const std::function<void()>& call) {
@@ -44,9 +51,21 @@ std::string logOfOwnProcess(const std::function<void()>& call) {
   close(ends[1]);
   std::string log = readAll(ends[0]);
   close(ends[0]);
-  int status = 0;
-  const bool ended = waitpid(child, &status, 0) == child;
-  return ended && WIFEXITED(status) && WEXITSTATUS(status) == 0 ? log : "the child failed";
+  const int status = statusOf(child);
+  return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? log : "the child failed";
+}
+
+int signalOfOwnProcess(const std::function<void()>& call) {
+  const pid_t child = fork();
+  if (child < 0) abort();
+  if (child == 0) {
+    // Not a sanitizer's handlers, which report and exit.
+    for (const int number : {SIGFPE, SIGILL, SIGSEGV}) signal(number, SIG_DFL);
+    call();
+    _exit(0);
+  }
+  const int status = statusOf(child);
+  return WIFSIGNALED(status) ? WTERMSIG(status) : 0;
 }
 
 }  // namespace tests
