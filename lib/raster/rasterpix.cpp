@@ -275,6 +275,7 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
+#include "divisionByZero.h"
 #include "kernelChoice.h"
 #include "panicPlace.h"
 #include "raster.h"
@@ -375,7 +376,9 @@ bool isWorthWidening(const TileRows& t) {
 }
 
 void tile(const Tiling& t, uint32 tileX, uint32 tileY, uint32 rop) {
-  const uint32 phaseX = tileX % t.pixmapWidth;  // first of all: a size of 0 faults here
+  // By a test of its own, first of all: a compiler may divide later, when the result is wanted.
+  if (t.pixmapWidth == 0 || t.pixmapHeight == 0) divisionByZero();
+  const uint32 phaseX = tileX % t.pixmapWidth;
   const uint32 phaseY = tileY % t.pixmapHeight;
   if (t.bytesPerPixel < 1 || t.bytesPerPixel > 4) unsupportedPixelSize(kSource);
   if (rop >= kRopCount || rop == kRopNoop || t.width == 0 || t.height == 0) return;

@@ -4,12 +4,14 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
 #include <string>
 
 #include "raster.h"
 #include "reference/rasterpixReference.h"
 #include "support/byteRange.h"
 #include "support/guardedBuffer.h"
+#include "support/ownProcess.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
 
@@ -276,6 +278,34 @@ TEST(Raster_RectPixmapROPcopy, ReadsThePixmapOnlyWhereTheOperationDependsOnIt) {
                                0, 0, 10, 40);
       EXPECT_EQ(dst[0], rop == 0 ? 0 : rop == 10 ? 0xCC : 0xFF);
     }
+  }
+}
+
+/// The signal that ends the tiling of an empty rectangle with a pixmap of this size.
+int signalOfTiling(uint32 pixmapWidth, uint32 pixmapHeight, int32 bytesPerPixel, uint32 rop) {
+  return tests::signalOfOwnProcess([=] {
+    Raster_RectPixmapROPcopy(nullptr, 0, nullptr, 0, bytesPerPixel, 3, 2, pixmapWidth, pixmapHeight,
+                             rop, 0, 0, 0, 0);
+  });
+}
+
+TEST(Raster_RectPixmapROPcopy, DividesByAPixmapSizeOfZeroBeforeAnythingElse) {
+  for (const int32 bytesPerPixel : {-1, 0, 1, 2, 3, 4, 5}) {
+    for (const uint32 rop : {0u, uint32{RASTER_ROP_COPY}, uint32{RASTER_ROP_NOOP}, 10u, 16u}) {
+      EXPECT_EQ(signalOfTiling(0, 1, bytesPerPixel, rop), SIGFPE) << bytesPerPixel << " " << rop;
+      EXPECT_EQ(signalOfTiling(1, 0, bytesPerPixel, rop), SIGFPE) << bytesPerPixel << " " << rop;
+    }
+  }
+  EXPECT_EQ(signalOfTiling(1, 1, 4, uint32{RASTER_ROP_NOOP}), 0);
+}
+
+TEST(Raster_RectPixmapCopy, DividesByAPixmapSizeOfZeroBeforeAnythingElse) {
+  for (const uint32 width : {0u, 1u}) {
+    EXPECT_EQ(tests::signalOfOwnProcess([=] {
+                Raster_RectPixmapCopy(nullptr, 0, nullptr, 0, 5, 3, 2, width, 1 - width, 0, 0, 0,
+                                      0);
+              }),
+              SIGFPE);
   }
 }
 
