@@ -312,7 +312,15 @@ struct Tiling {
   uint32 pixmapWidth, pixmapHeight;
   uint32 x, y, width, height;
 
-  /// The rows of the whole rectangle, when the pitches step by whole pixels.
+  /// Whether the pitches step by whole pixels, and the bytes of a pixmap row fit a number.
+  bool hasPlainRows() const {
+    size_t period = 0;
+    return dst.pitch == rowStep(dst.pitch, bytesPerPixel) &&
+           pixmap.pitch == rowStep(pixmap.pitch, bytesPerPixel) &&
+           !__builtin_mul_overflow(pixmapWidth, bytesPerPixel, &period);
+  }
+
+  /// The rows of the whole rectangle, where they are plain.
   TileRows rows(uint32 tileX, uint32 tileY) const {
     return {.dst = dst.pixel(x, y, bytesPerPixel),
             .dstStep = dst.pitch,
@@ -383,9 +391,7 @@ void tile(const Tiling& t, uint32 tileX, uint32 tileY, uint32 rop) {
   if (t.bytesPerPixel < 1 || t.bytesPerPixel > 4) unsupportedPixelSize(kSource);
   if (rop >= kRopCount || rop == kRopNoop || t.width == 0 || t.height == 0) return;
   const TileRows rows = t.rows(phaseX, phaseY);
-  const bool steady = rows.dstStep == rowStep(rows.dstStep, t.bytesPerPixel) &&
-                      rows.srcStep == rowStep(rows.srcStep, t.bytesPerPixel);
-  if (!steady || !isOrderFree(rows) || !ropReadsSource(rop)) {
+  if (!t.hasPlainRows() || !isOrderFree(rows) || !ropReadsSource(rop)) {
     tileBlocks(t, phaseX, phaseY, rop);
   } else if (isWorthWidening(rows)) {
     kernels().tileWidened[rop](rows);

@@ -159,6 +159,33 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithAPixmapInsideOrBesideTheRectang
   }
 }
 
+/// Pixmaps that no memory has room for; the rectangle meets the first pixels of their rows only.
+TEST(Raster_RectPixmapROPcopy, EqualsTheModelWherePixmapRowsHaveMoreBytesThanAnAddress) {
+  struct {
+    uint32 width, bytesPerPixel;
+  } const pixmaps[] = {{0x40000000, 4}, {0x40000001, 4}, {0x7FFFFFFF, 4}, {0xFFFFFFFF, 4},
+                       {0x55555556, 3}, {0xAAAAAAAB, 3}, {0x80000000, 2}, {0x80000001, 2}};
+  Random random(7);
+  for (const auto& [pixmapWidth, bytesPerPixel] : pixmaps) {
+    for (uint32 rop = 0; rop < 16; ++rop) {
+      const uint32 width = 1 + random.below(40);
+      const uint32 height = 1 + random.below(5);
+      const uint32 tileX = random.below(3);
+      const uint32 pitch = (width + tileX) * bytesPerPixel;
+      Bytes expected = random.bytes(size_t{pitch} * (height + 2));
+      GuardedBuffer actual(expected.size(), someGuard(random));
+      actual.assign(expected);
+      const int64 dst = 2 * int64{pitch};  // after the two rows of the pixmap
+      reference::rectPixmapRopCopy(expected, dst, pitch, 0, pitch, bytesPerPixel, tileX, 1,
+                                   pixmapWidth, 2, rop, 0, 0, width, height);
+      Raster_RectPixmapROPcopy(moved(actual.data(), dst), pitch, actual.data(), pitch,
+                               static_cast<int32>(bytesPerPixel), tileX, 1, pixmapWidth, 2, rop, 0,
+                               0, width, height);
+      ASSERT_EQ(actual.bytes(), expected) << pixmapWidth << " x " << bytesPerPixel;
+    }
+  }
+}
+
 TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithRowsThatOverlapEachOther) {
   Random random(3);
   for (int round = 0; round < 2000; ++round) {
