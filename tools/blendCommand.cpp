@@ -9,6 +9,7 @@
 #include "drawing.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "numbers.h"
 #include "picture.h"
 #include "raster.h"
 
@@ -67,9 +68,9 @@ void addBlendCommand(Commands& commands) {
   options->output.addTo(command);
   addParsed(command, "--op", options->op, parseOperator, "NAME|0-13", "the operator (over)");
   command->add_option("--src-alpha", options->srcAlpha, "scales the source, alpha included")
-      ->check(CLI::Range(0, 255));
+      ->check(count(0, 255));
   command->add_option("--dst-alpha", options->dstAlpha, "scales the destination and is its alpha")
-      ->check(CLI::Range(0, 255));
+      ->check(count(0, 255));
   addParsed(command, "--at", options->at, parsePoint, "X,Y",
             "where the top left corner of SRC goes");
   addDepth(command, options->code, {6, 8, 15, 16, 24, 32}, "the pixel format of the destination")

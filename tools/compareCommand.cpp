@@ -10,6 +10,7 @@
 #include "commands.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "numbers.h"
 #include "picture.h"
 #include "raster.h"
 
@@ -126,9 +127,9 @@ void addCompareCommand(Commands& commands) {
   command->add_option("--mask", options->mask,
                       "a PNG picture; the bits set in its colours are compared (white: all)");
   command->add_option("--max-diffs", options->maxDiffs, "so many pixels' worth of bytes may differ")
-      ->check(CLI::Range(0, kMostDiffs));
+      ->check(count(0, kMostDiffs));
   command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
-      ->check(CLI::Range(1, 4096))
+      ->check(count(1, 4096))
       ->capture_default_str();
   command->add_option("--out", options->out, "a picture of the differences to write");
 }

@@ -10,6 +10,7 @@
 #include "drawing.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "numbers.h"
 #include "picture.h"
 
 namespace tool {
@@ -100,7 +101,7 @@ void addCursorCommand(Commands& commands) {
   addParsed(command, "--hot", options->hotSpot, parsePoint, "X,Y",
             "the hot spot, in pixels of the cursor");
   command->add_option("--scale", options->scale, "draw it larger or smaller")
-      ->check(CLI::Range(0.1, 16.0));
+      ->check(finiteNumber(0.1, 16));
 }
 
 }  // namespace tool

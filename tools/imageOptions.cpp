@@ -3,6 +3,7 @@
 #include "imageOptions.h"
 
 #include "commands.h"
+#include "numbers.h"
 
 namespace tool {
 
@@ -18,7 +19,7 @@ void OutputOptions::addTo(CLI::App* command) {
 
 void OutputOptions::addEncodingTo(CLI::App* command) {
   command->add_option("--compression", compression, "effort of the PNG compression")
-      ->check(CLI::Range(0, 9));
+      ->check(count(0, 9));
   command->add_flag("--keep-alpha", keepAlpha, "keep the alpha channel of the picture");
 }
 

@@ -15,6 +15,7 @@
 #include "display.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "numbers.h"
 #include "picture.h"
 #include "progress.h"
 
@@ -79,7 +80,7 @@ void addScreenshot(Commands& commands) {
   CLI::Option* cursor =
       command->add_flag("--cursor", options->withCursor, "draw the mouse cursor as well");
   command->add_option("--cursor-scale", options->cursorScale, "draw it larger or smaller")
-      ->check(CLI::Range(0.1, 16.0))
+      ->check(finiteNumber(0.1, 16))
       ->needs(cursor);
 }
 
@@ -124,12 +125,13 @@ void addWatch(Commands& commands) {
       [options] { return watch(*options); });
   options->screen.addTo(command);
   command->add_option("--interval", options->interval, "seconds between captures")
-      ->check(CLI::Range(0.0, 86400.0))
+      ->check(finiteNumber(0, 86400))
       ->capture_default_str();
   command->add_option("--count", options->count, "how many times; 0 goes on until interrupted")
+      ->check(count(0, UINT64_MAX))
       ->capture_default_str();
   command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
-      ->check(CLI::Range(1, 4096))
+      ->check(count(1, 4096))
       ->capture_default_str();
 }
 

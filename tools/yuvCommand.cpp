@@ -10,6 +10,7 @@
 #include "commands.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "numbers.h"
 #include "outputFile.h"
 #include "picture.h"
 #include "progress.h"
@@ -132,7 +133,8 @@ void addYuvCommand(Commands& commands) {
   addDepth(command, options->code, {15, 16, 24, 32}, "the pixel format to convert to")
       ->capture_default_str();
   CLI::Option* frame =
-      command->add_option("--frame", options->frame, "the number of the frame, from 0");
+      command->add_option("--frame", options->frame, "the number of the frame, from 0")
+          ->check(count(0, UINT64_MAX));
   command->add_flag("--all", options->all, "every frame: OUT gets a number before its ending")
       ->excludes(frame);
 }

@@ -29,6 +29,20 @@ refused 2 'Exactly 1' rop a.png b.png --op xor
 refused 2 'RRGGBB' rop a.png b.png --op xor --color red
 refused 2 "no operation '14'" blend a.png a.png b.png --op 14
 refused 2 'divides' blend a.png a.png b.png --op saturate --dst-alpha 0
+for number in nan -nan NAN inf -inf 1e999 0x1 1x '' ' 1' +1 0.09 16.1 -1; do
+  refused 2 'scale' cursor a.png b.png --image a.png "--scale=$number"
+  refused 2 'cursor-scale' screenshot b.png --cursor "--cursor-scale=$number"
+done
+for number in nan inf 86401 -1; do
+  refused 2 'interval' watch "--interval=$number"
+done
+for number in nan 1.5 -1 0x10 010 1x '' 256 99999999999999999999; do
+  refused 2 'src-alpha' blend a.png a.png b.png "--src-alpha=$number"
+done
+for number in -1 18446744073709551616 1.5; do
+  refused 2 'count' watch "--count=$number"
+  refused 2 'frame' yuv a.png b.png --format YUY2 --size 2x2 "--frame=$number"
+done
 refused 2 'max-diffs' compare a.png a.png --max-diffs -1
 
 refused 1 "cannot read 'none.png'" convert none.png b.png
