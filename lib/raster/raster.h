@@ -711,7 +711,9 @@ RASTER_EXPORT uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* pad
 /// Scales the pixels of an alpha cursor into `dst`, smoothly and with a clear margin. Sizes are
 /// those that Raster_GetScaledCursorSize gave for the same cursor and factors; rows of `dst` are 4
 /// x scaledWidth bytes. The scaling is that of Raster_Scale, and `dst` is left alone where that
-/// refuses. Working memory comes from UtilSafeMalloc0.
+/// refuses. Where a cursor and its margins do not fit the padded size (a factor that is no number),
+/// the padding alone is scaled. Working memory of paddedWidth x 4 x paddedHeight bytes comes from
+/// UtilSafeMalloc0, which ends the process when there is none.
 RASTER_EXPORT void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scaleX,
                                            double scaleY, uint32 paddedWidth, uint32 paddedHeight,
                                            uint32 scaledWidth, uint32 scaledHeight);

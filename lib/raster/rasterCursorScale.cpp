@@ -3,6 +3,8 @@
 // Scaled cursors. A cursor is placed in a larger buffer first, with a margin on every side, so that
 // smoothing has room to spread past its edges.
 
+#include <emmintrin.h>
+
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
@@ -27,12 +29,8 @@ constexpr uint8 kTransparent = 0;
 constexpr uint8 kKeepScreen = 0xFF;
 constexpr uint8 kInvertNothing = 0;
 
-/// A number toward zero; one that does not fit gives the smallest integer, as the processor's
-/// conversion does.
-int32 truncated(double value) {
-  if (value > -2147483649.0 && value < 2147483648.0) return static_cast<int32>(value);
-  return INT32_MIN;
-}
+/// A number toward zero; one that does not fit, or is none, gives the smallest integer.
+int32 truncated(double value) { return _mm_cvttsd_si32(_mm_set_sd(value)); }
 
 /// A length in pixels, modulo 2^32.
 uint32 pixelsOf(double length) {
@@ -57,15 +55,31 @@ struct Scaling {
   uint32 scaledWidth, scaledHeight;
 };
 
+/// The bytes of the padded plane. A number that does not fit becomes one that no memory has.
+size_t paddedBytes(const Scaling& to) {
+  size_t bytes = 0;
+  return __builtin_mul_overflow(uint64{kBytesPerPixel} * to.paddedWidth, to.paddedHeight, &bytes)
+             ? SIZE_MAX
+             : bytes;
+}
+
+/// Whether a cursor and its margins fit the padded plane, as they do in the sizes that
+/// Raster_GetScaledCursorSize gives for numbers.
+bool fitsPadded(uint32 width, uint32 height, const Scaling& to) {
+  return uint64{marginOf(to.scaleX)} + width <= to.paddedWidth &&
+         uint64{marginOf(to.scaleY)} + height <= to.paddedHeight;
+}
+
 /// Scales one plane of `width` x `height` 4-byte pixels, surrounded by bytes of `fill`.
 void RasterScaleCursorPlane(uint8* dst, const uint8* plane, uint32 width, uint32 height,
                             const Scaling& to, uint8 fill, int32 smooth) {
   const uint32 pitch = kBytesPerPixel * to.paddedWidth;
-  const size_t bytes = size_t{pitch} * to.paddedHeight;
+  const size_t bytes = paddedBytes(to);
   auto* padded = static_cast<uint8*>(UtilSafeMalloc0(bytes));
   memset(padded, fill, bytes);
-  rectCopy(padded, pitchOf(pitch), plane, pitchOf(kBytesPerPixel * width), kBytesPerPixel, 0, 0,
-           marginOf(to.scaleX), marginOf(to.scaleY), width, height);
+  if (fitsPadded(width, height, to))
+    rectCopy(padded, pitchOf(pitch), plane, pitchOf(kBytesPerPixel * width), kBytesPerPixel, 0, 0,
+             marginOf(to.scaleX), marginOf(to.scaleY), width, height);
   Rect all;
   Rect_SetFromXYWH(&all, 0, 0, static_cast<int32>(to.scaledWidth),
                    static_cast<int32>(to.scaledHeight));

@@ -9,6 +9,7 @@
 #include <cmath>
 #include <cstring>
 #include <functional>
+#include <limits>
 #include <string>
 
 #include "raster.h"
@@ -407,6 +408,22 @@ TEST(Raster_GetScaledCursorSize, FollowsItsRuleForFactorsFromATenthToEight) {
   }
 }
 
+TEST(Raster_GetScaledCursorSize, GivesTheSmallestIntegerForWhatDoesNotFit) {
+  constexpr int32 kLargest = 0x7FFFFFFF;
+  const ScaledSize s = scaledSize(1, 1, 1, 1, kLargest - 2, kLargest - 1);
+  EXPECT_EQ(s.hot[0], kLargest);
+  EXPECT_EQ(s.hot[1], INT32_MIN);
+  const ScaledSize low = scaledSize(1, 1, 2, 2, -1073741826, -1073741828);
+  EXPECT_EQ(low.hot[0], -2147483646);
+  EXPECT_EQ(low.hot[1], INT32_MIN);
+  constexpr double kNan = std::numeric_limits<double>::quiet_NaN();
+  const ScaledSize none = scaledSize(1, 2, kNan, kNan, 5, 5);
+  EXPECT_EQ(none.paddedWidth, 3u);  // twice a margin of 2^31 + 1, modulo 2^32
+  EXPECT_EQ(none.paddedHeight, 4u);
+  EXPECT_EQ(none.scaledWidth, 0u);
+  EXPECT_EQ(none.hot[0], INT32_MIN);
+}
+
 /// A plane in the middle of a larger one.
 Bytes padded(const Bytes& plane, uint32 width, uint32 height, const ScaledSize& s, uint8 fill) {
   Bytes all(size_t{s.paddedWidth} * s.paddedHeight * 4, fill);
@@ -464,6 +481,75 @@ TEST(Raster_ScaleColorCursor, ScalesBothMasksToTheirNearestPixels) {
     EXPECT_EQ(andDst.data()[0], 0xFF);  // the screen is kept outside the cursor
     EXPECT_EQ(xorDst.data()[0], 0);
   }
+}
+
+/// Scales both kinds of cursor into `dst` with the sizes as given, and returns what was said.
+Messages scaleBoth(GuardedBuffer& dst, Bytes& pixels, uint32 side, const ScaledSize& s,
+                   double scaleX, double scaleY) {
+  GuardedBuffer second(dst.size());
+  RasterCursor alpha{RASTER_CURSOR_ALPHA, 0, 0, side, side, {}};
+  alpha.image.pixels = pixels.data();
+  RasterCursor mask{RASTER_CURSOR_MASK, 0, 0, side, side, {}};
+  mask.image.mask = {24, 32, pixels.data(), pixels.data()};
+  return tests::messagesOf([&] {
+    Raster_ScaleAlphaCursor(dst.data(), &alpha, scaleX, scaleY, s.paddedWidth, s.paddedHeight,
+                            s.scaledWidth, s.scaledHeight);
+    Raster_ScaleColorCursor(dst.data(), second.data(), &mask, scaleX, scaleY, s.paddedWidth,
+                            s.paddedHeight, s.scaledWidth, s.scaledHeight);
+  });
+}
+
+TEST(Raster_ScaleAlphaCursor, StaysWithinItsBuffersForEveryFactor) {
+  constexpr double kInfinity = std::numeric_limits<double>::infinity();
+  const double factors[] = {std::numeric_limits<double>::quiet_NaN(),
+                            kInfinity,
+                            -kInfinity,
+                            0,
+                            -0.0,
+                            -1,
+                            -0.3,
+                            -5,
+                            1e-300,
+                            1e300,
+                            1,
+                            4e9};
+  Random random(9);
+  Bytes pixels = random.bytes(size_t{8} * 8 * 4);
+  for (const double scaleX : factors) {
+    for (const double scaleY : factors) {
+      const ScaledSize s = scaledSize(8, 8, scaleX, scaleY, 0, 0);
+      if (uint64{s.scaledWidth} * s.scaledHeight > 1000000) continue;
+      GuardedBuffer dst(size_t{s.scaledWidth} * s.scaledHeight * 4);
+      EXPECT_EQ(scaleBoth(dst, pixels, 8, s, scaleX, scaleY).panic, "") << scaleX << " " << scaleY;
+    }
+  }
+}
+
+TEST(Raster_ScaleAlphaCursor, CopiesNothingThatDoesNotFitThePaddedSize) {
+  Bytes pixels(size_t{8} * 8 * 4, 0xFF);
+  for (const auto& [width, height] : {std::array{9u, 12u}, {12u, 9u}, {1u, 1u}, {0u, 12u}}) {
+    GuardedBuffer dst(size_t{12} * 12 * 4);
+    memset(dst.data(), 0, dst.size());
+    RasterCursor cursor{RASTER_CURSOR_ALPHA, 0, 0, 8, 8, {}};
+    cursor.image.pixels = pixels.data();
+    Raster_ScaleAlphaCursor(dst.data(), &cursor, 1, 1, width, height, 12, 12);
+    EXPECT_EQ(dst.bytes(), Bytes(dst.size(), 0)) << width << "x" << height;
+  }
+}
+
+TEST(Raster_ScaleAlphaCursor, EndsInAPanicWhenThePaddedPlaneIsMoreThanMemory) {
+  Bytes pixels(size_t{2} * 2 * 4, 1);
+  GuardedBuffer dst(3 * 3 * 4);
+  // 2^64 bytes.
+  const ScaledSize endless = {0x80000000, 0x80000000, 3, 3, {0, 0}, 36};
+  EXPECT_TRUE(scaleBoth(dst, pixels, 2, endless, 1, 1).panic.starts_with("Out of memory: "));
+  // The sizes of a cursor of 2 x 2: 2^32 bytes.
+  const double scale = 1 / 16382.5;
+  const ScaledSize s = scaledSize(2, 2, scale, scale, 0, 0);
+  ASSERT_EQ(s.paddedWidth, 32768u);
+  ASSERT_EQ(s.scaledWidth, 3u);
+  if (sizeof(size_t) > 4) return;
+  EXPECT_TRUE(scaleBoth(dst, pixels, 2, s, scale, scale).panic.starts_with("Out of memory: "));
 }
 
 }  // namespace
