@@ -2,7 +2,8 @@
 include(CMakePackageConfigHelpers)
 
 install(TARGETS raster tarnlibs EXPORT rasterTargets
-  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
+  ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
 install(FILES
   lib/raster/raster.h lib/raster/rasterExport.h ${RASTER_GENERATED_HEADERS}/rasterVersion.h
   lib/rect/rect.h lib/image/imageUtil.h
@@ -20,20 +21,21 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
 install(FILES ${PROJECT_BINARY_DIR}/rasterConfig.cmake ${PROJECT_BINARY_DIR}/rasterConfigVersion.cmake
   DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/raster)
 
-# The pkg-config files find their tree from where they lie, so an installed tree can be moved.
-if(IS_ABSOLUTE ${CMAKE_INSTALL_LIBDIR})
+# The pkg-config files find their tree from where they lie, so an installed tree can be moved; but in
+# /usr they say so, and pkg-config leaves out what the compiler looks through anyway.
+if(IS_ABSOLUTE ${CMAKE_INSTALL_LIBDIR} OR CMAKE_INSTALL_PREFIX STREQUAL "/usr")
   set(RASTER_PC_PREFIX ${CMAKE_INSTALL_PREFIX})
-  set(RASTER_PC_LIBDIR ${CMAKE_INSTALL_LIBDIR})
 else()
   file(RELATIVE_PATH upward /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
+  string(REGEX REPLACE "/$" "" upward "${upward}")
   set(RASTER_PC_PREFIX "\${pcfiledir}/${upward}")
-  set(RASTER_PC_LIBDIR "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
 endif()
-if(IS_ABSOLUTE ${CMAKE_INSTALL_INCLUDEDIR})
-  set(RASTER_PC_INCLUDEDIR ${CMAKE_INSTALL_INCLUDEDIR}/raster)
-else()
-  set(RASTER_PC_INCLUDEDIR "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}/raster")
-endif()
+foreach(folder IN ITEMS LIBDIR INCLUDEDIR)
+  set(RASTER_PC_${folder} ${CMAKE_INSTALL_${folder}})
+  if(NOT IS_ABSOLUTE ${CMAKE_INSTALL_${folder}})
+    set(RASTER_PC_${folder} "\${prefix}/${CMAKE_INSTALL_${folder}}")
+  endif()
+endforeach()
 foreach(package raster tarnlibs)
   configure_file(${CMAKE_CURRENT_LIST_DIR}/${package}.pc.in ${PROJECT_BINARY_DIR}/${package}.pc @ONLY)
   install(FILES ${PROJECT_BINARY_DIR}/${package}.pc

@@ -14,9 +14,10 @@ installHere() {
   libraries=$(dirname "$packages")
 }
 
-# Runs a program with the installed libraries; libpng of the other word size is in a private folder.
+# Runs a program, which finds the installed libraries by itself; libpng of the other word size is in a
+# private folder.
 run() {
-  LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$@" || { echo "failed: $*"; exit 1; }
+  LD_LIBRARY_PATH="$PNG_FOLDER" "$@" || { echo "failed: $*"; exit 1; }
 }
 
 # Configures and builds a CMake project: configure FOLDER [ARGUMENT...]

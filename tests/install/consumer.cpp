@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 //
-// The same from C++.
+// The same from C++, with the headers by their full names.
 
-#include <dynBuf.h>
-#include <imageUtil.h>
-#include <raster.h>
-#include <rect.h>
+#include <raster/dynBuf.h>
+#include <raster/imageUtil.h>
+#include <raster/raster.h>
+#include <raster/rect.h>
 
 #include <vector>
 

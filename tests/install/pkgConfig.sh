@@ -8,8 +8,15 @@ flags() { PKG_CONFIG_PATH=$packages pkg-config "$1" raster; }
 # Only what pkg-config says, the word size, and where libpng of that word size is.
 $CC -std=c11 "$here/consumer.c" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerC"
 $CXX -std=c++17 "$here/consumer.cpp" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerCpp"
-run "$work/consumerC"
-run "$work/consumerCpp"
+LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$work/consumerC"
+LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$work/consumerCpp"
 
 [ "$(flags --modversion)" = "$(PKG_CONFIG_PATH=$packages pkg-config --modversion tarnlibs)" ]
 PKG_CONFIG_PATH=$packages pkg-config --validate raster tarnlibs
+
+# Installed in /usr, the package says nothing that the compiler knows already.
+"$CMAKE" -G Ninja -S "$SOURCE" -B "$work/usr" ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} \
+  -DCMAKE_INSTALL_PREFIX=/usr -DRASTER_BUILD_TOOLS=OFF -DRASTER_BUILD_TESTS=OFF >"$work/log" 2>&1 ||
+  { cat "$work/log"; exit 1; }
+inUsr=$(PKG_CONFIG_PATH=$work/usr pkg-config --cflags raster)
+[ "$(echo $inUsr)" = -I/usr/include/raster ] || { echo "in /usr: $inUsr"; exit 1; }
