@@ -676,7 +676,8 @@ RASTER_EXPORT void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, ui
                                                  uint8* dst, uint32 dstSize);
 
 /// Clips a cursor, placed with its hot spot at (x, y), to the frame buffer. Returns false, and
-/// leaves `box` alone, when nothing of it is visible. Sizes above 2^31 - 1 count as negative.
+/// leaves `box` alone, when nothing of it is visible. Sizes of the cursor above 2^31 - 1 count as
+/// negative.
 RASTER_EXPORT bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb,
                                            const RasterCursor* cursor, int32 x, int32 y,
                                            RasterCursorBox* box);

@@ -67,8 +67,10 @@ struct Visible {
   int64 first;  ///< in the cursor
 };
 
-/// Clips `size` pixels at `at`. In 64 bits, where no sum of 32-bit numbers overflows.
+/// Clips `size` pixels at `at`. In 64 bits, where no sum of 32-bit numbers overflows. What begins
+/// further right than a box can say is not visible, however wide the frame buffer.
 Visible clip(int64 at, int64 size, int64 limit) {
+  if (at > INT32_MAX) return {};
   Visible v = {at, size, 0};
   if (at < 0) v = {0, size + at, -at};
   v.size = std::min(v.size, limit - v.at);
@@ -127,10 +129,10 @@ void Raster_ExpandPlanarCursorData(uint32 width, uint32 height, uint32 andDepth,
 
 bool Raster_ComputeCursorBox(const RasterFrameBufferDesc* fb, const RasterCursor* cursor, int32 x,
                              int32 y, RasterCursorBox* box) {
-  const raster::Visible columns = raster::clip(
-      int64{x} - cursor->hotX, static_cast<int32>(cursor->width), static_cast<int32>(fb->width));
-  const raster::Visible rows = raster::clip(
-      int64{y} - cursor->hotY, static_cast<int32>(cursor->height), static_cast<int32>(fb->height));
+  const raster::Visible columns =
+      raster::clip(int64{x} - cursor->hotX, static_cast<int32>(cursor->width), fb->width);
+  const raster::Visible rows =
+      raster::clip(int64{y} - cursor->hotY, static_cast<int32>(cursor->height), fb->height);
   if (columns.size <= 0 || rows.size <= 0) return false;
   *box = {static_cast<int32>(columns.at),    static_cast<int32>(rows.at),
           static_cast<int32>(columns.size),  static_cast<int32>(rows.size),

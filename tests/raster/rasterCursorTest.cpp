@@ -196,6 +196,33 @@ TEST(Raster_ComputeCursorBox, ClipsAtTheTopLeftCorner) {
   EXPECT_TRUE(Raster_ComputeCursorBox(&fb, &cursor, 103, 50, &box));
 }
 
+TEST(Raster_ComputeCursorBox, TakesTheFrameBufferSizeAsUnsigned) {
+  RasterCursor cursor{};
+  cursor.width = 16;
+  cursor.height = 8;
+  for (const uint32 size : {0x7FFFFFFFu, 0x80000000u, 0x80000001u, 0xFFFFFFFFu}) {
+    const RasterFrameBufferDesc fb = {size, size, 24, 32, 0};
+    for (const int32 at : {-3, 100, 0x7FFFFFF0, 0x7FFFFFFC, INT32_MAX}) {
+      RasterCursorBox expected{};
+      RasterCursorBox actual{};
+      ASSERT_EQ(Raster_ComputeCursorBox(&fb, &cursor, at, at, &actual),
+                reference::cursorBox(fb, cursor, at, at, &expected))
+          << size << " " << at;
+      ASSERT_EQ(0, memcmp(&actual, &expected, sizeof actual)) << size << " " << at;
+    }
+  }
+}
+
+TEST(Raster_ComputeCursorBox, SeesNothingFurtherRightThanABoxCanSay) {
+  const RasterFrameBufferDesc fb = {0xFFFFFFFF, 0xFFFFFFFF, 24, 32, 0};
+  RasterCursor cursor = {};
+  cursor.width = cursor.height = 16;
+  cursor.hotX = -1;
+  RasterCursorBox box = {};
+  EXPECT_FALSE(Raster_ComputeCursorBox(&fb, &cursor, 0x7FFFFFFF, 0, &box));
+  EXPECT_TRUE(Raster_ComputeCursorBox(&fb, &cursor, 0x7FFFFFFE, 0, &box));
+}
+
 TEST(Raster_ComputeCursorBox, DoesNotOverflowAtTheEndsOfTheRange) {
   const RasterFrameBufferDesc fb = {100, 100, 24, 32, 400};
   RasterCursor cursor{};
