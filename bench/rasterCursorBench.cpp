@@ -32,9 +32,12 @@ void cursorJob(const std::string& name, uint32 size, uint32 type, uint32 depth, 
   const RasterFrameBufferDesc fb = {kScreenWidth, kScreenHeight, depth, bpp, kScreenWidth * bytes};
   RasterCursor cursor{type, 0, 0, size, size, {}};
   if (type == RASTER_CURSOR_ALPHA) {
-    cursor.image.pixels = planes;
+    cursor.pixels = planes;
   } else {
-    cursor.image.mask = {depth, bpp, planes, planes + size_t{size} * size * bytes};
+    cursor.depth = depth;
+    cursor.bpp = bpp;
+    cursor.andMask = planes;
+    cursor.xorMask = planes + size_t{size} * size * bytes;
   }
   c.add("raster", [=] {
     RasterCursorBox box;

@@ -32,7 +32,10 @@ int main(void) {
   Raster_ExpandPlanarCursorData(kSide, kSide, 1, andBits, 1, xorBits, 32, planes, sizeof planes);
 
   RasterCursor cursor = {RASTER_CURSOR_MASK, 0, 0, kSide, kSide, {0}};
-  cursor.image.mask = (RasterCursorMask){24, 32, planes, planes + sizeof planes / 2};
+  cursor.depth = 24;
+  cursor.bpp = 32;
+  cursor.andMask = planes;
+  cursor.xorMask = planes + sizeof planes / 2;
   const RasterFrameBufferDesc screen = {kWidth, kHeight, 24, 32, kPitch};
 
   Raster_RectFill(frame, kPitch, 4, 0x00808080, 0, 0, kWidth, kHeight);

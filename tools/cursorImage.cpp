@@ -48,9 +48,12 @@ CursorImage CursorImage::ofBitPlanes(uint32 width, uint32 height, const Point& h
 RasterCursor CursorImage::record() const {
   RasterCursor cursor = geometry;
   if (cursor.type == RASTER_CURSOR_ALPHA) {
-    cursor.image.pixels = bytesOf(first);
+    cursor.pixels = bytesOf(first);
   } else {
-    cursor.image.mask = {24, 32, bytesOf(first), bytesOf(second)};
+    cursor.depth = 24;
+    cursor.bpp = 32;
+    cursor.andMask = bytesOf(first);
+    cursor.xorMask = bytesOf(second);
   }
   return cursor;
 }

@@ -610,26 +610,25 @@ RASTER_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 
 /// The kinds of cursor: an AND and an XOR plane in the frame buffer's format, or pixels with alpha.
 enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
 
-/// The planes of a mask cursor: `height` rows of `width` x (bpp / 8) bytes each, without gaps.
+/// A cursor: where it is, and then what its type has. The caller owns the planes.
+///
+/// A mask cursor's planes have `height` rows of `width` x (bpp / 8) bytes each, without gaps.
 /// Screen pixels survive where the AND plane is all ones, and are inverted where the XOR plane is.
-typedef struct RasterCursorMask {
-  uint32 depth;
-  uint32 bpp;
-  uint8* andMask;
-  uint8* xorMask;
-} RasterCursorMask;
-
-/// A cursor. The caller owns its planes.
 typedef struct RasterCursor {
   uint32 type;
   int32 hotX;  ///< the hot spot within the image, in pixels
   int32 hotY;
   uint32 width;  ///< in pixels
   uint32 height;
-  union {
-    uint8* pixels;          ///< RASTER_CURSOR_ALPHA: rows of 4-byte pixels as for Raster_AlphaBlend
-    RasterCursorMask mask;  ///< RASTER_CURSOR_MASK
-  } image;
+  __extension__ union {
+    uint8* pixels;  ///< RASTER_CURSOR_ALPHA: rows of 4-byte pixels as for Raster_AlphaBlend
+    __extension__ struct {
+      uint32 depth;  ///< RASTER_CURSOR_MASK
+      uint32 bpp;
+      uint8* andMask;
+      uint8* xorMask;
+    };
+  };
 } RasterCursor;
 
 /// A frame buffer's size in pixels, format and pitch in bytes.

@@ -19,10 +19,10 @@ constexpr char kSource[] = "lib/raster/rasterCursor";
 
 // Five 32-bit words, then pointers at their natural alignment.
 static_assert(offsetof(RasterCursor, height) == 16);
-static_assert(offsetof(RasterCursor, image.pixels) == (sizeof(void*) == 4 ? 20 : 24));
-static_assert(offsetof(RasterCursor, image.mask.bpp) == (sizeof(void*) == 4 ? 24 : 28));
-static_assert(offsetof(RasterCursor, image.mask.andMask) == (sizeof(void*) == 4 ? 28 : 32));
-static_assert(offsetof(RasterCursor, image.mask.xorMask) == (sizeof(void*) == 4 ? 32 : 40));
+static_assert(offsetof(RasterCursor, pixels) == (sizeof(void*) == 4 ? 20 : 24));
+static_assert(offsetof(RasterCursor, bpp) == (sizeof(void*) == 4 ? 24 : 28));
+static_assert(offsetof(RasterCursor, andMask) == (sizeof(void*) == 4 ? 28 : 32));
+static_assert(offsetof(RasterCursor, xorMask) == (sizeof(void*) == 4 ? 32 : 40));
 static_assert(sizeof(RasterFrameBufferDesc) == 20 && sizeof(RasterCursorBox) == 24);
 
 constexpr uint32 kTooLarge = 0xFFFFFFFF;
@@ -86,7 +86,7 @@ struct Target {
 
 void drawAlpha(const Target& to, const RasterFrameBufferDesc& fb, const RasterCursor& cursor,
                const RasterCursorBox& box) {
-  alphaBlend(to.bits, to.x, to.y, to.pitch, cursor.image.pixels, static_cast<uint32>(box.srcX),
+  alphaBlend(to.bits, to.x, to.y, to.pitch, cursor.pixels, static_cast<uint32>(box.srcX),
              static_cast<uint32>(box.srcY), 4 * cursor.width, static_cast<uint32>(box.width),
              static_cast<uint32>(box.height), fb.depth, fb.bpp, RASTER_BLEND_OVER, 0, 0, 0, 0);
 }
@@ -99,8 +99,8 @@ void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor
                 static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x, to.y,
                 static_cast<uint32>(box.width), static_cast<uint32>(box.height));
   };
-  combine(cursor.image.mask.andMask, RASTER_ROP_AND);
-  combine(cursor.image.mask.xorMask, RASTER_ROP_XOR);
+  combine(cursor.andMask, RASTER_ROP_AND);
+  combine(cursor.xorMask, RASTER_ROP_XOR);
 }
 
 }  // namespace
@@ -155,8 +155,8 @@ void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb, uint8* sa
   if (cursor->type == RASTER_CURSOR_ALPHA) {
     raster::drawAlpha(target, *fb, *cursor, *box);
   } else if (cursor->type == RASTER_CURSOR_MASK) {
-    const RasterCursorMask& mask = cursor->image.mask;
-    if (mask.depth != fb->depth || mask.bpp != fb->bpp) raster::notImplemented(raster::kSource);
+    if (cursor->depth != fb->depth || cursor->bpp != fb->bpp)
+      raster::notImplemented(raster::kSource);
     raster::drawMask(target, bytesPerPixel, *cursor, *box);
   } else {
     raster::notImplemented(raster::kSource);

@@ -111,7 +111,7 @@ void Raster_ScaleAlphaCursor(uint8* dst, const RasterCursor* cursor, double scal
                              uint32 paddedWidth, uint32 paddedHeight, uint32 scaledWidth,
                              uint32 scaledHeight) {
   const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
-  raster::RasterScaleCursorPlane(dst, cursor->image.pixels, cursor->width, cursor->height, to,
+  raster::RasterScaleCursorPlane(dst, cursor->pixels, cursor->width, cursor->height, to,
                                  raster::kTransparent, raster::kSmoothed);
 }
 
@@ -119,10 +119,9 @@ void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const RasterCursor* c
                              double scaleX, double scaleY, uint32 paddedWidth, uint32 paddedHeight,
                              uint32 scaledWidth, uint32 scaledHeight) {
   const raster::Scaling to = {scaleX, scaleY, paddedWidth, paddedHeight, scaledWidth, scaledHeight};
-  const RasterCursorMask& mask = cursor->image.mask;
-  raster::RasterScaleCursorPlane(andDst, mask.andMask, cursor->width, cursor->height, to,
+  raster::RasterScaleCursorPlane(andDst, cursor->andMask, cursor->width, cursor->height, to,
                                  raster::kKeepScreen, raster::kNearest);
-  raster::RasterScaleCursorPlane(xorDst, mask.xorMask, cursor->width, cursor->height, to,
+  raster::RasterScaleCursorPlane(xorDst, cursor->xorMask, cursor->width, cursor->height, to,
                                  raster::kInvertNothing, raster::kNearest);
 }
 

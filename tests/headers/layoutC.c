@@ -35,11 +35,11 @@ AT(RasterCursor, hotX, 4);
 AT(RasterCursor, hotY, 8);
 AT(RasterCursor, width, 12);
 AT(RasterCursor, height, 16);
-AT(RasterCursor, image.pixels, PTR == 4 ? 20 : 24);
-AT(RasterCursor, image.mask.depth, PTR == 4 ? 20 : 24);
-AT(RasterCursor, image.mask.bpp, PTR == 4 ? 24 : 28);
-AT(RasterCursor, image.mask.andMask, PTR == 4 ? 28 : 32);
-AT(RasterCursor, image.mask.xorMask, PTR == 4 ? 32 : 40);
+AT(RasterCursor, pixels, PTR == 4 ? 20 : 24);
+AT(RasterCursor, depth, PTR == 4 ? 20 : 24);
+AT(RasterCursor, bpp, PTR == 4 ? 24 : 28);
+AT(RasterCursor, andMask, PTR == 4 ? 28 : 32);
+AT(RasterCursor, xorMask, PTR == 4 ? 32 : 40);
 SIZE(RasterCursor, PTR == 4 ? 36 : 48);
 
 AT(RasterFrameBufferDesc, width, 0);

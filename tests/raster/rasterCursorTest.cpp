@@ -36,6 +36,13 @@ void expectPanic(const std::function<void()>& call) {
   EXPECT_EQ(said.warning, "");
 }
 
+void setPlanes(RasterCursor& cursor, uint32 depth, uint32 bpp, uint8* andMask, uint8* xorMask) {
+  cursor.depth = depth;
+  cursor.bpp = bpp;
+  cursor.andMask = andMask;
+  cursor.xorMask = xorMask;
+}
+
 /// The formats of frame buffers that take both kinds of cursor.
 struct Format {
   uint32 depth, bpp;
@@ -285,9 +292,9 @@ struct Planes {
     andMask.assign(s.andMask);
     xorMask.assign(s.xorMask);
     if (s.cursor.type == RASTER_CURSOR_ALPHA) {
-      s.cursor.image.pixels = pixels.data();
+      s.cursor.pixels = pixels.data();
     } else {
-      s.cursor.image.mask = {s.fb.depth, s.fb.bpp, andMask.data(), xorMask.data()};
+      setPlanes(s.cursor, s.fb.depth, s.fb.bpp, andMask.data(), xorMask.data());
     }
   }
   GuardedBuffer pixels, andMask, xorMask;
@@ -349,7 +356,7 @@ TEST(Raster_DrawCursor, CopiesWithTheFullPitchAndDrawsMasksWithTheRoundedOne) {
   Bytes keep(16, 0xFF);
   Bytes flip(16, 0x0F);
   RasterCursor cursor{RASTER_CURSOR_MASK, 0, 0, 2, 2, {}};
-  cursor.image.mask = {24, 32, keep.data(), flip.data()};
+  setPlanes(cursor, 24, 32, keep.data(), flip.data());
   const RasterCursorBox box = {0, 0, 2, 2, 0, 0};
   Bytes expected(17);
   std::copy(screen.begin(), screen.begin() + 8, expected.begin());
@@ -369,7 +376,7 @@ TEST(Raster_DrawCursor, PanicsForMasksOfAnotherFormatAndUnknownTypesAfterTheCopy
   for (const auto& [type, depth, bpp] :
        {std::array{0u, 24u, 24u}, std::array{0u, 16u, 32u}, std::array{2u, 24u, 32u}}) {
     RasterCursor cursor{type, 0, 0, 4, 4, {}};
-    cursor.image.mask = {depth, bpp, plane.data(), plane.data()};
+    setPlanes(cursor, depth, bpp, plane.data(), plane.data());
     Bytes save(64);
     expectPanic([&] { Raster_DrawCursor(screen.data(), &fb, save.data(), 16, &cursor, &box); });
     EXPECT_EQ(save, screen);
@@ -477,7 +484,7 @@ TEST(Raster_ScaleAlphaCursor, ScalesSmoothlyWithATransparentMargin) {
   for (const double scale : {0.1, 0.5, 0.75, 1.0, 1.5, 2.0, 3.3, 8.0}) {
     Bytes pixels = random.bytes(size_t{17} * 13 * 4);
     RasterCursor cursor{RASTER_CURSOR_ALPHA, 0, 0, 17, 13, {}};
-    cursor.image.pixels = pixels.data();
+    cursor.pixels = pixels.data();
     const double scaleY = scale > 1 ? scale / 2 : scale * 2;
     const ScaledSize s = scaledSize(17, 13, scale, scaleY, 0, 0);
     GuardedBuffer dst(s.bytes);
@@ -497,7 +504,7 @@ TEST(Raster_ScaleColorCursor, ScalesBothMasksToTheirNearestPixels) {
     Bytes keep = random.bytes(size_t{17} * 13 * 4);
     Bytes flip = random.bytes(size_t{17} * 13 * 4);
     RasterCursor cursor{RASTER_CURSOR_MASK, 0, 0, 17, 13, {}};
-    cursor.image.mask = {24, 32, keep.data(), flip.data()};
+    setPlanes(cursor, 24, 32, keep.data(), flip.data());
     const ScaledSize s = scaledSize(17, 13, scale, scale, 0, 0);
     GuardedBuffer andDst(s.bytes);
     GuardedBuffer xorDst(s.bytes);
@@ -515,9 +522,9 @@ Messages scaleBoth(GuardedBuffer& dst, Bytes& pixels, uint32 side, const ScaledS
                    double scaleX, double scaleY) {
   GuardedBuffer second(dst.size());
   RasterCursor alpha{RASTER_CURSOR_ALPHA, 0, 0, side, side, {}};
-  alpha.image.pixels = pixels.data();
+  alpha.pixels = pixels.data();
   RasterCursor mask{RASTER_CURSOR_MASK, 0, 0, side, side, {}};
-  mask.image.mask = {24, 32, pixels.data(), pixels.data()};
+  setPlanes(mask, 24, 32, pixels.data(), pixels.data());
   return tests::messagesOf([&] {
     Raster_ScaleAlphaCursor(dst.data(), &alpha, scaleX, scaleY, s.paddedWidth, s.paddedHeight,
                             s.scaledWidth, s.scaledHeight);
@@ -558,7 +565,7 @@ TEST(Raster_ScaleAlphaCursor, CopiesNothingThatDoesNotFitThePaddedSize) {
     GuardedBuffer dst(size_t{12} * 12 * 4);
     memset(dst.data(), 0, dst.size());
     RasterCursor cursor{RASTER_CURSOR_ALPHA, 0, 0, 8, 8, {}};
-    cursor.image.pixels = pixels.data();
+    cursor.pixels = pixels.data();
     Raster_ScaleAlphaCursor(dst.data(), &cursor, 1, 1, width, height, 12, 12);
     EXPECT_EQ(dst.bytes(), Bytes(dst.size(), 0)) << width << "x" << height;
   }
