@@ -540,7 +540,13 @@ RASTER_EXPORT void Raster_ScaleExit(void);
 /// the same pixels as drawing everything. Beyond the source its last row and column go on.
 ///
 /// `dstBits` and `srcBits` are frame buffers of `dstWidth` x `dstHeight` and `srcWidth` x
-/// `srcHeight` pixels with pitches in bytes; a source pitch may be negative. They must not overlap.
+/// `srcHeight` pixels with pitches in bytes; a source pitch may be negative. They may overlap, and
+/// so may rows of the destination. A source row is resampled whole, into memory of its own, when a
+/// destination row first needs it; as many are kept as one destination row may need (1 without
+/// smoothing; with it the vertical step, rounded up, and 1 more; 32 at most), row r in place of the
+/// one that is r modulo their number. Destination rows are drawn from these, from the top down. So
+/// a picture can be reduced in place, with the same base and pitch.
+///
 /// The formats must be equal, with a depth and a number of bits per pixel (bpp) that are multiples
 /// of 8; or the source is depth 24 in 32 bpp, and the destination depth is 24 or 16. The three
 /// ignored arguments may have any value.

@@ -9,8 +9,6 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include <bit>
-
 #include "rasterScaleColumns-inl.h"
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
@@ -22,8 +20,11 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
+/// No source row: their numbers are below 32768.
+constexpr uint32 kNoRow = ~0u;
+
 /// Source rows resampled to the width of the destination, as 4-byte pixels. There are slots for the
-/// rows that one destination row needs, in a power of two, so that a row's number tells its slot.
+/// rows that one destination row needs; a row's number, modulo theirs, tells its slot.
 class RowCache {
  public:
   static size_t memoryFor(const ScaleJob& job) {
@@ -41,7 +42,7 @@ class RowCache {
   /// The row at a vertical position.
   const uint32* at(uint32 position) {
     const uint32 row = job_.rowOf(position);
-    Slot& slot = slot_[row & (slots_ - 1)];
+    Slot& slot = slot_[row % slots_];
     if (slot.row != row) {
       slot.row = row;
       columns_.resample(job_.srcRow(row), slot.pixels);
@@ -50,7 +51,6 @@ class RowCache {
   }
 
  private:
-  static constexpr uint32 kNoRow = ~0u;
   struct Slot {
     uint32* pixels;
     uint32 row;
@@ -58,7 +58,7 @@ class RowCache {
 
   static uint32 slotsOf(const ScaleJob& job) {
     if (!job.smooth) return 1;
-    return std::bit_ceil(std::min(((job.stepY + kOnePixel - 1) >> 16) + 1, kMaxRows));
+    return std::min(((job.stepY + kOnePixel - 1) >> 16) + 1, kMaxRows);
   }
 
   const ScaleJob& job_;
@@ -131,7 +131,7 @@ void storePlainRow(const ScaleJob& job, uint8* dst, const uint32* row) {
 /// that show the same one are copied where they are whole pixels.
 template <class DrawRow>
 HWY_INLINE void drawPlainRows(const ScaleJob& job, bool wholePixels, const DrawRow& drawRow) {
-  const size_t bytes = size_t{job.width} * job.dstBytesPerPixel;
+  const size_t bytes = job.rowBytes();
   uint32 y = job.startY;
   uint32 shown = 0;
   uint8* dst = job.dst;
@@ -146,27 +146,43 @@ HWY_INLINE void drawPlainRows(const ScaleJob& job, bool wholePixels, const DrawR
   }
 }
 
+/// Destination rows that are one source row each, in the same format: made by sample(source row,
+/// pixels) in `sampled`, and copied from there.
+template <class Sample>
+void drawSampledRows(const ScaleJob& job, uint8* sampled, const Sample& sample) {
+  uint32 held = kNoRow;
+  drawPlainRows(job, false, [&](uint8* dst, uint32 row, uint32) {
+    if (row != held) sample(job.srcRow(row), sampled);
+    held = row;
+    memcpy(dst, sampled, job.rowBytes());
+  });
+}
+
 template <unsigned kBytes> void drawShortPixels(const ScaleJob& job) {
-  ScaleMemory memory(ShortColumns<kBytes>::memoryFor(job));
+  ScaleMemory memory(ShortColumns<kBytes>::memoryFor(job) +
+                     ScaleMemory::sizeOf<uint8>(job.rowBytes()));
   const ShortColumns<kBytes> columns(job, memory);
-  drawPlainRows(job, true,
-                [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
+  if (job.isApart()) {
+    drawPlainRows(job, true,
+                  [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
+  } else {
+    drawSampledRows(job, memory.take<uint8>(job.rowBytes()),
+                    [&](const uint8* row, uint8* out) { columns.sample(row, out); });
+  }
 }
 
 /// Nearest sampling of pixels of any size.
 void drawWidePixels(const ScaleJob& job) {
   const size_t size = job.srcBytesPerPixel;
-  uint8* dst = job.dst;
-  uint32 y = job.startY;
-  for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
-    const uint8* row = job.srcRow(job.rowOf(y));
+  ScaleMemory memory(ScaleMemory::sizeOf<uint8>(job.rowBytes()));
+  drawSampledRows(job, memory.take<uint8>(job.rowBytes()), [&](const uint8* row, uint8* out) {
     uint32 x = job.startX;
     for (uint32 j = 0; j < job.width; ++j) {
       const bool inside = x < job.xLimit();
-      memcpy(dst + j * size, row + (inside ? x >> 16 : job.srcWidth - 1) * size, size);
+      memcpy(out + j * size, row + (inside ? x >> 16 : job.srcWidth - 1) * size, size);
       if (inside) x += job.stepX;
     }
-  }
+  });
 }
 
 void drawScaled(const ScaleJob& job) {
@@ -174,19 +190,20 @@ void drawScaled(const ScaleJob& job) {
   if (job.srcBytesPerPixel > 4) return drawWidePixels(job);
   if (job.srcBytesPerPixel == 1) return drawShortPixels<1>(job);
   if (job.srcBytesPerPixel == 2) return drawShortPixels<2>(job);
-  if (drawWholeSteps(job)) return;
+  const bool apart = job.isApart();
+  if (apart && drawWholeSteps(job)) return;
   ScaleMemory memory(Columns::memoryFor(job) + RowCache::memoryFor(job));
   const Columns columns(job, memory);
   RowCache cache(job, columns, memory);
   const bool converts = job.depthsDiffer || job.sizesDiffer;
   if (job.smoothRows()) {
     job.dstBytesPerPixel == 4 ? drawSmoothRows<4>(job, cache) : drawSmoothRows<3>(job, cache);
-  } else if (!converts && !job.smoothColumns() && job.dstBytesPerPixel == 4) {
+  } else if (apart && !converts && !job.smoothColumns() && job.dstBytesPerPixel == 4) {
     drawPlainRows(job, true,
                   [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
   } else {
     const bool wholePixels = !converts || (job.depthsDiffer && job.dstBytesPerPixel == 2);
-    drawPlainRows(job, wholePixels,
+    drawPlainRows(job, apart && wholePixels,
                   [&](uint8* dst, uint32, uint32 y) { storePlainRow(job, dst, cache.at(y)); });
   }
 }

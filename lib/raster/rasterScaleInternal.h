@@ -56,6 +56,16 @@ struct ScaleJob {
     const uint32 row = static_cast<int32>(position) < 0 ? 0 : position >> 16;
     return row < srcHeight ? row : srcHeight - 1;
   }
+  size_t rowBytes() const { return size_t{width} * dstBytesPerPixel; }
+
+  /// Whether no byte of the destination is a byte of the source or of two rows. Otherwise a source
+  /// row is to be kept as it was when it was first needed, and resampled whole before it is drawn.
+  bool isApart() const {
+    const RowSpan to(dst, dstPitch, rowBytes(), height);
+    const RowSpan from(src, srcPitch, size_t{srcWidth} * srcBytesPerPixel, srcHeight);
+    const auto gap = static_cast<intptr_t>(rowBytes());
+    return to.isApartFrom(from) && (height == 1 || dstPitch >= gap || dstPitch <= -gap);
+  }
   const uint8* srcRow(uint32 row) const { return rowAt(src, srcPitch, row, 0, 0); }
 };
 

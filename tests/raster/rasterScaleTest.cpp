@@ -161,6 +161,73 @@ void checkRandomCalls(uint64 seed, int rounds, int32 smooth) {
 TEST(Raster_Scale, EqualsTheModelWithoutSmoothing) { checkRandomCalls(1, 6000, 0); }
 TEST(Raster_Scale, EqualsTheModelWithSmoothing) { checkRandomCalls(2, 12000, 1); }
 
+/// Runs a call whose frame buffers lie in one memory and compares every byte with the model. The
+/// bases count from the start of the other frame buffer, in either direction.
+void checkInOneMemory(Random& random, ScaleCall c) {
+  const size_t dstBytes = extent(c.dstWidth, c.dstHeight, c.dstPitch, c.dstBpp);
+  const auto first = static_cast<int64>(std::min(c.dstBase, c.srcBase));
+  c.dstBase -= static_cast<size_t>(first);
+  c.srcBase -= static_cast<size_t>(first);
+  Bytes expected = random.bytes(std::max(c.dstBase + dstBytes, srcBytesOf(c)));
+  GuardedBuffer memory(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+  memory.assign(expected);
+  const ScaleAnswer answer = reference::scale(expected, expected, c);
+  ASSERT_EQ(run(memory.data(), memory.data(), c), answer.result) << describe(c);
+  ASSERT_TRUE(memory.bytes() == expected) << describe(c);
+}
+
+/// A pitch of rows that lie apart, or that reach into one another.
+uint32 somePitch(Random& random, uint32 rowBytes) {
+  return random.oneOf({rowBytes, rowBytes + random.below(9), random.below(rowBytes + 1)});
+}
+
+/// The row cache decides: a source row is resampled whole when it is first needed, and stays so.
+TEST(Raster_Scale, EqualsTheModelWhereTheFrameBuffersOverlap) {
+  Random random(10);
+  for (int round = 0; round < 12000; ++round) {
+    ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
+    c.dstWidth = someSize(random, 200);
+    c.dstHeight = someSize(random, 50);
+    c.srcWidth = someSize(random, 200);
+    c.srcHeight = someSize(random, 50);
+    c.scaleX = someScale(random);
+    c.scaleY = random.below(3) == 0 ? c.scaleX : someScale(random);
+    if (random.below(4) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25, 1.0, 2.0});
+    c.smooth = random.between(0, 1);
+    someRectangle(random, c);
+    const uint32 srcPitch = somePitch(random, c.srcWidth * (c.srcBpp / 8));
+    c.srcPitch = static_cast<int32>(srcPitch);
+    c.dstPitch = random.below(2) == 0 ? srcPitch : somePitch(random, c.dstWidth * (c.dstBpp / 8));
+    const size_t srcBytes = extent(c.srcWidth, c.srcHeight, srcPitch, c.srcBpp);
+    const size_t dstBytes = extent(c.dstWidth, c.dstHeight, c.dstPitch, c.dstBpp);
+    // In one place, a few bytes beside each other, or anywhere where they still touch.
+    const size_t apart = random.oneOf({0u, random.below(70), random.below(20000)});
+    c.dstBase = random.below(2) == 0 ? std::min(apart, srcBytes) : 0;
+    c.srcBase = c.dstBase == 0 ? std::min(apart, dstBytes) : 0;
+    checkInOneMemory(random, c);
+    if (HasFatalFailure()) FAIL() << "round " << round;
+  }
+}
+
+TEST(Raster_Scale, EqualsTheModelWhereDestinationRowsOverlap) {
+  Random random(11);
+  for (int round = 0; round < 6000; ++round) {
+    ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
+    c.dstWidth = someSize(random, 200);
+    c.dstHeight = someSize(random, 50);
+    c.srcWidth = someSize(random, 200);
+    c.srcHeight = someSize(random, 20);
+    c.scaleX = someScale(random);
+    c.scaleY = someScale(random);
+    c.smooth = random.between(0, 1);
+    someRectangle(random, c);
+    placeBuffers(random, c);
+    c.dstPitch = random.below(c.dstWidth * (c.dstBpp / 8) + 1);
+    check(random, c);
+    if (HasFatalFailure()) FAIL() << "round " << round;
+  }
+}
+
 /// Positions wrap at 32 bits: horizontal ones go on unsigned, vertical ones turn negative.
 TEST(Raster_Scale, EqualsTheModelWherePositionsWrap) {
   Random random(3);

@@ -33,7 +33,8 @@ class Model {
         call_(call),
         stepX_(static_cast<uint32>(65536.0 / call.scaleX)),
         stepY_(static_cast<uint32>(65536.0 / call.scaleY)),
-        smooth_(call.dstDepth > 23 && call.smooth != 0) {}
+        smooth_(call.dstDepth > 23 && call.smooth != 0),
+        slots_(smooth_ ? std::min(((stepY_ + 65535) >> 16) + 1, 32u) : 1) {}
 
   void draw() {
     for (uint32 i = 0; i < height(); ++i) drawRow(i);
@@ -61,9 +62,15 @@ class Model {
       dst_.at(at + byte) = static_cast<uint8>(value >> (8 * byte));
   }
 
-  /// The source row at a signed 16.16 position, resampled.
-  Row fetch(int32 y) const {
+  /// The source row at a signed 16.16 position, as it was when it came into its slot.
+  const Row& fetch(int32 y) {
     const uint32 row = std::min(call_.srcHeight - 1, static_cast<uint32>(std::max(y, 0)) >> 16);
+    Slot& slot = slots_[row % slots_.size()];
+    if (slot.row != row) slot = {row, resample(row)};
+    return slot.pixels;
+  }
+
+  Row resample(uint32 row) const {
     Row out;
     const uint32 xStart = stepX_ * static_cast<uint32>(call_.x1);
     const uint32 xLimit = (call_.srcWidth - 1) << 16;
@@ -134,7 +141,7 @@ class Model {
   }
 
   void drawPlain(uint32 i) {
-    const Row row = fetch(static_cast<int32>(position(i)));
+    const Row& row = fetch(static_cast<int32>(position(i)));
     const bool sameDepth = static_cast<uint32>(call_.srcDepth) == call_.dstDepth;
     if (sameDepth && call_.srcBpp == call_.dstBpp) {
       for (uint32 j = 0; j < width(); ++j) put(i, j, row[j], dstBytes());
@@ -152,8 +159,8 @@ class Model {
   }
 
   void drawMix(uint32 i, uint32 y) {
-    const Row upper = fetch(static_cast<int32>(y));
-    const Row lower = fetch(static_cast<int32>(y + 0x10000));
+    const Row& upper = fetch(static_cast<int32>(y));
+    const Row& lower = fetch(static_cast<int32>(y + 0x10000));
     const uint32 f = y & 0xffff;
     for (uint32 j = 0; j < width(); ++j)
       put(i, j, mixPixels(upper[j], lower[j], (65535 - f) >> 8, f >> 8), dstBytes());
@@ -164,7 +171,7 @@ class Model {
     Row sumGA(width(), 0);
     uint32 rows = 0;
     const auto add = [&](uint32 position, uint32 weight) {
-      const Row row = fetch(static_cast<int32>(position));
+      const Row& row = fetch(static_cast<int32>(position));
       for (uint32 j = 0; j < width(); ++j) {
         const uint32 part = mixPixels(row[j], 0, weight, 0);
         sumBR[j] += part & 0x00ff00ff;
@@ -195,6 +202,11 @@ class Model {
   uint32 stepX_;
   uint32 stepY_;
   bool smooth_;
+  struct Slot {
+    int64 row = -1;
+    Row pixels;
+  };
+  std::vector<Slot> slots_;
 };
 
 std::string text(const char* format, auto... values) {
