@@ -300,7 +300,8 @@ RASTER_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
 RASTER_EXPORT uint32 Raster_ConvertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth,
                                             bool pseudoColor, const uint32* palette);
 
-/// Converts a rectangle of pixels from one frame buffer into another, which must not overlap it.
+/// Converts a rectangle of pixels from one frame buffer into another, which must not overlap it:
+/// what is stored then, in place too, differs between instruction-set levels.
 ///
 /// `srcDepth` (15, 16, 24, 32) and `dstDepth` (3, 6, 8, 15, 16, 24, 32) are format codes. With
 /// `pseudoColor` the source has one byte a pixel, an index into `palette`, and any depth up to 8.
@@ -780,8 +781,10 @@ enum {
 ///
 /// Any other `bppdepth` (looked at first) or format leaves `dst` untouched and logs, the first time
 /// in the process, Log("Raster_YUVtoRGB: bppdepth:%d not supported.\n") or
-/// Log("Raster_YUVtoRGB: format:%u not supported.\n"). Source and destination must not overlap, and
-/// may have any alignment. The size of the source is trusted.
+/// Log("Raster_YUVtoRGB: format:%u not supported.\n"). Source and destination may have any
+/// alignment. They must not overlap: what is stored then differs between instruction-set levels,
+/// but for a packed frame that is converted to 15 or 16 bits in place or to a `dst` before `src`.
+/// The size of the source is trusted.
 RASTER_EXPORT void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height,
                                    uint32 format, int32 bppdepth);
 

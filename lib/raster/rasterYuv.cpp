@@ -118,9 +118,14 @@ struct PlanarRows {
 template <class Rows, class P>
 void convertRows(const Rows& rows, uint8* dst, size_t dstPitch, size_t groups) {
   for (size_t row = 0; row < Rows::kRows; ++row, dst += dstPitch) {
-    for (size_t pixel = 0; pixel < 2 * groups; ++pixel) {
-      const Rgb c = colourOf(rows.luma(pixel, row), rows.cb(pixel / 2), rows.cr(pixel / 2), 128);
-      storePixel<P::kBytes>(dst + pixel * P::kBytes, P::pack(c.r, c.g, c.b));
+    for (size_t group = 0; group < groups; ++group) {
+      const uint8 cb = rows.cb(group), cr = rows.cr(group);
+      const Rgb left = colourOf(rows.luma(2 * group, row), cb, cr, 128);
+      const Rgb right = colourOf(rows.luma(2 * group + 1, row), cb, cr, 128);
+      // A packed frame may be converted in place: the group has been read.
+      uint8* const pixels = dst + 2 * group * P::kBytes;
+      storePixel<P::kBytes>(pixels, P::pack(left.r, left.g, left.b));
+      storePixel<P::kBytes>(pixels + P::kBytes, P::pack(right.r, right.g, right.b));
     }
   }
 }

@@ -101,6 +101,27 @@ TEST(Raster_YUVtoRGB, TakesFramesAtEveryAlignment) {
   }
 }
 
+/// A group of 4 bytes becomes two pixels of 2: every group is read before its pixels are stored.
+TEST(Raster_YUVtoRGB, ConvertsPackedFramesToShortPixelsInPlaceOrFurtherDown) {
+  Random random(4);
+  for (const uint32 format : std::initializer_list<uint32>{RASTER_VIDEO_YUY2, RASTER_VIDEO_UYVY}) {
+    for (const int bppdepth : {15, 16}) {
+      for (uint32 width = 2; width <= 150; width += 2) {
+        for (const size_t down : {size_t{0}, size_t{1}, size_t{4}, size_t{1} + random.below(70)}) {
+          const Bytes frame = random.bytes(frameBytes(width, 2, format));
+          Bytes expected(frame.size());
+          reference::yuvToRgb(frame, expected, width, 2, format, bppdepth);
+          Bytes memory(down + frame.size());
+          std::copy(frame.begin(), frame.end(), memory.begin() + static_cast<ptrdiff_t>(down));
+          Raster_YUVtoRGB(memory.data() + down, memory.data(), width, 2, format, bppdepth);
+          ASSERT_EQ(0, memcmp(memory.data(), expected.data(), expected.size()))
+              << describe(width, 2, format, bppdepth) << " " << down << " bytes further down";
+        }
+      }
+    }
+  }
+}
+
 constexpr uint32 kWheelWidth = 512;
 constexpr uint32 kWheelHeight = 128;
 
