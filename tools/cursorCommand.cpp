@@ -16,8 +16,6 @@
 namespace tool {
 namespace {
 
-constexpr uint32 kLargestCursor = 1024;
-
 struct CursorOptions {
   std::string destination;
   OutputOptions output;
@@ -29,7 +27,7 @@ struct CursorOptions {
 };
 
 void checkSize(const Picture& picture, const std::string& path) {
-  if (picture.width() > kLargestCursor || picture.height() > kLargestCursor)
+  if (!isCursorSize(picture.width(), picture.height()))
     throw Failure("'" + path + "' is too large for a cursor");
 }
 

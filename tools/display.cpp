@@ -11,6 +11,7 @@
 #include <cstdlib>
 
 #include "commands.h"
+#include "cursorImage.h"
 #include "geometry.h"
 #include "progress.h"
 #include "raster.h"
@@ -39,6 +40,9 @@ ReplyPointer<Reply> needReply(xcb_connection_t* connection, Cookie cookie,
   return reply;
 }
 
+/// Whether a reply, whose length is told in words, is long enough for what it says to carry.
+bool carries(uint32 replyLength, uint64 bytes) { return uint64{replyLength} * 4 >= bytes; }
+
 const char* className(uint8 visualClass) {
   static constexpr const char* kNames[] = {"StaticGray",  "GrayScale", "StaticColor",
                                            "PseudoColor", "TrueColor", "DirectColor"};
@@ -60,22 +64,6 @@ bool hasKnownMasks(uint32 depth, const xcb_visualtype_t& visual) {
     default:
       return false;
   }
-}
-
-const xcb_screen_t* screenOfNumber(const xcb_setup_t* setup, int number) {
-  xcb_screen_iterator_t at = xcb_setup_roots_iterator(setup);
-  for (; at.rem != 0 && number != 0; --number) xcb_screen_next(&at);
-  return at.rem != 0 ? at.data : nullptr;
-}
-
-const xcb_visualtype_t* visualOf(const xcb_screen_t* screen) {
-  auto depth = xcb_screen_allowed_depths_iterator(screen);
-  for (; depth.rem != 0; xcb_depth_next(&depth)) {
-    auto visual = xcb_depth_visuals_iterator(depth.data);
-    for (; visual.rem != 0; xcb_visualtype_next(&visual))
-      if (visual.data->visual_id == screen->root_visual) return visual.data;
-  }
-  return nullptr;
 }
 
 /// Rows from the server into a picture, from its row `top` down.
@@ -143,59 +131,63 @@ Display::Display(const std::string& name) : connection(nullptr, xcb_disconnect) 
     throw Failure(shown.empty() ? "no display: give --display or set DISPLAY"
                                 : "cannot connect to the display '" + shown + "'");
   }
-  screen = screenOfNumber(xcb_get_setup(connection.get()), number);
-  if (screen == nullptr) throw Failure("the display has no screen " + std::to_string(number));
+  format = readSetup(xcb_get_setup(connection.get()), number);
   const auto geometry =
-      needReply(connection.get(), xcb_get_geometry(connection.get(), screen->root),
+      needReply(connection.get(), xcb_get_geometry(connection.get(), format.screen->root),
                 xcb_get_geometry_reply, "the size of the screen");
+  if (geometry->width == 0 || geometry->height == 0) throw Failure("the screen has no pixels");
   area = {0, 0, geometry->width, geometry->height};
-  findFormat();
+  checkFormat();
 }
 
 Display::~Display() { sharedMemory.reset(); }
 
-void Display::findFormat() {
+void Display::checkFormat() {
   const xcb_setup_t* setup = xcb_get_setup(connection.get());
-  for (auto format = xcb_setup_pixmap_formats_iterator(setup); format.rem != 0;
-       xcb_format_next(&format)) {
-    if (format.data->depth != screen->root_depth) continue;
-    bitsPerPixel = format.data->bits_per_pixel;
-    scanlinePad = format.data->scanline_pad;
-  }
-  visual = visualOf(screen);
-  const bool isIndexed = screen->root_depth == 8;
-  const bool known = visual != nullptr &&
-                     (isIndexed || hasKnownMasks(screen->root_depth, *visual)) &&
-                     Raster_IsModeReasonable(screen->root_depth, bitsPerPixel, isIndexed) &&
-                     (setup->image_byte_order == XCB_IMAGE_ORDER_LSB_FIRST || bitsPerPixel == 8);
+  const uint32 depth = format.screen->root_depth;
+  const bool isIndexed = depth == 8;
+  const bool knownPad =
+      format.scanlinePad == 8 || format.scanlinePad == 16 || format.scanlinePad == 32;
+  const bool known =
+      format.visual != nullptr && knownPad && (isIndexed || hasKnownMasks(depth, *format.visual)) &&
+      Raster_IsModeReasonable(depth, format.bitsPerPixel, isIndexed) &&
+      (setup->image_byte_order == XCB_IMAGE_ORDER_LSB_FIRST || format.bitsPerPixel == 8);
   if (!known) throw Failure("a screen of this kind is not supported: " + description());
   if (isIndexed) readPalette();
 }
 
+/// The bytes from one row of the server's pixels to the next.
+uint32 Display::rowPitchOf(const Picture& picture) const {
+  const uint32 padBits = format.scanlinePad - 1;
+  return ((picture.width() * format.bitsPerPixel + padBits) & ~padBits) / 8;
+}
+
 std::string Display::description() const {
-  return std::string(visual != nullptr ? className(visual->_class) : "unknown") + ", depth " +
-         std::to_string(screen->root_depth) + " in " + std::to_string(bitsPerPixel) +
-         " bits per pixel";
+  return std::string(format.visual != nullptr ? className(format.visual->_class) : "unknown") +
+         ", depth " + std::to_string(format.screen->root_depth) + " in " +
+         std::to_string(format.bitsPerPixel) + " bits per pixel";
 }
 
 void Display::readPalette() {
   uint32 pixels[256];
   for (uint32 i = 0; i < 256; ++i) pixels[i] = i;
-  const uint32 count = std::min<uint32>(256, visual->colormap_entries);
-  const auto reply = needReply(
-      connection.get(), xcb_query_colors(connection.get(), screen->default_colormap, count, pixels),
-      xcb_query_colors_reply, "the colours of the screen");
+  const uint32 count = std::min<uint32>(256, format.visual->colormap_entries);
+  const auto reply =
+      needReply(connection.get(),
+                xcb_query_colors(connection.get(), format.screen->default_colormap, count, pixels),
+                xcb_query_colors_reply, "the colours of the screen");
   const xcb_rgb_t* colours = xcb_query_colors_colors(reply.get());
-  const int length = xcb_query_colors_colors_length(reply.get());
-  for (int i = 0; i < length; ++i)
+  const uint32 length = reply->colors_len;
+  if (length > count || !carries(reply->length, uint64{length} * sizeof *colours))
+    throw Failure("the display sent other colours than it was asked for");
+  for (uint32 i = 0; i < length; ++i)
     palette[i] = {static_cast<uint8>(colours[i].blue >> 8),
                   static_cast<uint8>(colours[i].green >> 8),
                   static_cast<uint8>(colours[i].red >> 8), 0};
 }
 
 bool Display::captureShared(Picture& picture, const Rect& region) {
-  const uint32 padBits = scanlinePad - 1;
-  const uint32 rowPitch = ((picture.width() * bitsPerPixel + padBits) & ~padBits) / 8;
+  const uint32 rowPitch = rowPitchOf(picture);
   if (!SharedMemory::isOffered(connection.get())) return false;
   sharedMemory.reset();  // one segment at a time, of the size of this region
   sharedMemory =
@@ -203,7 +195,7 @@ bool Display::captureShared(Picture& picture, const Rect& region) {
   if (!sharedMemory->isAttached()) return false;
   const auto reply = replyTo(
       connection.get(),
-      xcb_shm_get_image(connection.get(), screen->root, static_cast<int16>(region.left),
+      xcb_shm_get_image(connection.get(), format.screen->root, static_cast<int16>(region.left),
                         static_cast<int16>(region.top), static_cast<uint16>(picture.width()),
                         static_cast<uint16>(picture.height()), ~0u, XCB_IMAGE_FORMAT_Z_PIXMAP,
                         sharedMemory->id(), 0),
@@ -215,15 +207,14 @@ bool Display::captureShared(Picture& picture, const Rect& region) {
 
 void Display::captureInBands(Picture& picture, const Rect& region) {
   constexpr uint32 kBandBytes = 1 << 20;
-  const uint32 padBits = scanlinePad - 1;
-  const uint32 rowPitch = ((picture.width() * bitsPerPixel + padBits) & ~padBits) / 8;
+  const uint32 rowPitch = rowPitchOf(picture);
   const uint32 bandRows = std::max(1u, kBandBytes / rowPitch);
   Progress progress("rows", picture.height());
   for (uint32 top = 0; top < picture.height(); top += bandRows) {
     const uint32 rows = std::min(bandRows, picture.height() - top);
     const auto reply = needReply(
         connection.get(),
-        xcb_get_image(connection.get(), XCB_IMAGE_FORMAT_Z_PIXMAP, screen->root,
+        xcb_get_image(connection.get(), XCB_IMAGE_FORMAT_Z_PIXMAP, format.screen->root,
                       static_cast<int16>(region.left),
                       static_cast<int16>(region.top + static_cast<int32>(top)),
                       static_cast<uint16>(picture.width()), static_cast<uint16>(rows), ~0u),
@@ -236,9 +227,9 @@ void Display::captureInBands(Picture& picture, const Rect& region) {
 }
 
 Picture Display::capture(const Rect& region) {
-  const uint32 code = Raster_GetBPPDepth(screen->root_depth, bitsPerPixel);
+  const uint32 code = Raster_GetBPPDepth(format.screen->root_depth, format.bitsPerPixel);
   Picture picture(widthOf(region), heightOf(region), code);
-  if (screen->root_depth == 8)
+  if (format.screen->root_depth == 8)
     std::copy(std::begin(palette), std::end(palette), picture.record.palette);
   if (!captureShared(picture, region)) captureInBands(picture, region);
   return picture;
@@ -256,7 +247,10 @@ LiveCursor Display::cursor() {
   const auto reply = needReply(connection.get(), xcb_xfixes_get_cursor_image(connection.get()),
                                xcb_xfixes_get_cursor_image_reply, "the cursor");
   const uint32* pixels = xcb_xfixes_get_cursor_image_cursor_image(reply.get());
-  const int length = xcb_xfixes_get_cursor_image_cursor_image_length(reply.get());
+  const size_t length = size_t{reply->width} * reply->height;
+  if (!isCursorSize(reply->width, reply->height)) throw Failure("the cursor is too large");
+  if (!carries(reply->length, length * sizeof *pixels))
+    throw Failure("the display sent fewer pixels of the cursor than it has");
   return {{reply->x, reply->y},
           {reply->xhot, reply->yhot},
           reply->width,

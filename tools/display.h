@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "displaySetup.h"
 #include "picture.h"
 
 namespace tool {
@@ -42,17 +43,15 @@ class Display {
  private:
   class SharedMemory;
 
-  void findFormat();
+  void checkFormat();
+  uint32 rowPitchOf(const Picture& picture) const;
   void readPalette();
   bool captureShared(Picture& picture, const Rect& region);
   void captureInBands(Picture& picture, const Rect& region);
 
   std::unique_ptr<xcb_connection_t, void (*)(xcb_connection_t*)> connection;
-  const xcb_screen_t* screen = nullptr;
-  const xcb_visualtype_t* visual = nullptr;
+  ScreenSetup format;
   Rect area = {};
-  uint32 bitsPerPixel = 0;
-  uint32 scanlinePad = 0;
   std::unique_ptr<SharedMemory> sharedMemory;
   ImageUtilColor palette[256] = {};
 };
