@@ -2,14 +2,12 @@
 
 #include "outputFile.h"
 
-#include <unistd.h>
-
 #include <algorithm>
-#include <cstring>
 #include <filesystem>
 
 #include "commands.h"
 #include "fileIO.h"
+#include "newFile.h"
 
 namespace tool {
 namespace {
@@ -60,32 +58,6 @@ class File {
   const bool reading;
 };
 
-/// A new file beside its final name. Unless it is kept, it goes when it goes out of scope.
-class TemporaryFile {
- public:
-  explicit TemporaryFile(const fs::path& finalPath)
-      : target(finalPath), path(finalPath.string() + ".part" + std::to_string(getpid())) {}
-  ~TemporaryFile() {
-    std::error_code ignored;
-    if (!kept) fs::remove(path, ignored);
-  }
-  TemporaryFile(const TemporaryFile&) = delete;
-  TemporaryFile& operator=(const TemporaryFile&) = delete;
-
-  const std::string& name() const { return path; }
-  void keep() {
-    std::error_code error;
-    fs::rename(path, target, error);
-    if (error) throw Failure("cannot write '" + target.string() + "': " + error.message());
-    kept = true;
-  }
-
- private:
-  fs::path target;
-  std::string path;
-  bool kept = false;
-};
-
 }  // namespace
 
 void writeFile(const std::string& path, const uint8* bytes, size_t size) {
@@ -95,11 +67,9 @@ void writeFile(const std::string& path, const uint8* bytes, size_t size) {
     File(path, FILEIO_ACCESS_WRITE, FILEIO_OPEN, path).write(bytes, size);
     return;
   }
-  // A link keeps pointing to the file that is replaced.
-  const bool isLink = fs::is_symlink(fs::symlink_status(path, ignored));
-  TemporaryFile temporary(isLink ? fs::weakly_canonical(path, ignored) : fs::path(path));
-  File(temporary.name(), FILEIO_ACCESS_WRITE, FILEIO_OPEN_CREATE_SAFE, path).write(bytes, size);
-  temporary.keep();
+  NewFile file(path);
+  file.write(bytes, size);
+  file.publish();
 }
 
 std::vector<uint8> readFileStart(const std::string& path, size_t size) {

@@ -12,8 +12,8 @@
 
 namespace tool {
 
-/// Writes a file under a temporary name beside `path` and renames it, so that under `path` there is
-/// the whole new file or what was there before. Where `path` is a device or a pipe, writes to it.
+/// Writes a file that appears under `path` all at once (newFile.h), so that there is the whole new
+/// file or what was there before. Where `path` is a device or a pipe, writes to it.
 void writeFile(const std::string& path, const uint8* bytes, size_t size);
 
 /// Reads a part of a file: `size` bytes from its start, or fewer when it is shorter.

@@ -44,6 +44,59 @@ grep -q "cannot write 'kept.png'" err || fail "a full disk: $(cat err)"
 cmp -s a.png kept.png || fail 'a full disk changed the file that was there'
 absent
 
+# By default the signal of that limit ends a program; here it is an error like any other.
+(
+  ulimit -f 1
+  "$TOOL" convert a.png kept.png --compression 0 >out 2>err
+  echo $? >status
+)
+[ "$(cat status)" = 1 ] || fail "a limit on the size of files: exit status $(cat status)"
+cmp -s a.png kept.png || fail 'a limit on the size of files changed the file that was there'
+absent
+
+# The mode of a file stays, a new one follows the umask.
+for mode in 600 640 755 400; do
+  cp a.png old.png
+  chmod "$mode" old.png
+  ok rop a.png old.png --op invert --color 000000
+  [ "$(stat -c %a old.png)" = "$mode" ] || fail "mode $mode became $(stat -c %a old.png)"
+  cmp -s a.png old.png && fail 'the old file is still there'
+  rm -f old.png
+done
+for mask in 022 027 077 000; do
+  (umask "$mask" && ok convert a.png new.png && finish) || failures=$((failures + 1))
+  wanted=$(printf '%o' $((0666 & ~0$mask)))
+  [ "$(stat -c %a new.png)" = "$wanted" ] || fail "umask $mask gives mode $(stat -c %a new.png)"
+  rm -f new.png
+done
+
+# Nobody else's file goes: not even one that is named like a temporary file of this process.
+# shellcheck disable=SC2016
+sh -c 'echo foreign >"new.png.part$$"; exec "$0" convert a.png new.png' "$TOOL" ||
+  fail 'a file beside the new one is in the way'
+[ "$(cat new.png.part*)" = foreign ] || fail "somebody else's file has gone"
+rm -f new.png.part* new.png
+
+# The longest name that a folder takes.
+long=$(printf '%0251d' 0).png
+ok convert a.png "$long"
+ok convert a.png "$long"
+ok compare a.png "$long"
+rm -f "$long"
+
+# A link stays a link, also one that leads to nothing yet.
+mkdir folder
+ln -s later.png folder/second.png
+ln -s folder/second.png first.png
+ok convert a.png first.png
+if [ ! -L first.png ] || [ ! -L folder/second.png ]; then fail 'a dangling link became a file'; fi
+ok compare a.png folder/later.png
+ln -s circle.png circle.png
+refused 1 "cannot write 'circle.png'" convert a.png circle.png
+[ -L circle.png ] || fail 'a link to itself became a file'
+rm -rf folder first.png circle.png
+[ "$(find . -name '.?*' | wc -l)" = 0 ] || fail "left behind: $(find . -name '.?*')"
+
 # A link stays a link; a device is written to and stays a device.
 ln -s a.png link.png
 ok rop a.png link.png --op invert --color 000000
