@@ -21,7 +21,8 @@ int statusOfPanic = kFailure;
 /// One line on standard error, whether or not the text brings its line end.
 void complain(const char* text) {
   const size_t length = strcspn(text, "\n");
-  fprintf(stderr, "rastertool: %.*s\n", static_cast<int>(length), text);
+  // Not to the stream, which may be caught (standardError.h).
+  dprintf(STDERR_FILENO, "rastertool: %.*s\n", static_cast<int>(length), text);
 }
 
 /// Fatal faults of the library, most of all exhausted memory, end the program like any failure.

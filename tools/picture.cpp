@@ -119,6 +119,11 @@ Picture Picture::load(const std::string& path, bool keepAlpha) {
     throw Failure("'" + path + "' is a grey picture; only colour and palette pictures are read");
   if (header.bitDepth == 16)
     throw Failure("'" + path + "' has 16 bits per sample; only 8 and fewer are read");
+  const uint32 samples = header.colourType == kPalette ? 1 : header.colourType == kRgb ? 3 : 4;
+  if (uint64{header.width} * samples > kLargestPicture ||
+      uint64{header.width} * samples * header.height > kLargestPicture)
+    throw Failure("'" + path + "' is too large: " + std::to_string(header.width) + "x" +
+                  std::to_string(header.height) + " pixels");
   Picture picture;
   CaughtStandardError messages;
   const uint8 flags = keepAlpha ? IMAGE_UTIL_READ_KEEP_ALPHA : 0;

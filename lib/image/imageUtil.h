@@ -9,6 +9,9 @@
 //   it cannot read or write go to standard error, as libpng has them.
 // - Pixels that a function hands out come from malloc and belong to the record; release them with
 //   ImageUtil_FreeImageData.
+// - Memory: decoding and cropping allocate with UtilSafeMalloc0 and UtilSafeCalloc0, which end the
+//   process when there is none (for decoding that may be height x bytesPerLine bytes, whatever the
+//   stream really holds: look at its header first). Every other function returns false.
 // - No function keeps state or takes a lock; calls on different records may run on several threads.
 
 #ifndef RASTER_IMAGE_UTIL_H

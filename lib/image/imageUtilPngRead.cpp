@@ -125,12 +125,10 @@ bool readHeader(const Reader& reader) {
   return paddedRowBytes(png_get_rowbytes(reader.png, reader.info), 1, &image->bytesPerLine);
 }
 
-/// Allocates the pixels and the pointers to their rows. The padding of the rows, which libpng does
-/// not write, is zeroed.
+/// Allocates the pixels and the pointers to their rows, and touches none of the pixels: a header of
+/// a few bytes may promise rows that never come.
 bool allocateRows(Reader& reader) {
   ImageUtilImage* image = reader.image;
-  const size_t rowBytes = png_get_rowbytes(reader.png, reader.info);
-  const size_t padding = image->bytesPerLine - rowBytes;
   size_t dataBytes = 0;
   size_t pointerBytes = 0;
   if (!blockBytes(image->height, image->bytesPerLine, &dataBytes) ||
@@ -138,11 +136,20 @@ bool allocateRows(Reader& reader) {
     return false;
   image->data = static_cast<uint8*>(UtilSafeMalloc0(dataBytes));
   reader.rows = static_cast<png_bytep*>(UtilSafeMalloc0(pointerBytes));
-  for (size_t y = 0; y < image->height; ++y) {
-    reader.rows[y] = image->data + y * image->bytesPerLine;
-    memset(reader.rows[y] + rowBytes, 0, padding);
-  }
+  for (size_t y = 0; y < image->height; ++y) reader.rows[y] = image->data + y * image->bytesPerLine;
   return true;
+}
+
+/// Reads the rows, every pass of an interlaced image, and zeroes their padding as they arrive.
+void readRows(const Reader& reader) {
+  const size_t rowBytes = png_get_rowbytes(reader.png, reader.info);
+  const size_t padding = reader.image->bytesPerLine - rowBytes;
+  for (int pass = png_set_interlace_handling(reader.png); pass > 0; --pass) {
+    for (size_t y = 0; y < reader.image->height; ++y) {
+      png_read_row(reader.png, reader.rows[y], nullptr);
+      memset(reader.rows[y] + rowBytes, 0, padding);
+    }
+  }
 }
 
 bool readImage(Reader& reader) {
@@ -150,7 +157,7 @@ bool readImage(Reader& reader) {
   if (!readHeader(reader)) return false;
   png_set_bgr(reader.png);
   if (!allocateRows(reader)) return false;
-  png_read_image(reader.png, reader.rows);
+  readRows(reader);
   png_read_end(reader.png, reader.info);
   return true;
 }

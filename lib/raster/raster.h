@@ -14,6 +14,9 @@
 // - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
 //   the lowest address.
 // - Fatal errors go through Warning and Panic (message.h); Panic does not return.
+// - Memory: only scaling (Raster_Scale, Raster_ScaleAlphaCursor, Raster_ScaleColorCursor),
+//   Raster_Compress and Raster_Decompress allocate, with UtilSafeMalloc0, which ends the process
+//   when there is none.
 // - No function keeps state (but for flags of messages that are logged once) or takes a lock; calls
 //   on disjoint memory may run on several threads.
 

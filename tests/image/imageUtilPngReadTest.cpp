@@ -6,6 +6,8 @@
 #include <gtest/gtest.h>
 
 #include <dlfcn.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstring>
@@ -418,13 +420,10 @@ void putBigEndian(uint8* at, uint32 value) {
   for (int i = 0; i < 4; ++i) at[i] = static_cast<uint8>(value >> (24 - 8 * i));
 }
 
-TEST_F(ImageUtil_ReadPNGBuffer, RefusesSizesThatMemoryCannotAddress) {
-  if (sizeof(size_t) > 4) GTEST_SKIP() << "libpng's own limit is within 64-bit addresses";
-  Random random(10);
-  Bytes png = makePng(noise(random, 3, 3, PNG_COLOR_TYPE_RGB, 8));
-  putBigEndian(&png[16], 1000000);
-  putBigEndian(&png[20], 1000000);
-  putBigEndian(&png[29], static_cast<uint32>(0));
+/// A file whose header promises a picture of another size than it has.
+Bytes promising(uint32 width, uint32 height, Bytes png) {
+  putBigEndian(&png[16], width);
+  putBigEndian(&png[20], height);
   // The checksum of the changed header, bit by bit.
   uint32 crc = 0xFFFFFFFFu;
   for (size_t i = 12; i < 29; ++i) {
@@ -432,7 +431,14 @@ TEST_F(ImageUtil_ReadPNGBuffer, RefusesSizesThatMemoryCannotAddress) {
     for (int bit = 0; bit < 8; ++bit) crc = (crc & 1) != 0 ? crc >> 1 ^ 0xEDB88320u : crc >> 1;
   }
   putBigEndian(&png[29], ~crc);
-  const Decoded decoded(png);
+  return png;
+}
+
+TEST_F(ImageUtil_ReadPNGBuffer, RefusesSizesThatMemoryCannotAddress) {
+  if (sizeof(size_t) > 4) GTEST_SKIP() << "libpng's own limit is within 64-bit addresses";
+  Random random(10);
+  const Decoded decoded(
+      promising(1000000, 1000000, makePng(noise(random, 3, 3, PNG_COLOR_TYPE_RGB, 8))));
   EXPECT_FALSE(decoded.result);
   EXPECT_EQ(decoded.image.width, 1000000u);
   EXPECT_EQ(decoded.image.height, 1000000u);
@@ -531,6 +537,33 @@ bool readsAsFile(const Bytes& bytes) {
   }
   ImageUtil_FreeImageData(&image);
   return read;
+}
+
+/// How much memory a call makes resident, in bytes, measured in a process of its own.
+template <class Call> int64 residentBytesOf(Call call) {
+  const pid_t child = fork();
+  if (child == 0) {
+    call();
+    _exit(0);
+  }
+  int status = 0;
+  rusage used{};
+  EXPECT_EQ(wait4(child, &status, 0, &used), child);
+  EXPECT_EQ(status, 0);
+  return int64{used.ru_maxrss} * 1024;
+}
+
+TEST_F(ImageUtil_ReadPNG, TakesNoMemoryForRowsThatNeverCome) {
+  Random random(18);
+  const Bytes png = makePng(noise(random, 3, 3, PNG_COLOR_TYPE_RGB, 8));
+  const TemporaryFile file(promising(341, 1000000, png));
+  const int64 resident = residentBytesOf([&] {
+    ImageUtilImage image;
+    if (::ImageUtil_ReadPNG(&image, file.path(), 0)) _exit(1);
+    if (image.data == nullptr || image.bytesPerLine != 1024) _exit(2);
+    ImageUtil_FreeImageData(&image);
+  });
+  EXPECT_LT(resident, int64{500} << 20);  // of the 1 GB that the file promises
 }
 
 /// libpng tells its errors on standard error; thousands of them would hide everything else.
