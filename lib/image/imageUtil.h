@@ -238,7 +238,8 @@ RASTER_EXPORT bool ImageUtil_Combine(const ImageUtilImage* images, const int32* 
 ///
 /// False, with `*result` as it was, for a negative `left` or `top`, a far edge that is not beyond
 /// the near one or is beyond the image, a new size of 0, a shape to keep where the crop is empty,
-/// or a result that memory cannot address. An empty crop (`left` at the width with `right` -1) and
+/// rows of 2 GiB and more that would have to be scaled, or a result that memory cannot address. An
+/// empty crop (`left` at the width with `right` -1) and
 /// a new size that truncates to 0 give an empty image and true.
 RASTER_EXPORT bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 left, int32 top,
                                                int32 right, int32 bottom, int32 dstX, int32 dstY,

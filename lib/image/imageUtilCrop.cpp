@@ -99,6 +99,8 @@ bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 left, int32 to
       !raster::resolveSize(crop, newWidth, newHeight, &size))
     return false;
   const uint32 bytesPerPixel = src->bpp / 8;
+  const bool scaled = size.width != crop.width || size.height != crop.height;
+  if (scaled && src->bytesPerLine > INT32_MAX) return false;  // the scaler's pitches have a sign
   if (!raster::paddedRowBytes(size.width, bytesPerPixel, &made.bytesPerLine) ||
       !raster::blockBytes(size.height, made.bytesPerLine, &bytes))
     return false;
@@ -110,7 +112,7 @@ bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 left, int32 to
   made.data = static_cast<uint8*>(UtilSafeMalloc0(bytes));
   uint8* from = raster::rowAt(src->data, raster::pitchOf(src->bytesPerLine),
                               static_cast<uint32>(top), static_cast<uint32>(left), bytesPerPixel);
-  if (size.width != crop.width || size.height != crop.height) {
+  if (scaled) {
     raster::drawScaled(made, *src, from, crop);
   } else {
     raster::drawUnscaled(made, *src, from);

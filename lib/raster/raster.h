@@ -821,7 +821,8 @@ RASTER_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, 
 /// the pixels are looked at.
 ///
 /// Any other `bpp` ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterCompress" and
-/// 114.
+/// 114. So does, with another line, a block whose length would not fit `outSize` and an image of
+/// more pixels than 32 bits (on 32-bit x86, memory) can count.
 RASTER_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width,
                                    uint32 height, uint8** outBlock, uint32* outSize);
 

@@ -291,6 +291,18 @@ constexpr size_t kSpareBytes = 32;
 /// Depths whose pixels are stored as they are, without a look at them.
 constexpr bool isStoredDepth(uint32 bpp) { return bpp == 8 || bpp == 16 || bpp == 24; }
 
+// What the size of a block can tell.
+constexpr uint64 kMostPayloadBytes = UINT32_MAX - sizeof(Header);
+
+/// Whether an image is more than memory, than the counts of its code, or, where it is stored, than
+/// the size of its block can hold. Other depths are refused elsewhere.
+bool isTooLarge(uint64 units, uint32 bpp) {
+  const uint64 bytes = units * (bpp >> 3);
+  if (isStoredDepth(bpp))
+    return bytes > std::min<uint64>(kMostPayloadBytes, SIZE_MAX - kSpareBytes);
+  return bpp == 32 && (units > UINT32_MAX || bytes > SIZE_MAX - kSpareBytes);
+}
+
 /// Writes the payload of a block of 32-bit pixels and returns the number of its code words.
 size_t writePayload(const uint8* src, size_t total, uint8* payload) {
   const EncodedWords code = kernels().encode(src, total, payload);
@@ -312,7 +324,9 @@ void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width, ui
   const uint32 bytesPerPixel = bpp >> 3;
   if (bytesPerPixel == 0) notImplemented({kSource, kBadEncodeDepthLine});
   if (pitch == 0) pitch = width * bytesPerPixel;
-  const size_t total = size_t{height} * pitch / bytesPerPixel;
+  const uint64 units = uint64{height} * pitch / bytesPerPixel;
+  if (isTooLarge(units, bpp)) notImplemented(kSource);
+  const size_t total = static_cast<size_t>(units);
   size_t payloadBytes = total * bytesPerPixel;
   uint8* const block = static_cast<uint8*>(UtilSafeMalloc0(payloadBytes + kSpareBytes));
   *outBlock = block;
@@ -329,6 +343,7 @@ void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, uint32 width, ui
     header.codeWords = static_cast<uint32>(codeWords);
     memcpy(block, &header, sizeof header);
   }
+  if (payloadBytes > kMostPayloadBytes) notImplemented(kSource);
   *outSize = static_cast<uint32>(payloadBytes + sizeof header);
 }
 

@@ -47,7 +47,7 @@ int openFlags(int access, int action) {
   const int flags = kActionFlags[action] | O_CLOEXEC;
   switch (access) {
     case FILEIO_ACCESS_READ:
-      return flags | O_RDONLY;
+      return flags | O_RDONLY | O_NONBLOCK;  // or a pipe that nobody writes to would hang it
     case FILEIO_ACCESS_WRITE:
       return flags | O_WRONLY;
     case FILEIO_ACCESS_READ | FILEIO_ACCESS_WRITE:
@@ -55,6 +55,16 @@ int openFlags(int access, int action) {
     default:
       return -1;
   }
+}
+
+/// What speaks against an open file. What is only read must be able to end: a pipe or a device need
+/// not.
+FileIOResult judge(int descriptor, int access) {
+  struct stat status {};
+  if (fstat(descriptor, &status) != 0) return resultOfErrno(errno);
+  if (S_ISDIR(status.st_mode)) return FILEIO_IS_DIRECTORY;
+  if (access == FILEIO_ACCESS_READ && !S_ISREG(status.st_mode)) return FILEIO_NOT_A_FILE;
+  return FILEIO_SUCCESS;
 }
 
 /// Repeats `transfer(done, count)` until `size` bytes are moved or it gives 0 or an error.
@@ -94,13 +104,13 @@ FileIOResult FileIO_Open(FileIODescriptor* file, const char* path, int access, i
   } while (descriptor == -1 && errno == EINTR);
   if (descriptor == -1) return resultOfErrno(errno);
 
-  struct stat status {};
-  if (fstat(descriptor, &status) == 0 && S_ISDIR(status.st_mode)) {
+  const FileIOResult result = judge(descriptor, access);
+  if (result == FILEIO_SUCCESS) {
+    file->posix = descriptor;
+  } else {
     close(descriptor);
-    return FILEIO_IS_DIRECTORY;
   }
-  file->posix = descriptor;
-  return FILEIO_SUCCESS;
+  return result;
 }
 
 FileIOResult FileIO_Read(const FileIODescriptor* file, void* bytes, size_t size, size_t* actual) {
@@ -153,6 +163,8 @@ const char* FileIO_ErrorEnglish(FileIOResult result) {
       return "End of file reached";
     case FILEIO_BAD_ARGUMENT:
       return "Invalid argument";
+    case FILEIO_NOT_A_FILE:
+      return "Not a regular file";
     default:
       return "Error";
   }

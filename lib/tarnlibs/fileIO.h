@@ -32,7 +32,8 @@ typedef enum FileIOResult {
   FILEIO_FILE_TOO_LARGE = 7,
   FILEIO_READ_ONLY = 8,
   FILEIO_END_OF_FILE = 9,  ///< a read met the end of the file before all bytes were there
-  FILEIO_BAD_ARGUMENT = 10
+  FILEIO_BAD_ARGUMENT = 10,
+  FILEIO_NOT_A_FILE = 11  ///< a pipe, a socket or a device where a regular file is wanted
 } FileIOResult;
 
 /// Access codes of FileIO_Open; they may be combined.
@@ -51,7 +52,9 @@ TARNLIBS_EXPORT void FileIO_Invalidate(FileIODescriptor* file);
 
 /// Opens `path` (a system path, relative to the working folder unless it begins with '/') into
 /// `file`. New files get mode 0666 less the umask. A directory gives FILEIO_IS_DIRECTORY, in
-/// reading too. On failure `file` is left not open.
+/// reading too. For reading alone only regular files are opened, so that neither this call nor a read
+/// waits for anybody: a pipe, a socket or a device gives FILEIO_NOT_A_FILE. On failure `file` is left
+/// not open.
 TARNLIBS_EXPORT FileIOResult FileIO_Open(FileIODescriptor* file, const char* path, int access,
                                          int action);
 

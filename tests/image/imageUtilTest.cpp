@@ -519,6 +519,23 @@ TEST_F(ImageUtil_CropAndScaleImage, CutsPixelByPixelAndZeroesThePadding) {
 }
 
 // Deliberate: the source's pitch is taken to be the result's.
+TEST_F(ImageUtil_CropAndScaleImage, RefusesToScaleRowsOfTwoGibibytes) {
+  uint8 pixels[4] = {1, 2, 3, 4};
+  ImageUtilImage src{};
+  src.width = src.height = 2;
+  src.depth = 24;
+  src.bpp = 32;
+  src.bytesPerLine = 0x80000000;
+  src.data = pixels;
+  ImageUtilImage result{};
+  EXPECT_FALSE(::ImageUtil_CropAndScaleImage(&src, 0, 0, 1, 2, 0, 0, 3, 3, &result));
+  EXPECT_EQ(result.data, nullptr);
+  // Without scaling there is no such limit.
+  EXPECT_TRUE(::ImageUtil_CropAndScaleImage(&src, 0, 0, 1, 1, 0, 0, -1, -1, &result));
+  EXPECT_EQ(0, memcmp(result.data, pixels, 4));
+  ImageUtil_FreeImageData(&result);
+}
+
 TEST_F(ImageUtil_CropAndScaleImage, CopiesAFullWidthAsOneBlock) {
   Random random(12);
   const Picture picture = noise(random, 5, 6, 24, 24, 8);  // a pitch of 24, not 16

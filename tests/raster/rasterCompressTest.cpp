@@ -319,6 +319,27 @@ TEST(Raster_Decompress, ReturnsTheBufferAsAllocatedForAnUnknownDepth) {
     EXPECT_EQ(decompress(codedBlock(4, 1, 16, bpp, {1, 2, 3})), Bytes(16, kUntouched));
 }
 
+TEST(Raster_Compress, PanicsWhereTheSizeOfTheBlockDoesNotFit) {
+  struct Case {
+    uint32 pitch, bpp, width, height;
+  };
+  // A block of 2^32 bytes, one of many more, and more pixels than 32 bits can count.
+  const Case cases[] = {
+      {0xFFFFFFEC, 8, 1, 1},  {0x7FFFFFFF, 16, 1, 0xFFFFFFFF}, {3 << 28, 24, 1, 6},
+      {0, 24, 0x15555555, 4}, {0x10000, 8, 0x10000, 0x10000},  {0x80000000, 32, 1, 9}};
+  for (const Case& c : cases) {
+    lastAllocation = 0;
+    uint8* block = nullptr;
+    uint32 size = 7;
+    const Messages said = tests::messagesOf(
+        [&] { Raster_Compress(nullptr, c.pitch, c.bpp, c.width, c.height, &block, &size); });
+    EXPECT_TRUE(tests::isPanic(said.panic, "NOT_IMPLEMENTED", "lib/raster/rasterCompress"))
+        << said.panic;
+    EXPECT_EQ(lastAllocation, 0u);
+    EXPECT_EQ(size, 7u);
+  }
+}
+
 TEST(Raster_Decompress, PanicsForACodeOfAStoredDepthAtLine187) {
   for (const uint32 bpp : {8u, 16u, 24u}) {
     const Bytes block = codedBlock(4, 1, 4, bpp, {1});

@@ -167,6 +167,17 @@ TEST_F(FileIO, NamesTheReasonOfAFailure) {
   EXPECT_EQ(open(there, FILEIO_ACCESS_READ, FILEIO_OPEN), FILEIO_NO_PERMISSION);
 }
 
+TEST_F(FileIO, OpensNothingButRegularFilesForReading) {
+  ASSERT_EQ(mkfifo(path("pipe").c_str(), 0600), 0);
+  alarm(20);  // ends a test that waits for a writer
+  EXPECT_EQ(Open(path("pipe"), FILEIO_ACCESS_READ, FILEIO_OPEN).result, FILEIO_NOT_A_FILE);
+  alarm(0);
+  EXPECT_EQ(Open("/dev/zero", FILEIO_ACCESS_READ, FILEIO_OPEN).result, FILEIO_NOT_A_FILE);
+  EXPECT_EQ(Open("/dev/null", FILEIO_ACCESS_WRITE, FILEIO_OPEN).result, FILEIO_SUCCESS);
+  fs::create_symlink(make("a", ""), path("link"));
+  EXPECT_EQ(Open(path("link"), FILEIO_ACCESS_READ, FILEIO_OPEN).result, FILEIO_SUCCESS);
+}
+
 TEST_F(FileIO, DoesNotLeakADescriptorForADirectory) {
   const Open before(make("a", ""), FILEIO_ACCESS_READ, FILEIO_OPEN);
   for (int i = 0; i < 10; ++i) Open(path(""), FILEIO_ACCESS_READ, FILEIO_OPEN);
@@ -346,7 +357,7 @@ TEST_F(FileIO, HandlesFilesOverTwoGibibytes) {
 TEST_F(FileIO, HasAnEnglishTextForEveryResult) {
   EXPECT_STREQ(FileIO_ErrorEnglish(FILEIO_SUCCESS), "Success");
   std::vector<std::string> texts;
-  for (int result = FILEIO_SUCCESS; result <= FILEIO_BAD_ARGUMENT; ++result) {
+  for (int result = FILEIO_SUCCESS; result <= FILEIO_NOT_A_FILE; ++result) {
     const std::string text = FileIO_ErrorEnglish(static_cast<FileIOResult>(result));
     EXPECT_NE(text, "");
     EXPECT_EQ(std::count(texts.begin(), texts.end(), text), 0) << text;
