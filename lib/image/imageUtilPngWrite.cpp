@@ -5,6 +5,7 @@
 
 #include "imageUtil.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 
@@ -55,8 +56,10 @@ void writeHeader(const Writer& writer) {
 void writePalette(const Writer& writer) {
   const ImageUtilImage& image = *writer.image;
   png_color colors[PNG_MAX_PALETTE_LENGTH];
-  for (uint32 i = 0; i < image.numColors; ++i)
-    colors[i] = {image.palette[i].red, image.palette[i].green, image.palette[i].blue};
+  std::transform(image.palette, image.palette + image.numColors, colors,
+                 [](const ImageUtilColor& c) {
+                   return png_color{c.red, c.green, c.blue};
+                 });
   png_set_PLTE(writer.png, writer.info, colors, static_cast<int>(image.numColors));
 }
 
