@@ -159,7 +159,7 @@ constexpr size_t stageStep(size_t span) {
 void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel& kernel) {
   uint8* const dst = std::exchange(rect.dst, stage);
   const intptr_t dstStep = rect.dstStep;
-  const auto copyRows = blendStageKernels().copyRows;
+  const auto copyRows = bytes == 4 ? blendStageKernels().copyColors : blendStageKernels().copyRows;
   const size_t span = rect.width * bytes;
   rect.dstStep = static_cast<intptr_t>(stageStep(span));
   if (!kernel.readsBlocks) {

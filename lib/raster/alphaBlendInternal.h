@@ -53,8 +53,11 @@ const FormatKernels& blendKernels32();
 /// The block copies of the staged blends.
 struct StageKernels {
   /// Copies rows that do not overlap.
-  void (*copyRows)(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, size_t bytes,
-                   uint32 rows);
+  using CopyRows = void (*)(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep,
+                            size_t bytes, uint32 rows);
+  CopyRows copyRows;
+  /// Rows of pixels of four bytes: touches byte 3 of none, or of all but the last one of a row.
+  CopyRows copyColors;
 };
 const StageKernels& blendStageKernels();
 

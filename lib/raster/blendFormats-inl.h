@@ -161,34 +161,16 @@ struct WholeBytes {
   template <class Part> static HWY_INLINE Bytes<Lanes> loadSource(const uint8* at, Part part) {
     return {loadPart<4>(Lanes(), at, 0, part)};
   }
-};
-
-/// Pixels of four bytes. The fourth one keeps its value: it is read and written back with the
-/// others of its vector.
-struct Bytes4 : WholeBytes {
-  static constexpr size_t kBytes = 4;
-  static constexpr bool kKeepsBytes = true;
-
-  template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
-    return loadSource(at, part);
-  }
-  template <class P, class Part>
-  static HWY_INLINE void store(P p, Bytes<Lanes> before, uint8* at, Part part) {
-    const Lanes d;
-    const auto colors = hn::Set(d, 0x00FFFFFFu);
-#if HWY_TARGET == HWY_SCALAR
-    const auto pixels = hn::OrAnd(hn::AndNot(colors, before.v), colors, bytesOf(p).v);
-#else
-    const auto pixels = hn::IfVecThenElse(colors, bytesOf(p).v, before.v);
-#endif
-    storePart<kBytes>(d, pixels, at, part);
+  static HWY_INLINE Bytes<Lanes> loadSource(const uint8* at, AllButLastByte /*part*/) {
+    return loadSource(at, WholeBlock());
   }
 };
 
 #if HWY_TARGET == HWY_SCALAR
 
-struct Bytes3 : WholeBytes {
-  static constexpr size_t kBytes = 3;
+/// Pixels of kPixel bytes, of which three are read and written.
+template <size_t kPixel> struct ThreeOf : WholeBytes {
+  static constexpr size_t kBytes = kPixel;
   static constexpr bool kKeepsBytes = false;
 
   static HWY_INLINE Bytes<Lanes> load(const uint8* at, WholeBlock /*part*/) {
@@ -199,8 +181,24 @@ struct Bytes3 : WholeBytes {
     storePixel<3>(at, hn::GetLane(bytesOf(p).v));
   }
 };
+using Bytes3 = ThreeOf<3>;
+using Bytes4 = ThreeOf<4>;
 
 #else
+
+/// Pixels of four bytes, of which the fourth one keeps its value.
+struct Bytes4 : WholeBytes {
+  static constexpr size_t kBytes = 4;
+  static constexpr bool kKeepsBytes = !kMasksColors;
+
+  template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
+    return {loadColors(Lanes(), at, part)};
+  }
+  template <class P, class Before, class Part>
+  static HWY_INLINE void store(P p, Before before, uint8* at, Part part) {
+    storeColors(Lanes(), bytesOf(p).v, before.v, at, part);
+  }
+};
 
 /// Pixels of three bytes. Four of them are the twelve lower bytes of a block of sixteen.
 struct Bytes3 : WholeBytes {

@@ -119,18 +119,26 @@ HWY_NOINLINE void copyBytes(uint8* dst, const uint8* src, size_t bytes) {
            [&](auto d, size_t i) HWY_ATTR { hn::StoreU(hn::LoadU(d, src + i), d, dst + i); });
 }
 
-/// Blends the end of a row, shorter than a block, by way of a whole block of its own.
+/// Blends the end of a row. One that is shorter than a block goes by way of a whole block of its
+/// own.
 template <class Format, auto kOperator, uint32 kFlags>
 HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
+  if constexpr (Format::kKeepsBytes) {
+    if (pixels == kBlock) {
+      blendBlock<Format, kOperator, kFlags>(rect, at, AllButLastByte());
+      return;
+    }
+  }
+  const size_t bytes = pixels * Format::kBytes - (Format::kKeepsBytes ? 1 : 0);
   uint8 source[4 * kBlock] = {};
   uint8 destination[Format::kBytes * kBlock] = {};
   if constexpr ((kInputs<kOperator, kFlags> & kUsesSource) != 0)
     copyBytes(source, at.src, pixels * 4);
   if constexpr (kReadsDestination<Format, kOperator, kFlags>)
-    copyBytes(destination, at.before, pixels * Format::kBytes);
+    copyBytes(destination, at.before, bytes);
   blendBlock<Format, kOperator, kFlags>(rect, {destination, destination, source}, WholeBlock());
-  copyBytes(at.dst, destination, pixels * Format::kBytes);
+  copyBytes(at.dst, destination, bytes);
 }
 
 #else
@@ -144,7 +152,7 @@ template <class Format, auto kOperator, uint32 kFlags> void blendRect(const Blen
   const BlendRect rect = call;  // a local that no store to pixels can change
   Block row{rect.dst, rect.before, rect.src};
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
-  const size_t whole = rect.width / kBlock * kBlock;
+  const size_t whole = (rect.width - (Format::kKeepsBytes ? 1 : 0)) / kBlock * kBlock;
   for (uint32 y = 0; y < rect.height; ++y) {
     for (size_t x = 0; x != whole; x += kBlock)
       blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());

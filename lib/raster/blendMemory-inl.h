@@ -74,6 +74,77 @@ HWY_INLINE void storePart(D d, hn::Vec<D> lanes, uint8* block, FirstPixels part)
 
 #endif
 
+// ---- Pixels of four bytes without the fourth ---------------------------------------------------
+
+/// A whole block whose last byte is not in the rectangle.
+struct AllButLastByte {};
+
+/// Whether loadColors and storeColors leave out byte 3 of every pixel. Where they do not, it takes
+/// part in a load, for a store to write it back; that of a row's last pixel is left out by
+/// AllButLastByte.
+inline constexpr bool kMasksColors = HWY_TARGET == HWY_AVX3;
+
+#if HWY_TARGET == HWY_AVX3
+
+template <class D> HWY_INLINE auto colorMask(D d, WholeBlock /*part*/) {
+  const hn::Repartition<uint8, D> d8;
+  return hn::MaskFromVec(hn::BitCast(d8, hn::Set(d, 0x00FFFFFFu)));
+}
+template <class D> HWY_INLINE auto colorMask(D d, FirstPixels part) {
+  const hn::Repartition<uint8, D> d8;
+  const auto pixels = hn::FirstN(d, part.count);
+  return hn::MaskFromVec(hn::BitCast(d8, hn::IfThenElseZero(pixels, hn::Set(d, 0x00FFFFFFu))));
+}
+
+template <class D, class Part>
+HWY_INLINE hn::Vec<D> loadColors(D d, const uint8* block, Part part) {
+  const hn::Repartition<uint8, D> d8;
+  return inRegister(hn::BitCast(d, hn::MaskedLoad(colorMask(d, part), d8, block)));
+}
+template <class D, class Part>
+HWY_INLINE void storeColors(D d, hn::Vec<D> pixels, hn::Vec<D> /*before*/, uint8* block,
+                            Part part) {
+  const hn::Repartition<uint8, D> d8;
+  hn::BlendedStore(hn::BitCast(d8, pixels), colorMask(d, part), d8, block);
+}
+
+#elif HWY_TARGET != HWY_SCALAR
+
+template <class D> HWY_INLINE hn::Vec<D> loadColors(D d, const uint8* block, WholeBlock part) {
+  return loadPart<4>(d, block, 0, part);
+}
+template <class D>
+HWY_INLINE void storeColors(D d, hn::Vec<D> pixels, hn::Vec<D> before, uint8* block,
+                            WholeBlock part) {
+  storePart<4>(d, hn::IfVecThenElse(hn::Set(d, 0x00FFFFFFu), pixels, before), block, part);
+}
+
+/// Half of a vector in bytes. The second half of a block without its last byte is moved together
+/// with the byte before it.
+template <class D> using HalfOfBytes = hn::Half<hn::Repartition<uint8, D>>;
+template <class D> inline constexpr size_t kSecondHalf = kLanes<HalfOfBytes<D>> - 1;
+
+template <class D>
+HWY_INLINE hn::Vec<D> loadColors(D d, const uint8* block, AllButLastByte /*part*/) {
+  const HalfOfBytes<D> half;
+  const auto second = hn::ShiftRightBytes<1>(half, hn::LoadU(half, block + kSecondHalf<D>));
+  return hn::BitCast(d, hn::Combine(hn::Twice<HalfOfBytes<D>>(), second, hn::LoadU(half, block)));
+}
+template <class D>
+HWY_INLINE void storeColors(D d, hn::Vec<D> pixels, hn::Vec<D> before, uint8* block,
+                            AllButLastByte /*part*/) {
+  const HalfOfBytes<D> half;
+  const hn::Repartition<uint8, D> d8;
+  const auto all = hn::BitCast(d8, hn::IfVecThenElse(hn::Set(d, 0x00FFFFFFu), pixels, before));
+  const auto first = hn::LowerHalf(half, all);
+  const auto second = hn::UpperHalf(half, all);
+  hn::StoreU(first, half, block);
+  hn::StoreU(hn::CombineShiftRightBytes<kSecondHalf<D>>(half, second, first), half,
+             block + kSecondHalf<D>);
+}
+
+#endif
+
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 

@@ -9,7 +9,7 @@
 #include "hwy/highway.h"
 
 #include "alphaBlendInternal.h"
-#include "rows-inl.h"
+#include "blendMemory-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -49,7 +49,49 @@ void copyRows(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, 
     copyRow(to, from, bytes);
 }
 
-constexpr StageKernels kKernels = {copyRows};
+#if HWY_TARGET == HWY_SCALAR
+
+void copyRowOfColors(uint8* to, const uint8* from, size_t pixels) {
+  memcpy(to, from, pixels * 4 - 1);
+}
+
+#elif HWY_TARGET == HWY_AVX3
+
+HWY_INLINE void copyRowOfColors(uint8* to, const uint8* from, size_t pixels) {
+  const hn::ScalableTag<uint32> d;
+  const auto copy = [&](size_t x, auto part) HWY_ATTR {
+    const auto colors = loadColors(d, from + x * 4, part);
+    storeColors(d, colors, colors, to + x * 4, part);
+  };
+  size_t x = 0;
+  for (; pixels - x >= kLanes<decltype(d)>; x += kLanes<decltype(d)>) copy(x, WholeBlock());
+  if (x != pixels) copy(x, FirstPixels{pixels - x});
+}
+
+#else
+
+/// What is left behind whole vectors goes with the bytes before it, in one move.
+HWY_INLINE void copyRowOfColors(uint8* to, const uint8* from, size_t pixels) {
+  const hn::ScalableTag<uint8> d;
+  constexpr size_t kVector = kLanes<decltype(d)>;
+  const size_t bytes = pixels * 4 - 1;
+  if (bytes < kVector) {
+    copyRow(to, from, bytes);
+  } else {
+    copyRow(to, from, bytes / kVector * kVector);
+    hn::StoreU(hn::LoadU(d, from + bytes - kVector), d, to + bytes - kVector);
+  }
+}
+
+#endif
+
+void copyColors(uint8* to, intptr_t toStep, const uint8* from, intptr_t fromStep, size_t bytes,
+                uint32 rows) {
+  for (; rows != 0; --rows, to = nextRow(to, toStep), from = nextRow(from, fromStep))
+    copyRowOfColors(to, from, bytes / 4);
+}
+
+constexpr StageKernels kKernels = {copyRows, copyColors};
 
 }  // namespace
 

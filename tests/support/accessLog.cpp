@@ -23,6 +23,7 @@ struct Watch {
   size_t size = 0;
   std::array<Access, kMostAccesses> accesses;
   size_t count = 0;
+  const std::function<void()>* between = nullptr;
 };
 Watch watch;
 
@@ -45,6 +46,7 @@ void onFault(int /*signal*/, siginfo_t* info, void* context) {
 
 /// Closes the memory again after that instruction.
 void onStep(int /*signal*/, siginfo_t* /*info*/, void* context) {
+  if (*watch.between) (*watch.between)();
   permit(PROT_NONE);
   registersOf(context)[REG_EFL] &= ~static_cast<greg_t>(kTrapFlag);
 }
@@ -71,8 +73,10 @@ WatchedMemory::WatchedMemory(size_t size) {
 
 WatchedMemory::~WatchedMemory() { munmap(data_, mappedSize_); }
 
-std::vector<Access> WatchedMemory::accessesOf(const std::function<void()>& call) {
+std::vector<Access> WatchedMemory::accessesOf(const std::function<void()>& call,
+                                              const std::function<void()>& between) {
   watch.first = data_;
+  watch.between = &between;
   watch.size = mappedSize_;
   watch.count = 0;
   const struct sigaction faults = handled(SIGSEGV, onFault);

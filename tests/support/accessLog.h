@@ -29,8 +29,10 @@ class WatchedMemory {
 
   uint8* data() { return data_; }
 
-  /// Runs `call` and returns what it did to the memory, in order.
-  std::vector<Access> accessesOf(const std::function<void()>& call);
+  /// Runs `call` and returns what it did to the memory, in order. `between` runs after every load
+  /// and store, in a signal handler, and may use the memory: as another thread would.
+  std::vector<Access> accessesOf(const std::function<void()>& call,
+                                 const std::function<void()>& between = nullptr);
 
  private:
   uint8* data_ = nullptr;

@@ -7,7 +7,8 @@
 
 #include <cstdio>
 #include <cstdlib>
-#include <string>
+
+#include "support/level.h"
 
 #ifdef __SANITIZE_ADDRESS__
 // Requests that no memory can meet are part of the tests.
@@ -18,19 +19,11 @@ namespace {
 
 constexpr int kSkipped = 77;
 
-bool machineHas(const std::string& level) {
-  if (level == "ssse3") return __builtin_cpu_supports("ssse3") != 0;
-  if (level == "sse4") return __builtin_cpu_supports("sse4.2") != 0;
-  if (level == "avx2") return __builtin_cpu_supports("avx2") != 0;
-  if (level == "avx3") return __builtin_cpu_supports("avx512bw") != 0;
-  return level == "scalar";
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
   const char* level = getenv("RASTER_CPU_LEVEL");
-  if (level != nullptr && !machineHas(level)) {
+  if (level != nullptr && !tests::machineHas(level)) {
     printf("skipped: this machine has no level \"%s\"\n", level);
     return kSkipped;
   }
