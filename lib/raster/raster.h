@@ -210,6 +210,18 @@ RASTER_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint
                                        int32 height, uint32 foreground, uint32 background);
 
 /// Writes `foreground` where a bit of the plane is set; pixels of clear bits stay.
+///
+/// With AVX-512 (level avx3) and in portable code (scalar) pixels of clear bits are neither read
+/// nor written. The levels between leave out groups of clear bits, counted from the start of a row:
+///
+/// | bytes per pixel | 1          | 2         | 3 and 4   |
+/// |-----------------|------------|-----------|-----------|
+/// | ssse3, sse4     | 64 pixels  | 32 pixels | 16 pixels |
+/// | avx2            | 128 pixels | 64 pixels | 32 pixels |
+///
+/// and in what is left of the row smaller groups, then single pixels. In a group with set and clear
+/// bits all pixels are read and the clear ones written back with their value: no other thread may
+/// store there during the call.
 RASTER_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                               uint32 dstPitch, int32 bytesPerPixel, int32 width,
                                               int32 height, uint32 foreground);

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <climits>
 #include <string>
 
@@ -11,6 +12,7 @@
 #include "reference/rasterBitsReference.h"
 #include "support/byteRange.h"
 #include "support/guardedBuffer.h"
+#include "support/level.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
 
@@ -188,6 +190,75 @@ TEST(Raster_BitsToPixelsStencil, LeavesPixelsOfClearBitsAlone) {
     Bytes expected(size_t{8} * bytesPerPixel, 0x5A);
     expected.resize(size_t{16} * bytesPerPixel, 1);
     EXPECT_EQ(row, expected);
+  }
+}
+
+/// How many pixels a level may reach together: those of clear bits among them are then written
+/// back.
+uint32 pixelsReachedTogether(uint32 bytesPerPixel) {
+  const std::string level = tests::levelInUse();
+  if (level == "scalar" || level == "avx3") return 1;
+  const uint32 vector = level == "avx2" ? 32 : 16;
+  return vector * (4 / bytesPerPixel);
+}
+
+TEST(Raster_BitsToPixelsStencil, TouchesNothingUnderAnEmptyPlane) {
+  for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
+    GuardedBuffer readOnly(size_t{300} * 4 * 3);
+    GuardedBuffer forbidden(readOnly.size());
+    readOnly.forbidWriting();
+    forbidden.forbid();
+    for (uint32 width = 1; width <= 300; width = width < 140 ? width + 1 : width + 53) {
+      const Bytes bits(size_t{(width + 7) / 8} * 3);
+      const Plane p = {(width + 7) / 8,
+                       width * bytesPerPixel,
+                       bytesPerPixel,
+                       static_cast<int32>(width),
+                       3,
+                       0xFFFFFFFF,
+                       0,
+                       true,
+                       width % 2 == 0};
+      p.run(bits.data(), readOnly.data());
+      p.run(bits.data(), forbidden.data());
+    }
+  }
+}
+
+/// Draws `width` pixels onto a buffer that has only those in [first, end), which is where the plane
+/// has bits; compares with the model.
+void expectWithin(Random& random, uint32 bytesPerPixel, uint32 width, uint32 first, uint32 end,
+                  Guard guard) {
+  Bytes bits((width + 7) / 8);
+  for (uint32 x = first; x < end; ++x)
+    if (random.below(2) != 0) bits[x / 8] |= static_cast<uint8>(0x80 >> x % 8);
+  const Bytes before = random.bytes(size_t{end - first} * bytesPerPixel);
+  const uint32 foreground = random.word();
+  Bytes expected = before;
+  for (uint32 x = first; x < end; ++x) {
+    if ((bits[x / 8] >> (7 - x % 8) & 1) == 0) continue;
+    for (uint32 k = 0; k < bytesPerPixel; ++k)
+      expected[size_t{x - first} * bytesPerPixel + k] = static_cast<uint8>(foreground >> (8 * k));
+  }
+  GuardedBuffer dst(before.size(), guard);
+  dst.assign(before);
+  kStencil[bytesPerPixel](bits.data(), 0, tests::moved(dst.data(), -int64{first} * bytesPerPixel),
+                          0, static_cast<int32>(width), 1, foreground);
+  ASSERT_EQ(dst.bytes(), expected)
+      << "bytes " << bytesPerPixel << " width " << width << " bits in " << first << ".." << end;
+}
+
+// A run of bits anywhere, and no memory before it or behind it, as far as the level can do without.
+TEST(Raster_BitsToPixelsStencil, TouchesNothingBesideTheSetBits) {
+  Random random(3);
+  for (int round = 0; round < 6000; ++round) {
+    const uint32 bytesPerPixel = 1 + random.below(4);
+    const uint32 together = pixelsReachedTogether(bytesPerPixel);
+    const uint32 width = 1 + random.below(600);
+    const uint32 first = random.below(width) / together * together;
+    const uint32 end = std::min(width, first + (1 + random.below(9)) * together);
+    expectWithin(random, bytesPerPixel, width, first, end, Guard::kBefore);
+    expectWithin(random, bytesPerPixel, width, first, end, Guard::kAfter);
   }
 }
 

@@ -32,4 +32,8 @@ void GuardedBuffer::forbid() {
   if (mprotect(mapping_, mappedSize_, PROT_NONE) != 0) abort();
 }
 
+void GuardedBuffer::forbidWriting() {
+  if (mprotect(mapping_, mappedSize_, PROT_READ) != 0) abort();
+}
+
 }  // namespace tests

@@ -35,6 +35,8 @@ class GuardedBuffer {
 
   /// Makes every page of the buffer inaccessible: for inputs that must not be read.
   void forbid();
+  /// Makes every page of the buffer read-only: for outputs that must not be written.
+  void forbidWriting();
 
  private:
   void* mapping_ = nullptr;
