@@ -12,6 +12,8 @@
 // - Memory: decoding and cropping allocate with UtilSafeMalloc0 and UtilSafeCalloc0, which end the
 //   process when there is none (for decoding that may be height x bytesPerLine bytes, whatever the
 //   stream really holds: look at its header first). Every other function returns false.
+// - No pointer may be null unless the function says what happens then. Records, pixels, streams and
+//   buffers must not overlap one another.
 // - No function keeps state or takes a lock; calls on different records may run on several threads.
 
 #ifndef RASTER_IMAGE_UTIL_H
@@ -91,6 +93,9 @@ typedef struct ImageUtilBufferWriteCtx {
 
 // ---- Reading -----------------------------------------------------------------------------------
 
+/// \defgroup image_reading Reading
+/// @{
+
 /// Decodes the PNG stream of `size` bytes at `png`. True on success.
 ///
 /// Images with a palette (1, 2, 4 or 8 bits) give depth 8, 8 bpp, one index a byte and `numColors`
@@ -129,7 +134,12 @@ RASTER_EXPORT void ImageUtil_FreeImageData(ImageUtilImage* image);
 /// end of the stream.
 RASTER_EXPORT void ImageUtilReadPngCallback(struct png_struct_def* png, uint8* dest, size_t length);
 
+/// @}
+
 // ---- Encoding ----------------------------------------------------------------------------------
+
+/// \defgroup image_encoding Encoding
+/// @{
 
 /// Encodes an image as PNG into `out`, which is initialised here and is the caller's to destroy.
 ///
@@ -185,7 +195,12 @@ RASTER_EXPORT void ImageUtilDynBufWriteCallback(struct png_struct_def* png, uint
 /// says.
 RASTER_EXPORT bool ImageUtil_ConstructBMPBuffer(const ImageUtilImage* image, DynBuf* out);
 
+/// @}
+
 // ---- Writing to files --------------------------------------------------------------------------
+
+/// \defgroup image_files Writing to files
+/// @{
 
 /// Encodes an image and writes it to a file, which is created or truncated. `imageType` is an
 /// IMAGE_UTIL_TYPE_... (PNG with the default parameters); any other number is fatal:
@@ -204,7 +219,12 @@ RASTER_EXPORT bool ImageUtil_WriteImage(const ImageUtilImage* image, const char*
 RASTER_EXPORT bool ImageUtil_WritePNG(const ImageUtilImage* image, const char* pathName,
                                       const ImageUtilPNGWriteParams* params);
 
+/// @}
+
 // ---- Putting together and cutting --------------------------------------------------------------
+
+/// \defgroup image_combining Putting together and cutting
+/// @{
 
 /// Lays `count` images out into one. `positions` has x and y of each, relative to any origin; the
 /// result is their bounding rectangle, later images over earlier ones. Images without data count
@@ -245,6 +265,8 @@ RASTER_EXPORT bool ImageUtil_CropAndScaleImage(const ImageUtilImage* src, int32 
                                                int32 right, int32 bottom, int32 dstX, int32 dstY,
                                                int32 newWidth, int32 newHeight,
                                                ImageUtilImage* result);
+
+/// @}
 
 #ifdef __cplusplus
 }

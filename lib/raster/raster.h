@@ -34,6 +34,9 @@ extern "C" {
 
 // ---- Fill and copy -----------------------------------------------------------------------------
 
+/// \defgroup raster_fill Fill and copy
+/// @{
+
 /// A switch for Raster_RectCopy, 0 when the library is loaded. The host may set it to non-zero,
 /// before its first copy, on processors with MMX and the non-temporal 64-bit store: copies of at
 /// least 32 bytes by 16 rows then bypass the cache. The pixels are the same either way. The library
@@ -68,23 +71,28 @@ RASTER_EXPORT void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src
 RASTER_EXPORT void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y,
                                         uint32 width, uint32 height);
 
+/// @}
+
 // ---- Raster operations -------------------------------------------------------------------------
 
-// An operation code is a number from 0 to 15, as in the graphics contexts of the X Window System
-// protocol. With S the source and D the destination pixel, D becomes:
-//
-//   0 clear         0             8 nor           NOT (S OR D)
-//   1 and           S AND D       9 equiv         NOT (S XOR D)
-//   2 andReverse    S AND NOT D  10 invert        NOT D
-//   3 copy          S            11 orReverse     S OR NOT D
-//   4 andInverted   NOT S AND D  12 copyInverted  NOT S
-//   5 noop          D            13 orInverted    NOT S OR D
-//   6 xor           S XOR D      14 nand          NOT (S AND D)
-//   7 or            S OR D       15 set           all bits set
-//
-// All bits of a pixel take part, the top byte of a 4-byte pixel included. A code above 15 is not an
-// error: nothing is written, as for noop. Operations that do not depend on the source do not read
-// it, and those that do not depend on the destination do not read that.
+/// \defgroup raster_rops Raster operations
+///
+/// An operation code is a number from 0 to 15, as in the graphics contexts of the X Window System
+/// protocol. With S the source and D the destination pixel, D becomes:
+///
+///     0 clear         0             8 nor           NOT (S OR D)
+///     1 and           S AND D       9 equiv         NOT (S XOR D)
+///     2 andReverse    S AND NOT D  10 invert        NOT D
+///     3 copy          S            11 orReverse     S OR NOT D
+///     4 andInverted   NOT S AND D  12 copyInverted  NOT S
+///     5 noop          D            13 orInverted    NOT S OR D
+///     6 xor           S XOR D      14 nand          NOT (S AND D)
+///     7 or            S OR D       15 set           all bits set
+///
+/// All bits of a pixel take part, the top byte of a 4-byte pixel included. A code above 15 is not
+/// an error: nothing is written, as for noop. Operations that do not depend on the source do not
+/// read it, and those that do not depend on the destination do not read that.
+/// @{
 
 /// The operation codes by name, for parameters called `rop`.
 enum {
@@ -107,7 +115,7 @@ enum {
   RASTER_ROP_COUNT = 16
 };
 
-/// Combines `pixel` with every pixel of a rectangle through operation `rop`.
+/// Combines `pixel` with every pixel of a rectangle through operation `rop` (\ref raster_rops).
 ///
 /// `pitch` is in bytes and may be negative; `bytesPerPixel` is 1, 2, 3 or 4, and the low bytes of
 /// `pixel` are used. Any other size calls Warning("Raster: Unsupported frame buffer depth\n") and
@@ -120,7 +128,7 @@ RASTER_EXPORT void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPix
                                       uint32 rop, uint32 x, uint32 y, uint32 width, uint32 height);
 
 /// Combines a source rectangle with a destination rectangle of the same size through operation
-/// `rop`, within a frame buffer or between two with the same pixel size.
+/// `rop` (\ref raster_rops), within a frame buffer or between two with the same pixel size.
 ///
 /// Pitches are in bytes and may be negative. The rectangles may overlap: rows run from the last one
 /// up when srcY < dstY and from the first one down otherwise; pixels run from right to left when
@@ -142,18 +150,24 @@ RASTER_EXPORT void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* s
                                       uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop,
                                       uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
+/// @}
+
 // ---- Tiling ------------------------------------------------------------------------------------
 
-// A pixmap is a picture with the pixel size of the destination, laid out endlessly to the right and
-// downwards. Its pixel (tileX mod pixmapWidth, tileY mod pixmapHeight) falls on (dstX, dstY). The
-// rectangle is cut into blocks at the pixmap's edges: bands of rows from the top down, each cut
-// into blocks from left to right. Within a block, pixels run top down and from left to right, also
-// where pixmap and rectangle overlap.
-//
-// Deliberate: for 2- and 4-byte pixels the first row of a block is found with the full pitches, and
-// rows after it step by the pitches rounded down to a multiple of the pixel size.
+/// \defgroup raster_tiling Tiling
+///
+/// A pixmap is a picture with the pixel size of the destination, laid out endlessly to the right
+/// and downwards. Its pixel (tileX mod pixmapWidth, tileY mod pixmapHeight) falls on (dstX, dstY).
+/// The rectangle is cut into blocks at the pixmap's edges: bands of rows from the top down, each
+/// cut into blocks from left to right. Within a block, pixels run top down and from left to right,
+/// also where pixmap and rectangle overlap.
+///
+/// Deliberate: for 2- and 4-byte pixels the first row of a block is found with the full pitches,
+/// and rows after it step by the pitches rounded down to a multiple of the pixel size.
+/// @{
 
-/// Fills a rectangle with a repeated pixmap. As Raster_RectPixmapROPcopy with operation 3.
+/// Fills a rectangle with a repeated pixmap, as Raster_RectPixmapROPcopy with operation 3.
+/// \ref raster_tiling says how a pixmap is laid out, which pitches count and what overlap gives.
 RASTER_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
                                          uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
                                          uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
@@ -166,6 +180,7 @@ RASTER_EXPORT void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint
 /// zero, before anything else is looked at. A `bytesPerPixel` other than 1, 2, 3 or 4 calls
 /// Warning("Raster: Unsupported frame buffer depth\n") and then Panic("NOT_IMPLEMENTED %s:%d\n")
 /// with "lib/raster/rasterpix". A width or height of 0 writes nothing.
+/// \ref raster_tiling says how a pixmap is laid out, which pitches count and what overlap gives.
 RASTER_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap,
                                             uint32 pixmapPitch, int32 bytesPerPixel, uint32 tileX,
                                             uint32 tileY, uint32 pixmapWidth, uint32 pixmapHeight,
@@ -176,7 +191,7 @@ RASTER_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const u
 /// at (srcX, srcY) of `src` into the one at (dstX, dstY) of `dst`, without wrapping, always top
 /// down and from left to right. Nothing looks for overlap: where `src` lies in what has been
 /// written already, the new pixels are the source. Operation 3 is such a walk too, not
-/// Raster_RectCopy.
+/// Raster_RectCopy. Rows step as \ref raster_tiling says.
 RASTER_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
                                             uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
                                             uint32 dstX, uint32 dstY, uint32 width, uint32 height);
@@ -190,26 +205,33 @@ RASTER_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, const 
                                              uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
                                              uint32 dstX, uint32 dstY, uint32 width, uint32 height);
 
+/// @}
+
 // ---- Bit planes --------------------------------------------------------------------------------
 
-// A bit plane has one bit a pixel, the most significant bit of a byte first, and starts each row
-// with a whole byte: pixel i of a row is bit 7 - i mod 8 of byte i / 8. Bits beyond the width are
-// ignored, and no byte beyond the last one needed is read. `dst` is the address of the rectangle's
-// first pixel; pitches are in bytes. A width or height that is not positive writes nothing.
-//
-// A plane that lies in the rectangle is looked at once for every four pixels, just before these are
-// written; rows run top down and pixels from left to right.
-//
-// Deliberate: rows step by the full pitch for every pixel size, so that pixels of 2 and 4 bytes may
-// lie at any address; and a `bytesPerPixel` other than 1, 2, 3 or 4 does nothing, without a
-// warning.
+/// \defgroup raster_bits Bit planes
+///
+/// A bit plane has one bit a pixel, the most significant bit of a byte first, and starts each row
+/// with a whole byte: pixel i of a row is bit 7 - i mod 8 of byte i / 8. Bits beyond the width are
+/// ignored, and no byte beyond the last one needed is read. `dst` is the address of the rectangle's
+/// first pixel; pitches are in bytes. A width or height that is not positive writes nothing.
+///
+/// A plane that lies in the rectangle is looked at once for every four pixels, just before these
+/// are written; rows run top down and pixels from left to right.
+///
+/// Deliberate: rows step by the full pitch for every pixel size, so that pixels of 2 and 4 bytes
+/// may lie at any address; and a `bytesPerPixel` other than 1, 2, 3 or 4 does nothing, without a
+/// warning.
+/// @{
 
 /// Writes `foreground` where a bit of the plane is set and `background` where it is clear.
+/// \ref raster_bits says how a plane lies in memory, which sizes do nothing and what overlap gives.
 RASTER_EXPORT void Raster_BitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                        uint32 dstPitch, int32 bytesPerPixel, int32 width,
                                        int32 height, uint32 foreground, uint32 background);
 
 /// Writes `foreground` where a bit of the plane is set; pixels of clear bits stay.
+/// \ref raster_bits says how a plane lies in memory, which sizes do nothing and what overlap gives.
 ///
 /// With AVX-512 (level avx3) and in portable code (scalar) pixels of clear bits are neither read
 /// nor written. The levels between leave out groups of clear bits, counted from the start of a row:
@@ -227,7 +249,7 @@ RASTER_EXPORT void Raster_BitsToPixelsStencil(const uint8* bits, uint32 bitsPitc
                                               int32 height, uint32 foreground);
 
 /// Raster_BitsToPixels for one pixel size (8, 16, 24, 32 bits), of which the low bits of the values
-/// are used.
+/// are used; \ref raster_bits holds for all of these.
 RASTER_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                        uint32 dstPitch, int32 width, int32 height,
                                        uint32 foreground, uint32 background);
@@ -255,24 +277,29 @@ RASTER_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPit
                                                uint32 dstPitch, int32 width, int32 height,
                                                uint32 foreground);
 
+/// @}
+
 // ---- Pixel formats and conversion --------------------------------------------------------------
-//
-// A pixel format is named by one code, the "bppdepth": the colour depth, but 32 for depth 24 stored
-// in 32 bits (Raster_GetBPPDepth).
-//
-//   code  bytes  layout of the value
-//   3     1      eight colours: red in bit 2, green in bit 5, blue in bit 7, other bits 0
-//   6     1      red in bits 5-4, green in bits 3-2, blue in bits 1-0
-//   8     1      red in bits 2-0, green in bits 5-3, blue in bits 7-6 (or an index, see below)
-//   15    2      red in bits 14-10, green in bits 9-5, blue in bits 4-0, bit 15 unused
-//   16    2      red in bits 15-11, green in bits 10-5, blue in bits 4-0
-//   24    3      blue, green, red at increasing addresses: 0x00RRGGBB
-//   32    4      0xAARRGGBB; alpha, or unused
-//
-// A pseudo-colour source holds indices into a palette, an array of 0x00RRGGBB that the caller owns;
-// its length is not checked. No conversion searches a palette: a destination of code 8 is always
-// true colour. Narrowing a channel keeps its top bits, without rounding or dithering; widening
-// repeats the top bits in the new low ones.
+
+/// \defgroup raster_formats Pixel formats and conversion
+///
+/// A pixel format is named by one code, the "bppdepth": the colour depth, but 32 for depth 24
+/// stored in 32 bits (Raster_GetBPPDepth).
+///
+///     code  bytes  layout of the value
+///     3     1      eight colours: red in bit 2, green in bit 5, blue in bit 7, other bits 0
+///     6     1      red in bits 5-4, green in bits 3-2, blue in bits 1-0
+///     8     1      red in bits 2-0, green in bits 5-3, blue in bits 7-6 (or an index, see below)
+///     15    2      red in bits 14-10, green in bits 9-5, blue in bits 4-0, bit 15 unused
+///     16    2      red in bits 15-11, green in bits 10-5, blue in bits 4-0
+///     24    3      blue, green, red at increasing addresses: 0x00RRGGBB
+///     32    4      0xAARRGGBB; alpha, or unused
+///
+/// A pseudo-colour source holds indices into a palette, an array of 0x00RRGGBB that the caller
+/// owns; its length is not checked. No conversion searches a palette: a destination of code 8 is
+/// always true colour. Narrowing a channel keeps its top bits, without rounding or dithering;
+/// widening repeats the top bits in the new low ones.
+/// @{
 
 /// The format codes by name: the bits of red, green and blue, from the top.
 enum {
@@ -296,9 +323,10 @@ RASTER_EXPORT bool Raster_IsModeReasonable(uint32 depth, uint32 bpp, bool pseudo
 /// whatever it is.
 RASTER_EXPORT uint32 Raster_GetBPPDepth(uint32 depth, uint32 bpp);
 
-/// Converts one pixel value. `srcDepth` (15, 16, 24, 32) and `dstDepth` (3, 6, 8, 15, 16, 24, 32)
-/// are format codes; 24 and 32 mean the same value here. With `pseudoColor`, `srcDepth` must be 8
-/// and `pixel`, all 32 bits of it, is an index into `palette`, which is read in no other case.
+/// Converts one pixel value between the formats of \ref raster_formats. `srcDepth` (15, 16, 24, 32)
+/// and `dstDepth` (3, 6, 8, 15, 16, 24, 32) are format codes; 24 and 32 mean the same value here.
+/// With `pseudoColor`, `srcDepth` must be 8 and `pixel`, all 32 bits of it, is an index into
+/// `palette`, which is read in no other case.
 ///
 /// Bits 31-24 are those of the source from 24 or 32 to 24 or 32, and 0 otherwise.
 ///
@@ -361,7 +389,19 @@ RASTER_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src
                                      int32 depth, uint32 srcX, uint32 srcY, uint32 dstX,
                                      uint32 dstY, uint32 width, uint32 height);
 
+/// @}
+
 // ---- Rect lists --------------------------------------------------------------------------------
+
+/// \defgroup raster_lists Rect lists
+///
+/// A sweep over the scanlines where rectangles begin or end rebuilds the whole list: a rectangle of
+/// the result goes on downwards exactly as long as the region has the same horizontal extent there,
+/// touching rectangles are joined, and rectangles are listed by top, then by x. The result has at
+/// most 15 rectangles and fills the rest of the list with zeros. Any list is accepted, not only one
+/// that came from here; the sums x + width and y + height must fit 32 bits, which is not checked. A
+/// list must not be used by two threads at once.
+/// @{
 
 /// One rectangle of a list, by origin and size.
 typedef struct RectListEntry {
@@ -378,18 +418,13 @@ typedef struct RectList {
   RectListEntry rects[RASTER_RECT_LIST_SIZE];
 } RectList;
 
-// A sweep over the scanlines where rectangles begin or end rebuilds the whole list: a rectangle of
-// the result goes on downwards exactly as long as the region has the same horizontal extent there,
-// touching rectangles are joined, and rectangles are listed by top, then by x. The result has at
-// most 15 rectangles and fills the rest of the list with zeros. Any list is accepted, not only one
-// that came from here; the sums x + width and y + height must fit 32 bits, which is not checked. A
-// list must not be used by two threads at once.
-
 /// Sets all 16 entries to zero.
 RASTER_EXPORT void Raster_ClearRectList(RectList* list);
 
 /// Adds a rectangle to the region and returns the area of the whole in pixels (modulo 2^32, as all
-/// areas here). When that takes more than 15 rectangles, the region becomes its bounding box.
+/// areas here). \ref raster_lists says how the region is cut into rectangles, what must fit 32
+/// bits, and that a list is for one thread at a time. When that takes more than 15 rectangles, the
+/// region becomes its bounding box.
 ///
 /// A width or height of 0 (tested first) changes nothing and returns 0; a negative one ends in
 /// Panic("ASSERT %s:%d bugNr=%d\n") with "lib/raster/rasterRect" and 15740. When the first entry is
@@ -402,8 +437,9 @@ RASTER_EXPORT void Raster_ClearRectList(RectList* list);
 /// rebuilt.
 RASTER_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
 
-/// Takes a rectangle out of the region and returns the area that is left. A width or height of 0,
-/// or a list whose first entry is empty by width or by height, changes nothing and returns 0.
+/// Takes a rectangle out of the region and returns the area that is left, cut into rectangles as
+/// \ref raster_lists says. A width or height of 0, or a list whose first entry is empty by width or
+/// by height, changes nothing and returns 0.
 /// When more than 15 rectangles would be left, or when a scanline of 16 spans would have to be
 /// split, the call ends in Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterRect".
 ///
@@ -413,22 +449,29 @@ RASTER_EXPORT uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 widt
 /// of the sweep, and the subtraction takes effect from one to the next of these.
 RASTER_EXPORT uint32 Raster_SubRect(RectList* list, int32 x, int32 y, int32 width, int32 height);
 
+/// @}
+
 // ---- Comparison --------------------------------------------------------------------------------
-//
-// In 4-byte pixels the fourth byte never counts. A broken precondition ends in
-// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterComp", without a warning. Positions and
-// sizes are not checked against the buffers. Memory is only read; pitches are in bytes.
+
+/// \defgroup raster_comparison Comparison
+///
+/// In 4-byte pixels the fourth byte never counts. A broken precondition ends in
+/// Panic("NOT_IMPLEMENTED %s:%d\n") with "lib/raster/rasterComp", without a warning. Positions and
+/// sizes are not checked against the buffers. Memory is only read; pitches are in bytes.
+/// @{
 
 /// Compares the rectangle at (aX, aY) of `a` with the one at (bX, bY) of `b`, row by row from the
 /// top: 0 when they are equal, otherwise a number with memcmp's sign for the first byte that
 /// differs. Both bits per pixel must be the same multiple of 8, whatever the size of the rectangle.
+/// \ref raster_comparison says what a broken precondition does and which bytes never count. The
+/// memory may overlap.
 RASTER_EXPORT int32 Raster_ComparePixels(const void* a, uint32 aPitch, int32 aBpp, const void* b,
                                          uint32 bPitch, int32 bBpp, uint32 aX, uint32 aY, uint32 bX,
                                          uint32 bY, uint32 width, uint32 height);
 
 /// Compares every rectangle of a list at the same position in both buffers: 0, or the first result
-/// of Raster_ComparePixels that is not 0. The bits per pixel are not looked at when the list is
-/// empty.
+/// of Raster_ComparePixels that is not 0, with its conditions (\ref raster_comparison). The bits
+/// per pixel are not looked at when the list is empty.
 ///
 /// Deliberate: the walk ends at the first entry whose height or width is not positive and nowhere
 /// else, so after a full list there must be such an entry in memory.
@@ -441,7 +484,8 @@ RASTER_EXPORT int32 Raster_CompareRects(const void* a, uint32 aPitch, int32 aBpp
 /// 0 makes the byte count; with larger ones the mask's bits say which bits count. All three bits
 /// per pixel must be equal, all three pitches too, `x` and `y` must be 0, and the pitch must be
 /// `width` times the bytes per pixel (bits per pixel / 8, rounded up): rows follow each other
-/// without a gap. These are checked in this order. An image without bytes agrees.
+/// without a gap. These are checked in this order; \ref raster_comparison says what a broken one
+/// does. An image without bytes agrees. The memory may overlap.
 ///
 /// Deliberate: differing bytes are counted, not pixels, against `maxDiffs` times the bytes per
 /// pixel; in 4-byte pixels (25 to 32 bits) the fourth byte is not counted but stands in the limit.
@@ -450,7 +494,12 @@ RASTER_EXPORT bool Raster_CompareMasked(const uint8* a, uint32 aPitch, int32 aBp
                                         uint32 maskPitch, int32 maskBpp, int32 x, int32 y,
                                         uint32 width, uint32 height, int32 maxDiffs);
 
+/// @}
+
 // ---- Alpha blending ----------------------------------------------------------------------------
+
+/// \defgroup raster_blending Alpha blending
+/// @{
 
 /// The operators of Raster_AlphaBlend by name, for its parameter `op`.
 enum {
@@ -547,7 +596,12 @@ RASTER_EXPORT void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, u
                                          uint32 srcPitch, uint32 width, uint32 height, uint32 depth,
                                          uint32 bpp, uint8 staged);
 
+/// @}
+
 // ---- Scaling -----------------------------------------------------------------------------------
+
+/// \defgroup raster_scaling Scaling
+/// @{
 
 /// Always true. Nothing needs to be set up before Raster_Scale.
 RASTER_EXPORT bool Raster_ScaleInit(void);
@@ -632,7 +686,12 @@ RASTER_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, u
 RASTER_EXPORT int32 Raster_ScaleSrcCoordinates(Rect* rect, uint32 width, uint32 height,
                                                double invScaleX, double invScaleY);
 
+/// @}
+
 // ---- Cursors -----------------------------------------------------------------------------------
+
+/// \defgroup raster_cursors Cursors
+/// @{
 
 /// The kinds of cursor: an AND and an XOR plane in the frame buffer's format, or pixels with alpha.
 enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
@@ -753,7 +812,12 @@ RASTER_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const R
                                            uint32 paddedHeight, uint32 scaledWidth,
                                            uint32 scaledHeight);
 
+/// @}
+
 // ---- Video -------------------------------------------------------------------------------------
+
+/// \defgroup raster_video Video
+/// @{
 
 /// How a component is put into a channel: ((component * multiplier) >> shift) & mask.
 typedef struct RasterRGBParam {
@@ -822,7 +886,12 @@ RASTER_EXPORT uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v);
 /// `bits` must be 1 to 32 and `mask` not 0: debug builds assert it.
 RASTER_EXPORT uint32 RasterRGB_MakeRGBParam(RasterRGBParam* param, uint32 bits, uint32 mask);
 
+/// @}
+
 // ---- Compression -------------------------------------------------------------------------------
+
+/// \defgroup raster_compression Compression
+/// @{
 
 /// Packs an image into a new block: five 32-bit words (width, height, pitch in bytes, bits per
 /// pixel, number of code words; in the machine's byte order) and a payload. docs/compression.md has
@@ -858,6 +927,8 @@ RASTER_EXPORT void Raster_Compress(const void* src, uint32 pitch, uint32 bpp, ui
 /// buffer's end.
 RASTER_EXPORT void Raster_Decompress(const uint8* block, uint8** outData, uint32* outPitch,
                                      uint32* outBpp, uint32* outWidth, uint32* outHeight);
+
+/// @}
 
 #ifdef __cplusplus
 }

@@ -32,10 +32,13 @@ typedef struct Point {
 } Point;
 
 // ---- Rectangles --------------------------------------------------------------------------------
-//
-// Where a sum saturates, a + b is formed with wrap-around; when it went the wrong way the largest
-// or the smallest 32-bit number is stored instead, and the call returns false. Outputs may be the
-// same records as inputs. No pointer may be null unless it says so.
+
+/// \defgroup rect_rectangles Rectangles
+///
+/// Where a sum saturates, a + b is formed with wrap-around; when it went the wrong way the largest
+/// or the smallest 32-bit number is stored instead, and the call returns false. Outputs may be the
+/// same records as inputs. No pointer may be null unless it says so.
+/// @{
 
 /// Fills `r` from an origin and a size. True when neither size is negative and neither sum
 /// saturated. A size of 0 is valid. A negative size collapses its side to the origin.
@@ -77,13 +80,18 @@ RASTER_EXPORT bool Rect_ContainsPoint(const Rect* r, const Point* p);
 /// Does nothing.
 RASTER_EXPORT void Rect_Test(void);
 
+/// @}
+
 // ---- Transforms --------------------------------------------------------------------------------
-//
-// A frame of reference is a rectangle. Sums here are exact in 64 bits and then saturate to 32; the
-// functions with a result return false when a field saturated, and store all fields all the same.
-// The size of a rectangle along an axis is 0 when that axis is empty, and at most 0x7FFFFFFF.
-// Outputs may be the same records as inputs. Mind the order of the arguments, which is not the same
-// everywhere.
+
+/// \defgroup rect_transforms Transforms
+///
+/// A frame of reference is a rectangle. Sums here are exact in 64 bits and then saturate to 32; the
+/// functions with a result return false when a field saturated, and store all fields all the same.
+/// The size of a rectangle along an axis is 0 when that axis is empty, and at most 0x7FFFFFFF.
+/// Outputs may be the same records as inputs. Mind the order of the arguments, which is not the
+/// same everywhere.
+/// @{
 
 /// Moves every edge of `r` by the difference of that edge of `to` and `from`:
 /// out = r + to - from. Edges move independently, so a difference in size carries over.
@@ -118,6 +126,8 @@ RASTER_EXPORT void Rect_ScalePoint(const Rect* from, const Rect* to, const Point
 /// Returns the distance of `p` from `r` along the axis where it is larger: positive outside, 0 on
 /// the outermost pixels, negative inside. Differences saturate as the sums of Rect_Translate do.
 RASTER_EXPORT int32 Rect_PointDistance(const Rect* r, const Point* p);
+
+/// @}
 
 #ifdef __cplusplus
 }
