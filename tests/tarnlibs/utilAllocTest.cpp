@@ -10,6 +10,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <thread>
 
 #include "support/recordedMessages.h"
 
@@ -65,6 +66,74 @@ TEST(UtilSafeCalloc0, PanicsWhenMemoryIsExhaustedOrTheProductOverflows) {
   // The product is 2 modulo the address size.
   EXPECT_EQ(tests::messagesOf([] { UtilSafeCalloc0(2, overHalf); }).panic,
             "Out of memory: 2 x " + std::to_string(overHalf) + " bytes\n");
+}
+
+/// What an attempt went through, in memory that the longjmp leaves alone.
+struct Steps {
+  int begun = 0;
+  int ended = 0;
+  bool inner = true;
+};
+
+void takeTooMuch(void* context) {
+  auto* steps = static_cast<Steps*>(context);
+  ++steps->begun;
+  UtilSafeMalloc0(tooMuch);
+  ++steps->ended;
+}
+
+TEST(UtilSafeAttempt, IsTrueForABodyThatReturns) {
+  Steps steps;
+  EXPECT_TRUE(
+      UtilSafeAttempt([](void* context) { ++static_cast<Steps*>(context)->ended; }, &steps));
+  EXPECT_EQ(steps.ended, 1);
+}
+
+TEST(UtilSafeAttempt, EndsInsteadOfAPanicWhereMemoryIsExhausted) {
+  Steps steps;
+  bool done = true;
+  const tests::Messages said =
+      tests::messagesOf([&] { done = UtilSafeAttempt(takeTooMuch, &steps); });
+  EXPECT_FALSE(done);
+  EXPECT_EQ(said.panic, "");
+  EXPECT_EQ(said.warning, "");
+  EXPECT_EQ(steps.begun, 1);
+  EXPECT_EQ(steps.ended, 0);
+  EXPECT_FALSE(UtilSafeAttempt([](void*) { UtilSafeCalloc0(2, overHalf); }, nullptr));
+}
+
+TEST(UtilSafeAttempt, IsOverWhenItEnds) {
+  Steps steps;
+  EXPECT_TRUE(UtilSafeAttempt([](void*) {}, nullptr));
+  EXPECT_NE(tests::messagesOf([] { UtilSafeMalloc0(tooMuch); }).panic, "");
+  EXPECT_FALSE(UtilSafeAttempt(takeTooMuch, &steps));
+  EXPECT_NE(tests::messagesOf([] { UtilSafeMalloc0(tooMuch); }).panic, "");
+}
+
+TEST(UtilSafeAttempt, EndsTheInnermostOneOnly) {
+  Steps steps;
+  EXPECT_TRUE(UtilSafeAttempt(
+      [](void* context) {
+        auto* outer = static_cast<Steps*>(context);
+        outer->inner = UtilSafeAttempt(takeTooMuch, context);
+        ++outer->ended;
+      },
+      &steps));
+  EXPECT_FALSE(steps.inner);
+  EXPECT_EQ(steps.ended, 1);
+}
+
+TEST(UtilSafeAttempt, IsOfItsThreadAlone) {
+  bool inThread = true;
+  EXPECT_TRUE(UtilSafeAttempt(
+      [](void* context) {
+        std::thread([context] {
+          Steps steps;
+          *static_cast<bool*>(context) = UtilSafeAttempt(takeTooMuch, &steps);
+        }).join();
+      },
+      &inThread));
+  EXPECT_FALSE(inThread);
 }
 
 }  // namespace
