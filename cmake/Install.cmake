@@ -1,12 +1,12 @@
 # What `cmake --install` puts where: libraries, public headers, pkg-config files, CMake package.
 include(CMakePackageConfigHelpers)
 
-install(TARGETS raster tarnlibs EXPORT rasterTargets
+install(TARGETS raster raster-checked tarnlibs EXPORT rasterTargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
 install(FILES
   lib/raster/raster.h lib/raster/rasterExport.h ${RASTER_GENERATED_HEADERS}/rasterVersion.h
-  lib/rect/rect.h lib/image/imageUtil.h
+  lib/rect/rect.h lib/image/imageUtil.h lib/checked/rasterChecked.h
   lib/tarnlibs/baseTypes.h lib/tarnlibs/message.h lib/tarnlibs/utilAlloc.h
   lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h
   DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/raster)
@@ -36,7 +36,7 @@ foreach(folder IN ITEMS LIBDIR INCLUDEDIR)
     set(RASTER_PC_${folder} "\${prefix}/${CMAKE_INSTALL_${folder}}")
   endif()
 endforeach()
-foreach(package raster tarnlibs)
+foreach(package raster raster-checked tarnlibs)
   configure_file(${CMAKE_CURRENT_LIST_DIR}/${package}.pc.in ${PROJECT_BINARY_DIR}/${package}.pc @ONLY)
   install(FILES ${PROJECT_BINARY_DIR}/${package}.pc
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

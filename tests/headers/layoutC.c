@@ -7,6 +7,7 @@
 
 #include "imageUtil.h"
 #include "raster.h"
+#include "rasterChecked.h"
 
 #define PTR sizeof(void*)
 #define AT(record, field, offset) \
@@ -151,3 +152,25 @@ IS(RASTER_FORMAT_555, 15);
 IS(RASTER_FORMAT_565, 16);
 IS(RASTER_FORMAT_888, 24);
 IS(RASTER_FORMAT_8888, 32);
+AT(RasterView, data, 0);
+AT(RasterView, bytes, PTR);
+AT(RasterView, pitch, 2 * PTR);
+AT(RasterView, width, 2 * PTR + 4);
+AT(RasterView, height, 2 * PTR + 8);
+AT(RasterView, depth, 2 * PTR + 12);
+AT(RasterView, bpp, 2 * PTR + 16);
+SIZE(RasterView, PTR == 4 ? 28 : 40);
+
+AT(RasterLimits, width, 0);
+AT(RasterLimits, height, 4);
+AT(RasterLimits, pixelBytes, 8);
+AT(RasterLimits, inputBytes, 16);
+AT(RasterLimits, chunkBytes, 24);
+AT(RasterLimits, chunks, 28);
+SIZE(RasterLimits, 32);
+
+SIZE(RasterStatus, 4);
+SIZE(RasterBlend, 20);
+SIZE(RasterScaledCursor, 28);
+SIZE(RasterBlockInfo, 20);
+SIZE(RasterPngInfo, 12);
