@@ -10,10 +10,8 @@ namespace raster::checked {
 namespace {
 
 constexpr uint32 kPaletteSize = 256;
-constexpr uint32 kLastOperator = 13;
-constexpr uint32 kSaturate = 13;
-constexpr uint32 kApplyDstAlpha = 2;
-constexpr RasterBlend kOver = {3, 0, 0, 0, 0};
+constexpr uint32 kBlendFlags = RASTER_BLEND_USE_SRC_ALPHA | RASTER_BLEND_USE_DST_ALPHA;
+constexpr RasterBlend kOver = {RASTER_BLEND_OVER, 0, 0, 0, 0};
 
 /// Whether the converter knows the pair. One-byte colour is converted to, but only copied from.
 bool converts(const RasterView& dst, const RasterView& src, bool fromPalette) {
@@ -22,9 +20,10 @@ bool converts(const RasterView& dst, const RasterView& src, bool fromPalette) {
 }
 
 bool isBlend(const RasterBlend& blend) {
-  return blend.op <= kLastOperator && blend.flags <= 3 && blend.srcAlpha <= 255 &&
-         blend.dstAlpha <= 255 && blend.staged <= 1 &&
-         !(blend.op == kSaturate && (blend.flags & kApplyDstAlpha) != 0 && blend.dstAlpha == 0);
+  return blend.op < RASTER_BLEND_COUNT && (blend.flags & ~kBlendFlags) == 0 &&
+         blend.srcAlpha <= 255 && blend.dstAlpha <= 255 && blend.staged <= 1 &&
+         !(blend.op == RASTER_BLEND_SATURATE &&
+           (blend.flags & uint32{RASTER_BLEND_USE_DST_ALPHA}) != 0 && blend.dstAlpha == 0);
 }
 
 /// The comparison itself, of valid views.

@@ -5,7 +5,6 @@
 #include "checkedView.h"
 
 using raster::checked::Area;
-using raster::checked::kMaxRop;
 
 namespace raster::checked {
 namespace {
@@ -55,7 +54,7 @@ RasterStatus RasterChecked_FillAlpha(const RasterView* dst, const Rect* rect, ui
 
 RasterStatus RasterChecked_RopFill(const RasterView* dst, const Rect* rect, uint32 pixel,
                                    uint32 rop, uint32 flags) {
-  if (rop > kMaxRop) return RASTER_STATUS_BAD_ARGUMENT;
+  if (rop >= RASTER_ROP_COUNT) return RASTER_STATUS_BAD_ARGUMENT;
   Area area;
   const RasterStatus status = raster::checked::placeIn(dst, rect, flags, &area);
   if (status != RASTER_STATUS_OK || area.isEmpty()) return status;
@@ -76,7 +75,7 @@ RasterStatus RasterChecked_Copy(const RasterView* dst, const Rect* rect, const R
 
 RasterStatus RasterChecked_RopCopy(const RasterView* dst, const Rect* rect, const RasterView* src,
                                    int32 srcX, int32 srcY, uint32 rop, uint32 flags) {
-  if (rop > kMaxRop) return RASTER_STATUS_BAD_ARGUMENT;
+  if (rop >= RASTER_ROP_COUNT) return RASTER_STATUS_BAD_ARGUMENT;
   Area area;
   const RasterStatus status = raster::checked::placeCopy(dst, rect, src, srcX, srcY, flags, &area);
   if (status != RASTER_STATUS_OK || area.isEmpty()) return status;
@@ -89,7 +88,7 @@ RasterStatus RasterChecked_RopCopy(const RasterView* dst, const Rect* rect, cons
 RasterStatus RasterChecked_Tile(const RasterView* dst, const Rect* rect, const RasterView* pixmap,
                                 int32 tileX, int32 tileY, uint32 rop, uint32 flags) {
   using raster::checked::phase;
-  if (rop > kMaxRop) return RASTER_STATUS_BAD_ARGUMENT;
+  if (rop >= RASTER_ROP_COUNT) return RASTER_STATUS_BAD_ARGUMENT;
   Area area;
   RasterStatus status = raster::checked::checkPixels(pixmap);
   if (status == RASTER_STATUS_OK) status = raster::checked::placeIn(dst, rect, flags, &area);

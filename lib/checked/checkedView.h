@@ -12,8 +12,6 @@
 
 namespace raster::checked {
 
-inline constexpr uint32 kMaxRop = 15;
-
 /// The limits that a function was given, or the defaults.
 RasterLimits limitsOf(const RasterLimits* given);
 

@@ -7,10 +7,6 @@
 namespace raster::checked {
 namespace {
 
-constexpr uint32 kYuy2 = 0x32595559;
-constexpr uint32 kUyvy = 0x59565955;
-constexpr uint32 kYv12 = 0x32315659;
-
 uint64 halfUp(uint32 n) { return uint64{n} / 2 + n % 2; }
 
 }  // namespace
@@ -24,11 +20,11 @@ RasterStatus RasterChecked_YuvBytes(uint32 format, uint32 width, uint32 height, 
   if (bytes == nullptr) return RASTER_STATUS_NULL;
   if (width > kMaxSize || height > kMaxSize) return RASTER_STATUS_TOO_BIG;
   switch (format) {
-    case kYuy2:
-    case kUyvy:
+    case RASTER_VIDEO_YUY2:
+    case RASTER_VIDEO_UYVY:
       *bytes = uint64{width} * height / 2 * 4;
       return RASTER_STATUS_OK;
-    case kYv12:
+    case RASTER_VIDEO_YV12:
       *bytes = 6 * halfUp(width) * halfUp(height);
       return RASTER_STATUS_OK;
     default:

@@ -27,6 +27,7 @@
 #include "baseTypes.h"
 #include "imageUtil.h"
 #include "raster.h"
+#include "rasterExport.h"
 #include "rect.h"
 
 #ifdef __cplusplus
@@ -63,7 +64,7 @@ typedef enum RasterStatus {
 
 /// A short English text for a status, without a line end; "unknown status" for other numbers. The
 /// text is constant.
-TARNLIBS_EXPORT const char* RasterChecked_Text(RasterStatus status);
+RASTER_EXPORT const char* RasterChecked_Text(RasterStatus status);
 
 // ---- Limits ------------------------------------------------------------------------------------
 
@@ -79,7 +80,7 @@ typedef struct RasterLimits {
 } RasterLimits;
 
 /// Stores the default limits. A null pointer does nothing.
-TARNLIBS_EXPORT void RasterChecked_DefaultLimits(RasterLimits* limits);
+RASTER_EXPORT void RasterChecked_DefaultLimits(RasterLimits* limits);
 
 // ---- Views -------------------------------------------------------------------------------------
 
@@ -103,13 +104,13 @@ typedef struct RasterView {
 
 /// Whether a view is valid: OK, NULL, BAD_FORMAT or BAD_VIEW. Every function that takes a view
 /// makes this check itself.
-TARNLIBS_EXPORT RasterStatus RasterChecked_View(const RasterView* view);
+RASTER_EXPORT RasterStatus RasterChecked_View(const RasterView* view);
 
 /// Describes the pixels of an image whose `data` holds `bytes` bytes. Images of 8 bpp have the
 /// depth 8 (or 3 or 6). The flag IMAGE_FLAG_BOTTOM_UP is not looked at: row 0 is the first row in
 /// memory.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ImageView(const ImageUtilImage* image, size_t bytes,
-                                                     RasterView* view);
+RASTER_EXPORT RasterStatus RasterChecked_ImageView(const ImageUtilImage* image, size_t bytes,
+                                                   RasterView* view);
 
 /// In `flags` of the functions that draw or compare: what lies outside is left out.
 enum { RASTER_CHECKED_CLIP = 1 };
@@ -117,48 +118,50 @@ enum { RASTER_CHECKED_CLIP = 1 };
 // ---- Rectangles --------------------------------------------------------------------------------
 
 /// Raster_RectFill: stores `pixel` in every pixel of a rectangle.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Fill(const RasterView* dst, const Rect* rect,
-                                                uint32 pixel, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Fill(const RasterView* dst, const Rect* rect, uint32 pixel,
+                                              uint32 flags);
 
 /// Raster_RectFillAlpha: sets the fourth byte of every pixel of a rectangle. 24/32 only.
-TARNLIBS_EXPORT RasterStatus RasterChecked_FillAlpha(const RasterView* dst, const Rect* rect,
-                                                     uint8 alpha, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_FillAlpha(const RasterView* dst, const Rect* rect,
+                                                   uint8 alpha, uint32 flags);
 
-/// Raster_RectROPfill: combines `pixel` with a rectangle through operation `rop`, 0 to 15.
-TARNLIBS_EXPORT RasterStatus RasterChecked_RopFill(const RasterView* dst, const Rect* rect,
-                                                   uint32 pixel, uint32 rop, uint32 flags);
+/// Raster_RectROPfill: combines `pixel` with a rectangle through operation `rop`, one of
+/// RASTER_ROP_....
+RASTER_EXPORT RasterStatus RasterChecked_RopFill(const RasterView* dst, const Rect* rect,
+                                                 uint32 pixel, uint32 rop, uint32 flags);
 
 /// Raster_RectCopy: copies the rectangle at (srcX, srcY) of `src` to `rect` of `dst`. Both have the
 /// same bpp. Where source and destination overlap in memory, both views must have the same `data`
 /// and pitch.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Copy(const RasterView* dst, const Rect* rect,
-                                                const RasterView* src, int32 srcX, int32 srcY,
-                                                uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Copy(const RasterView* dst, const Rect* rect,
+                                              const RasterView* src, int32 srcX, int32 srcY,
+                                              uint32 flags);
 
-/// Raster_RectROPcopy: as RasterChecked_Copy through operation `rop`, 0 to 15.
-TARNLIBS_EXPORT RasterStatus RasterChecked_RopCopy(const RasterView* dst, const Rect* rect,
-                                                   const RasterView* src, int32 srcX, int32 srcY,
-                                                   uint32 rop, uint32 flags);
+/// Raster_RectROPcopy: as RasterChecked_Copy through operation `rop`, one of
+/// RASTER_ROP_....
+RASTER_EXPORT RasterStatus RasterChecked_RopCopy(const RasterView* dst, const Rect* rect,
+                                                 const RasterView* src, int32 srcX, int32 srcY,
+                                                 uint32 rop, uint32 flags);
 
 /// Raster_RectPixmapROPcopy: combines a pixmap, repeated endlessly, with a rectangle through
-/// operation `rop`, 0 to 15 (3 copies). Pixel (tileX mod width, tileY mod height) of the pixmap
+/// operation `rop`, one of RASTER_ROP_.... Pixel (tileX mod width, tileY mod height) of the pixmap
 /// falls on the top left of `rect`, clipped or not. Both have the same bpp; the pixmap has at least
 /// one pixel. `tileX` and `tileY` may be negative. The pixmap must not overlap the rectangle.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Tile(const RasterView* dst, const Rect* rect,
-                                                const RasterView* pixmap, int32 tileX, int32 tileY,
-                                                uint32 rop, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Tile(const RasterView* dst, const Rect* rect,
+                                              const RasterView* pixmap, int32 tileX, int32 tileY,
+                                              uint32 rop, uint32 flags);
 
 /// Raster_BitsToPixels: writes `foreground` where a bit of `plane` (a view of 1/1) is set and
 /// `background` where it is clear. (srcX, srcY) of the plane falls on the top left of `rect`. The
 /// plane must not overlap the rectangle.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Bits(const RasterView* dst, const Rect* rect,
-                                                const RasterView* plane, int32 srcX, int32 srcY,
-                                                uint32 foreground, uint32 background, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Bits(const RasterView* dst, const Rect* rect,
+                                              const RasterView* plane, int32 srcX, int32 srcY,
+                                              uint32 foreground, uint32 background, uint32 flags);
 
 /// Raster_BitsToPixelsStencil: as RasterChecked_Bits; pixels of clear bits stay.
-TARNLIBS_EXPORT RasterStatus RasterChecked_BitsStencil(const RasterView* dst, const Rect* rect,
-                                                       const RasterView* plane, int32 srcX,
-                                                       int32 srcY, uint32 foreground, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_BitsStencil(const RasterView* dst, const Rect* rect,
+                                                     const RasterView* plane, int32 srcX,
+                                                     int32 srcY, uint32 foreground, uint32 flags);
 
 /// Raster_ConvertPixels: converts the rectangle at (srcX, srcY) of `src` to the format of `dst`,
 /// which must not overlap it.
@@ -166,26 +169,26 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_BitsStencil(const RasterView* dst, co
 /// With a null `palette` the source is true colour: 15/16, 16/16, 24/24, 24/32, or the format of
 /// the destination. Otherwise it has 8 bpp and `colors` is the length of the palette, whose entries
 /// are 0xAARRGGBB; pixels beyond it are 0 (transparent black).
-TARNLIBS_EXPORT RasterStatus RasterChecked_Convert(const RasterView* dst, const Rect* rect,
-                                                   const RasterView* src, int32 srcX, int32 srcY,
-                                                   const uint32* palette, uint32 colors,
-                                                   uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Convert(const RasterView* dst, const Rect* rect,
+                                                 const RasterView* src, int32 srcX, int32 srcY,
+                                                 const uint32* palette, uint32 colors,
+                                                 uint32 flags);
 
 /// How RasterChecked_Blend composites; the fields are those arguments of Raster_AlphaBlend.
 typedef struct RasterBlend {
-  uint32 op;        ///< the operator, 0 to 13
-  uint32 flags;     ///< bit 0: apply srcAlpha; bit 1: apply dstAlpha; no others
+  uint32 op;        ///< the operator, one of RASTER_BLEND_...
+  uint32 flags;     ///< RASTER_BLEND_USE_...; no other bits
   uint32 srcAlpha;  ///< 0 to 255
-  uint32 dstAlpha;  ///< 0 to 255; not 0 for operator 13 with bit 1
+  uint32 dstAlpha;  ///< 0 to 255; used, it is not 0 for RASTER_BLEND_SATURATE
   uint32 staged;    ///< 0 or 1
 } RasterBlend;
 
 /// Raster_AlphaBlend: composites the rectangle at (srcX, srcY) of `src`, a view of 24/32 with alpha
 /// in byte 3, onto `rect` of `dst`, which may have any format but 3/8 and 1/1. A null `blend`
 /// stands for Over without constant alphas (Raster_AlphaBlendOver).
-TARNLIBS_EXPORT RasterStatus RasterChecked_Blend(const RasterView* dst, const Rect* rect,
-                                                 const RasterView* src, int32 srcX, int32 srcY,
-                                                 const RasterBlend* blend, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Blend(const RasterView* dst, const Rect* rect,
+                                               const RasterView* src, int32 srcX, int32 srcY,
+                                               const RasterBlend* blend, uint32 flags);
 
 /// Raster_Scale: draws `rect` of the picture that is `src` enlarged by `scaleX` and `scaleY`
 /// (destination pixels per source pixel; finite, above 1/32767); (0, 0) of that picture is (0, 0)
@@ -193,30 +196,30 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_Blend(const RasterView* dst, const Re
 ///
 /// Both formats are equal and one of 8/8, 16/16, 24/24 and 24/32, or they are 24/32 onto 16/16 or
 /// 24/24. Sizes are below 32768. The views must not overlap.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Scale(const RasterView* dst, const Rect* rect,
-                                                 const RasterView* src, double scaleX,
-                                                 double scaleY, uint32 smooth, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_Scale(const RasterView* dst, const Rect* rect,
+                                               const RasterView* src, double scaleX, double scaleY,
+                                               uint32 smooth, uint32 flags);
 
 // ---- Comparison --------------------------------------------------------------------------------
 
 /// Raster_ComparePixels: compares `rect` of `a` with the rectangle at (bX, bY) of `b`, of the same
 /// bpp. `*difference` becomes 0 when they are equal, otherwise negative or positive as for memcmp.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Compare(const RasterView* a, const Rect* rect,
-                                                   const RasterView* b, int32 bX, int32 bY,
-                                                   uint32 flags, int32* difference);
+RASTER_EXPORT RasterStatus RasterChecked_Compare(const RasterView* a, const Rect* rect,
+                                                 const RasterView* b, int32 bX, int32 bY,
+                                                 uint32 flags, int32* difference);
 
 /// Raster_CompareRects: compares every rectangle of a list at the same place in both views. At most
 /// the 16 entries of the list are looked at.
-TARNLIBS_EXPORT RasterStatus RasterChecked_CompareRects(const RasterView* a, const RasterView* b,
-                                                        const RectList* list, uint32 flags,
-                                                        int32* difference);
+RASTER_EXPORT RasterStatus RasterChecked_CompareRects(const RasterView* a, const RasterView* b,
+                                                      const RectList* list, uint32 flags,
+                                                      int32* difference);
 
 /// Raster_CompareMasked: whether two images agree under a mask but for `maxDiffs` pixels' worth of
 /// bytes (not negative). The three views have the same size, format and pitch, and no gaps between
 /// rows.
-TARNLIBS_EXPORT RasterStatus RasterChecked_CompareMasked(const RasterView* a, const RasterView* b,
-                                                         const RasterView* mask, int32 maxDiffs,
-                                                         bool* agree);
+RASTER_EXPORT RasterStatus RasterChecked_CompareMasked(const RasterView* a, const RasterView* b,
+                                                       const RasterView* mask, int32 maxDiffs,
+                                                       bool* agree);
 
 // ---- Rect lists --------------------------------------------------------------------------------
 
@@ -228,13 +231,13 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_CompareMasked(const RasterView* a, co
 /// Raster_AddRect: adds a rectangle to the region of a list. A region of more than 15 rectangles
 /// becomes its bounding box. Sizes must not be negative; with one of 0 the list stays as it is.
 /// `area` (may be null) receives the number of pixels, modulo 2^32; 0 where a size is 0.
-TARNLIBS_EXPORT RasterStatus RasterChecked_AddRect(RectList* list, int32 x, int32 y, int32 width,
-                                                   int32 height, uint32* area);
+RASTER_EXPORT RasterStatus RasterChecked_AddRect(RectList* list, int32 x, int32 y, int32 width,
+                                                 int32 height, uint32* area);
 
 /// Raster_SubRect: takes a rectangle out of the region of a list. TOO_BIG where more than 15
 /// rectangles would be left; the list is as it was then. Otherwise as RasterChecked_AddRect.
-TARNLIBS_EXPORT RasterStatus RasterChecked_SubRect(RectList* list, int32 x, int32 y, int32 width,
-                                                   int32 height, uint32* area);
+RASTER_EXPORT RasterStatus RasterChecked_SubRect(RectList* list, int32 x, int32 y, int32 width,
+                                                 int32 height, uint32* area);
 
 // ---- Cursors -----------------------------------------------------------------------------------
 
@@ -242,12 +245,11 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_SubRect(RectList* list, int32 x, int3
 /// `dst`, expanded from bits (depth 1) or copied (depth `bitsPerPixel`: 8, 16, 24 or 32). Rows are
 /// padded to 4 bytes; each plane has at least Raster_CalculateCursorSize(width, height, depth)
 /// bytes, and `dst` twice that of `bitsPerPixel`. `dst` must not overlap the planes.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ExpandCursor(uint32 width, uint32 height,
-                                                        uint32 andDepth, const uint8* andBits,
-                                                        size_t andBytes, uint32 xorDepth,
-                                                        const uint8* xorBits, size_t xorBytes,
-                                                        uint32 bitsPerPixel, uint8* dst,
-                                                        size_t dstBytes);
+RASTER_EXPORT RasterStatus RasterChecked_ExpandCursor(uint32 width, uint32 height, uint32 andDepth,
+                                                      const uint8* andBits, size_t andBytes,
+                                                      uint32 xorDepth, const uint8* xorBits,
+                                                      size_t xorBytes, uint32 bitsPerPixel,
+                                                      uint8* dst, size_t dstBytes);
 
 /// Raster_ComputeCursorBox and Raster_DrawCursor: draws a cursor with its hot spot at (x, y),
 /// clipped to `fb`. Every plane of the cursor has `planeBytes` bytes or more; a mask cursor has the
@@ -257,9 +259,9 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_ExpandCursor(uint32 width, uint32 hei
 /// visible of the cursor is drawn over a copy of its area at the top left of `save`, which must be
 /// large enough and must not overlap `fb`. `box` (may be null) receives the visible part, all zero
 /// where nothing is visible; nothing is drawn then.
-TARNLIBS_EXPORT RasterStatus RasterChecked_DrawCursor(const RasterView* fb, const RasterView* save,
-                                                      const RasterCursor* cursor, size_t planeBytes,
-                                                      int32 x, int32 y, RasterCursorBox* box);
+RASTER_EXPORT RasterStatus RasterChecked_DrawCursor(const RasterView* fb, const RasterView* save,
+                                                    const RasterCursor* cursor, size_t planeBytes,
+                                                    int32 x, int32 y, RasterCursorBox* box);
 
 /// The sizes of a scaled cursor, as Raster_GetScaledCursorSize gives them.
 typedef struct RasterScaledCursor {
@@ -275,35 +277,34 @@ typedef struct RasterScaledCursor {
 /// Raster_GetScaledCursorSize for a cursor of `width` x `height` pixels with hot spot (hotX, hotY).
 /// The factors are finite and above 1/32767; every size of the result is below 32768, otherwise the
 /// status is TOO_BIG. `limits` hold for the scaled planes.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ScaledCursorSize(uint32 width, uint32 height, int32 hotX,
-                                                            int32 hotY, double scaleX,
-                                                            double scaleY,
-                                                            const RasterLimits* limits,
-                                                            RasterScaledCursor* scaled);
+RASTER_EXPORT RasterStatus RasterChecked_ScaledCursorSize(uint32 width, uint32 height, int32 hotX,
+                                                          int32 hotY, double scaleX, double scaleY,
+                                                          const RasterLimits* limits,
+                                                          RasterScaledCursor* scaled);
 
 /// Raster_ScaleAlphaCursor and Raster_ScaleColorCursor, by the cursor's type: scales its planes,
 /// which have 4-byte pixels and `planeBytes` bytes or more each, into `dst` of `dstBytes` bytes.
 /// A cursor with alpha gives one plane of the size that RasterChecked_ScaledCursorSize tells, a
 /// mask cursor the AND plane and the XOR plane right behind it. `dst` must not overlap the planes.
 /// `scaled` (may be null) receives the sizes.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ScaleCursor(const RasterCursor* cursor,
-                                                       size_t planeBytes, double scaleX,
-                                                       double scaleY, const RasterLimits* limits,
-                                                       uint8* dst, size_t dstBytes,
-                                                       RasterScaledCursor* scaled);
+RASTER_EXPORT RasterStatus RasterChecked_ScaleCursor(const RasterCursor* cursor, size_t planeBytes,
+                                                     double scaleX, double scaleY,
+                                                     const RasterLimits* limits, uint8* dst,
+                                                     size_t dstBytes, RasterScaledCursor* scaled);
 
 // ---- Video -------------------------------------------------------------------------------------
 
 /// The bytes of a frame as Raster_YUVtoRGB reads them: for "YUY2" and "UYVY" 4 x (width x height /
-/// 2), for "YV12" the three planes. `format` is the four-character code; others are BAD_FORMAT.
-TARNLIBS_EXPORT RasterStatus RasterChecked_YuvBytes(uint32 format, uint32 width, uint32 height,
-                                                    uint64* bytes);
+/// 2), for "YV12" the three planes. `format` is one of RASTER_VIDEO_...;
+/// others are BAD_FORMAT.
+RASTER_EXPORT RasterStatus RasterChecked_YuvBytes(uint32 format, uint32 width, uint32 height,
+                                                  uint64* bytes);
 
 /// Raster_YUVtoRGB: converts a frame of the size of `dst`, with at least RasterChecked_YuvBytes
 /// bytes, into `dst`: 15/16, 16/16, 24/24 or 24/32, without gaps between rows. The frame must not
 /// overlap it.
-TARNLIBS_EXPORT RasterStatus RasterChecked_YuvToRgb(const RasterView* dst, const uint8* frame,
-                                                    size_t frameBytes, uint32 format);
+RASTER_EXPORT RasterStatus RasterChecked_YuvToRgb(const RasterView* dst, const uint8* frame,
+                                                  size_t frameBytes, uint32 format);
 
 // ---- Compressed blocks -------------------------------------------------------------------------
 
@@ -319,23 +320,22 @@ typedef struct RasterBlockInfo {
 /// Reads the header of a block of Raster_Compress, without allocation. OK means that the header
 /// describes rows that a view can have, keeps the limits and is followed by as many bytes as it
 /// says; a code is not walked. DAMAGED for other headers, TRUNCATED for fewer bytes.
-TARNLIBS_EXPORT RasterStatus RasterChecked_BlockInfo(const uint8* block, size_t size,
-                                                     const RasterLimits* limits,
-                                                     RasterBlockInfo* info);
+RASTER_EXPORT RasterStatus RasterChecked_BlockInfo(const uint8* block, size_t size,
+                                                   const RasterLimits* limits,
+                                                   RasterBlockInfo* info);
 
 /// Raster_Decompress: unpacks a block into a new buffer of `pixels->bytes` = height x pitch bytes,
 /// which the caller releases with free(pixels->data); the other fields describe it, with the depth
 /// 8, 16 or 24. Blocks without a code, too, give their pixels. A code must make exactly the pixels
 /// of the header: fewer or more are RASTER_STATUS_DAMAGED. Bytes after the block do not count.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Decompress(const uint8* block, size_t size,
-                                                      const RasterLimits* limits,
-                                                      RasterView* pixels);
+RASTER_EXPORT RasterStatus RasterChecked_Decompress(const uint8* block, size_t size,
+                                                    const RasterLimits* limits, RasterView* pixels);
 
 /// Raster_Compress: packs a view of 8 to 32 bpp into a new block, which the caller releases with
 /// free. `bytes` of the view must reach to the end of the last row's gap, since gaps are packed as
 /// well. Blocks of 4 GiB and more are TOO_BIG.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Compress(const RasterView* view, uint8** block,
-                                                    size_t* size);
+RASTER_EXPORT RasterStatus RasterChecked_Compress(const RasterView* view, uint8** block,
+                                                  size_t* size);
 
 // ---- PNG ---------------------------------------------------------------------------------------
 
@@ -353,8 +353,8 @@ enum { RASTER_CHECKED_PNG_INFO_BYTES = 33 };
 
 /// Reads the header of a PNG stream without allocation: NOT_PNG, TRUNCATED (fewer than 33 bytes),
 /// DAMAGED (a header that no picture has, or its checksum is wrong), or OK. No limits are applied.
-TARNLIBS_EXPORT RasterStatus RasterChecked_PngInfo(const uint8* png, size_t size,
-                                                   RasterPngInfo* info);
+RASTER_EXPORT RasterStatus RasterChecked_PngInfo(const uint8* png, size_t size,
+                                                 RasterPngInfo* info);
 
 /// In `flags` of the functions that read PNG. Other bits are refused.
 enum {
@@ -375,25 +375,24 @@ enum {
 ///
 /// `message` (may be null) receives libpng's words about a stream that it refuses, cut to
 /// `messageBytes` with the ending zero, or an empty text; also when the result is not OK.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ReadPngBuffer(const uint8* png, size_t size,
-                                                         uint32 flags, const RasterLimits* limits,
-                                                         ImageUtilImage* image, char* message,
-                                                         size_t messageBytes);
+RASTER_EXPORT RasterStatus RasterChecked_ReadPngBuffer(const uint8* png, size_t size, uint32 flags,
+                                                       const RasterLimits* limits,
+                                                       ImageUtilImage* image, char* message,
+                                                       size_t messageBytes);
 
 /// Reads a file as RasterChecked_ReadFile and decodes it as RasterChecked_ReadPngBuffer does.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ReadPng(const char* path, uint32 flags,
-                                                   const RasterLimits* limits,
-                                                   ImageUtilImage* image, char* message,
-                                                   size_t messageBytes);
+RASTER_EXPORT RasterStatus RasterChecked_ReadPng(const char* path, uint32 flags,
+                                                 const RasterLimits* limits, ImageUtilImage* image,
+                                                 char* message, size_t messageBytes);
 
 /// ImageUtil_ConstructPNGBuffer: encodes an image whose `data` holds `bytes` bytes as PNG, the same
 /// bytes, into a new block that the caller releases with free. Images have 8 bpp and 1 to 256
 /// colours, or 15/16, 16/16, 24/24 or 24/32. A null `params` stands for the defaults. Pixels beyond
 /// the palette are BAD_ARGUMENT; pictures without pixels, too, and those with a side of more than
 /// 1,000,000 are TOO_BIG.
-TARNLIBS_EXPORT RasterStatus RasterChecked_EncodePng(const ImageUtilImage* image, size_t bytes,
-                                                     const ImageUtilPNGWriteParams* params,
-                                                     uint8** file, size_t* fileBytes);
+RASTER_EXPORT RasterStatus RasterChecked_EncodePng(const ImageUtilImage* image, size_t bytes,
+                                                   const ImageUtilPNGWriteParams* params,
+                                                   uint8** file, size_t* fileBytes);
 
 // ---- Images ------------------------------------------------------------------------------------
 
@@ -401,17 +400,17 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_EncodePng(const ImageUtilImage* image
 /// releases with free. Images as for RasterChecked_EncodePng, but pictures without pixels and
 /// palettes without colours are written as well. Files of 4 GiB and more are TOO_BIG. The padding
 /// of rows is zero where `bytes` or `bytesPerLine` do not reach that far.
-TARNLIBS_EXPORT RasterStatus RasterChecked_EncodeBmp(const ImageUtilImage* image, size_t bytes,
-                                                     uint8** file, size_t* fileBytes);
+RASTER_EXPORT RasterStatus RasterChecked_EncodeBmp(const ImageUtilImage* image, size_t bytes,
+                                                   uint8** file, size_t* fileBytes);
 
 /// ImageUtil_Combine: lays `count` images out into a new one. `bytes[i]` is what the data of image
 /// i holds; images without data count for the size. All have the format of the first; those of 8
 /// bpp must neither overlap nor leave gaps. `limits` hold for the result. `*result` may be one of
 /// `images`, and is overwritten, not released.
-TARNLIBS_EXPORT RasterStatus RasterChecked_Combine(const ImageUtilImage* images,
-                                                   const size_t* bytes, const int32* positions,
-                                                   uint32 count, const RasterLimits* limits,
-                                                   ImageUtilImage* result);
+RASTER_EXPORT RasterStatus RasterChecked_Combine(const ImageUtilImage* images, const size_t* bytes,
+                                                 const int32* positions, uint32 count,
+                                                 const RasterLimits* limits,
+                                                 ImageUtilImage* result);
 
 /// ImageUtil_CropAndScaleImage: cuts [left, right) x [top, bottom) out of an image and scales it to
 /// `newWidth` x `newHeight`; -1 for these four stands for the image's size and the crop's shape.
@@ -419,11 +418,11 @@ TARNLIBS_EXPORT RasterStatus RasterChecked_Combine(const ImageUtilImage* images,
 /// that is not positive or rounds to 0, BAD_FORMAT where pixels cannot be scaled. Unlike there, the
 /// padding of the rows is always zero. `limits` hold for the result, which is overwritten, not
 /// released.
-TARNLIBS_EXPORT RasterStatus RasterChecked_CropAndScale(const ImageUtilImage* image, size_t bytes,
-                                                        int32 left, int32 top, int32 right,
-                                                        int32 bottom, int32 newWidth,
-                                                        int32 newHeight, const RasterLimits* limits,
-                                                        ImageUtilImage* result);
+RASTER_EXPORT RasterStatus RasterChecked_CropAndScale(const ImageUtilImage* image, size_t bytes,
+                                                      int32 left, int32 top, int32 right,
+                                                      int32 bottom, int32 newWidth, int32 newHeight,
+                                                      const RasterLimits* limits,
+                                                      ImageUtilImage* result);
 
 // ---- Files -------------------------------------------------------------------------------------
 
@@ -436,23 +435,23 @@ enum {
 /// Reads a plain file into a new block that the caller releases with free (also for no bytes).
 /// LIMIT for more than `limits->inputBytes`, NOT_REGULAR for anything but a plain file; a pipe
 /// without a writer is not waited for.
-TARNLIBS_EXPORT RasterStatus RasterChecked_ReadFile(const char* path, const RasterLimits* limits,
-                                                    uint8** bytes, size_t* size);
+RASTER_EXPORT RasterStatus RasterChecked_ReadFile(const char* path, const RasterLimits* limits,
+                                                  uint8** bytes, size_t* size);
 
 /// Writes a file, all or nothing: a new one of mode 0666 less the umask, or in place of one that is
 /// there, whose mode is kept. Readers see the old or the new bytes, never some of both. Links are
 /// followed. On failure the file is as it was, and nothing else is left in its folder. Anything but
 /// a plain file is not replaced (NOT_REGULAR).
-TARNLIBS_EXPORT RasterStatus RasterChecked_WriteFile(const char* path, const uint8* bytes,
-                                                     size_t size, uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_WriteFile(const char* path, const uint8* bytes,
+                                                   size_t size, uint32 flags);
 
 /// ImageUtil_WriteImage and ImageUtil_WritePNG: encodes an image as RasterChecked_EncodePng (with
 /// `params`, may be null) or RasterChecked_EncodeBmp does, by the IMAGE_UTIL_TYPE_..., and writes
 /// it as RasterChecked_WriteFile does.
-TARNLIBS_EXPORT RasterStatus RasterChecked_WriteImage(const ImageUtilImage* image, size_t bytes,
-                                                      const char* path, uint32 imageType,
-                                                      const ImageUtilPNGWriteParams* params,
-                                                      uint32 flags);
+RASTER_EXPORT RasterStatus RasterChecked_WriteImage(const ImageUtilImage* image, size_t bytes,
+                                                    const char* path, uint32 imageType,
+                                                    const ImageUtilPNGWriteParams* params,
+                                                    uint32 flags);
 
 // NOLINTEND(modernize-use-using)
 

@@ -259,10 +259,13 @@ TEST_F(RasterCheckedMemory, Cursors) {
   RasterCursor mask = {};
   mask.type = RASTER_CURSOR_MASK;
   mask.width = mask.height = 32;
-  mask.image.mask = {24, 32, first.view().data, second.view().data};
+  mask.depth = 24;
+  mask.bpp = 32;
+  mask.andMask = first.view().data;
+  mask.xorMask = second.view().data;
   RasterCursor alpha = mask;
   alpha.type = RASTER_CURSOR_ALPHA;
-  alpha.image.pixels = first.view().data;
+  alpha.pixels = first.view().data;
   Bytes dst(size_t{2} * 4 * 300 * 300, 5);
   const Bytes before = dst;
   for (const RasterCursor* cursor : {&mask, &alpha}) {

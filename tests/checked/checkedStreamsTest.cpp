@@ -226,9 +226,9 @@ TEST(RasterChecked_BlockInfo, RefusesHeadersOfNoPicture) {
 
 // ---- Video -------------------------------------------------------------------------------------
 
-constexpr uint32 kYuy2 = 0x32595559;
-constexpr uint32 kUyvy = 0x59565955;
-constexpr uint32 kYv12 = 0x32315659;
+constexpr uint32 kYuy2 = RASTER_VIDEO_YUY2;
+constexpr uint32 kUyvy = RASTER_VIDEO_UYVY;
+constexpr uint32 kYv12 = RASTER_VIDEO_YV12;
 
 /// The bytes of a frame by its description.
 size_t naiveFrame(uint32 format, size_t width, size_t height) {
