@@ -46,9 +46,10 @@ inline constexpr CpuLevel kCpuLevels[] = {
 
 constexpr size_t kCpuLevelCount = sizeof kCpuLevels / sizeof *kCpuLevels;
 
-/// The level that the environment asks for, or null when it asks for none.
+/// The level that the environment asks for, or null when it asks for none. A program that runs with
+/// more rights than its user does not ask the user.
 inline const char* wantedCpuLevel() {
-  const char* name = getenv("RASTER_CPU_LEVEL");
+  const char* name = secure_getenv("RASTER_CPU_LEVEL");
   return name != nullptr && *name != '\0' ? name : nullptr;
 }
 

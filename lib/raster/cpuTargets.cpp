@@ -3,8 +3,11 @@
 // Which instruction-set level the vector code runs at (cpuLevel.h). That is decided when the first
 // vector function of a module runs; a name that no level has is told once.
 //
-// This takes the place of Highway's run-time library, of which the dispatch needs two functions.
+// This takes the place of Highway's run-time library, of which the dispatch needs two functions and
+// its assertions, in builds that have them, a third one.
 
+#include <cstdarg>
+#include <cstdio>
 #include <iterator>
 
 #include "cpuLevel.h"
@@ -12,6 +15,7 @@
 #include "hwySetup.h"
 #include "hwy/highway.h"
 #include "message.h"
+#include "panicOrTrap.h"
 
 namespace {
 
@@ -43,6 +47,16 @@ int64_t SupportedTargets() {
   int64_t targets = 0;
   for (size_t i = 0; i <= best; ++i) targets |= kTargets[i];
   return targets;
+}
+
+void Abort(const char* file, int line, const char* format, ...) {
+  char text[256];
+  va_list arguments;
+  va_start(arguments, format);
+  // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): a false alarm, it was started
+  vsnprintf(text, sizeof text, format, arguments);
+  va_end(arguments);
+  tarnlibs::panicOrTrap("Highway %s:%d: %s\n", file, line, text);
 }
 
 }  // namespace hwy

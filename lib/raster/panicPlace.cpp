@@ -3,15 +3,18 @@
 #include "panicPlace.h"
 
 #include "message.h"
+#include "panicOrTrap.h"
 
 namespace raster {
 
-void notImplemented(Place at) { Panic("NOT_IMPLEMENTED %s:%d\n", at.source, at.line); }
+void notImplemented(Place at) {
+  tarnlibs::panicOrTrap("NOT_IMPLEMENTED %s:%d\n", at.source, at.line);
+}
 
-void notReached(Place at) { Panic("NOT_REACHED %s:%d\n", at.source, at.line); }
+void notReached(Place at) { tarnlibs::panicOrTrap("NOT_REACHED %s:%d\n", at.source, at.line); }
 
 void assertFailed(Place at, int bugNr) {
-  Panic("ASSERT %s:%d bugNr=%d\n", at.source, at.line, bugNr);
+  tarnlibs::panicOrTrap("ASSERT %s:%d bugNr=%d\n", at.source, at.line, bugNr);
 }
 
 void unsupportedPixelSize(Place at) {

@@ -7,7 +7,7 @@
 #include <csetjmp>
 #include <cstdlib>
 
-#include "message.h"
+#include "panicOrTrap.h"
 
 namespace {
 
@@ -27,7 +27,7 @@ void* UtilSafeMalloc0(size_t size) {
   void* block = malloc(size != 0 ? size : 1);
   if (block == nullptr) {
     giveUpAttempt();
-    Panic("Out of memory: %zu bytes\n", size);
+    tarnlibs::panicOrTrap("Out of memory: %zu bytes\n", size);
   }
   return block;
 }
@@ -37,7 +37,7 @@ void* UtilSafeCalloc0(size_t count, size_t size) {
   void* block = empty ? calloc(1, 1) : calloc(count, size);
   if (block == nullptr) {
     giveUpAttempt();
-    Panic("Out of memory: %zu x %zu bytes\n", count, size);
+    tarnlibs::panicOrTrap("Out of memory: %zu x %zu bytes\n", count, size);
   }
   return block;
 }
