@@ -9,6 +9,7 @@
 #include "drawing.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "names.h"
 #include "numbers.h"
 #include "picture.h"
 #include "raster.h"
@@ -16,10 +17,21 @@
 namespace tool {
 namespace {
 
-/// By number.
-constexpr const char* kOperatorNames[RASTER_BLEND_COUNT] = {
-    "clear", "source",     "destination", "over",        "overReverse", "in",  "inReverse",
-    "out",   "outReverse", "atop",        "atopReverse", "xor",         "add", "saturate"};
+/// By number: our own name, and others in use.
+constexpr const char* kOperatorNames[RASTER_BLEND_COUNT] = {"clear",
+                                                            "source src copy",
+                                                            "destination dst",
+                                                            "over sourceOver srcOver",
+                                                            "overReverse destinationOver dstOver",
+                                                            "in sourceIn srcIn",
+                                                            "inReverse destinationIn dstIn",
+                                                            "out sourceOut srcOut",
+                                                            "outReverse destinationOut dstOut",
+                                                            "atop sourceAtop srcAtop",
+                                                            "atopReverse destinationAtop dstAtop",
+                                                            "xor",
+                                                            "add plus lighter",
+                                                            "saturate"};
 
 struct BlendOptions {
   std::string destination;
@@ -76,7 +88,7 @@ void addBlendCommand(Commands& commands) {
   addDepth(command, options->code, {6, 8, 15, 16, 24, 32}, "the pixel format of the destination")
       ->capture_default_str();
   command->add_flag("--staged", options->staged, "blend through a small buffer; the same pixels");
-  command->footer("Operators: " + listOf(kOperatorNames));
+  command->footer("Operators, in upper or lower case: " + listOf(kOperatorNames));
 }
 
 }  // namespace tool

@@ -17,6 +17,9 @@ struct Failure : std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+/// A line on standard error about something that is worth knowing and no failure.
+void note(const std::string& text);
+
 enum ExitStatus : int { kSuccess = 0, kFailure = 1, kUsage = 2 };
 
 /// The subcommands of the program, and which of them the command line chose.
@@ -36,6 +39,8 @@ class Commands {
     return command;
   }
 
+  CLI::App& program() { return app; }
+
   std::function<int()> chosen;
   int statusOfFailure = kFailure;
 
@@ -43,6 +48,7 @@ class Commands {
   CLI::App& app;
 };
 
+void addInfoCommand(Commands& commands);
 void addImageCommands(Commands& commands);
 void addRopCommand(Commands& commands);
 void addBlendCommand(Commands& commands);

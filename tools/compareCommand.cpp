@@ -4,7 +4,9 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstdlib>
 #include <memory>
+#include <vector>
 
 #include "changedRects.h"
 #include "commands.h"
@@ -13,6 +15,7 @@
 #include "numbers.h"
 #include "picture.h"
 #include "raster.h"
+#include "standardOutput.h"
 
 namespace tool {
 namespace {
@@ -28,7 +31,8 @@ struct CompareOptions {
   std::string mask;
   int32 maxDiffs = 0;
   uint32 tileSize = 16;
-  std::string out;
+  std::string image;
+  bool quiet = false;
 };
 
 Picture loadMask(const std::string& path, const Picture& like) {
@@ -40,10 +44,9 @@ Picture loadMask(const std::string& path, const Picture& like) {
 
 /// Clears what the mask does not compare.
 void applyMask(Picture& picture, const Picture& mask) {
-  constexpr uint32 kRopAnd = 1;
   Raster_RectROPcopy(picture.data(), static_cast<int32>(picture.pitch()), mask.data(),
-                     static_cast<int32>(mask.pitch()), 4, 0, 0, kRopAnd, 0, 0, picture.width(),
-                     picture.height());
+                     static_cast<int32>(mask.pitch()), 4, 0, 0, RASTER_ROP_AND, 0, 0,
+                     picture.width(), picture.height());
 }
 
 void outline(Picture& picture, const Rect& rect) {
@@ -62,13 +65,11 @@ void outline(Picture& picture, const Rect& rect) {
 /// The second picture, dark where both agree, each rectangle of differences bright and outlined.
 void drawDifferences(const Picture& second, const std::vector<Rect>& rects,
                      const std::string& path) {
-  constexpr uint32 kDestination = 2;
-  constexpr uint32 kScaleDestination = 2;
   constexpr uint32 kDark = 85;
   Picture picture = second.convertedTo(32);
   Raster_AlphaBlend(picture.data(), 0, 0, picture.pitch(), second.data(), 0, 0, second.pitch(),
-                    picture.width(), picture.height(), 24, 32, kDestination, kScaleDestination, 0,
-                    kDark, 0);
+                    picture.width(), picture.height(), 24, 32, RASTER_BLEND_DESTINATION,
+                    RASTER_BLEND_USE_DST_ALPHA, 0, kDark, 0);
   for (const Rect& rect : rects) {
     const auto x = static_cast<uint32>(rect.left);
     const auto y = static_cast<uint32>(rect.top);
@@ -79,20 +80,85 @@ void drawDifferences(const Picture& second, const std::vector<Rect>& rects,
   save(picture, path);
 }
 
+/// Where two pictures of 32 bits a pixel differ in colour, and by how much.
+struct Difference {
+  uint64 pixels = 0;
+  uint32 largest = 0;
+  Rect within = {};
+};
+
+uint32 largestDifference(const uint8* a, const uint8* b) {
+  uint32 largest = 0;
+  for (int channel = 0; channel < 3; ++channel)
+    largest = std::max(largest, static_cast<uint32>(std::abs(a[channel] - b[channel])));
+  return largest;
+}
+
+const uint8* pixelAt(const Picture& picture, int32 x, int32 y) {
+  return picture.data() + size_t{picture.pitch()} * static_cast<uint32>(y) +
+         4 * static_cast<size_t>(x);
+}
+
+Difference differenceWithin(const Picture& a, const Picture& b, const std::vector<Rect>& rects) {
+  Difference all;
+  for (const Rect& rect : rects) {
+    for (int32 y = rect.top; y < rect.bottom; ++y) {
+      for (int32 x = rect.left; x < rect.right; ++x) {
+        const uint32 by = largestDifference(pixelAt(a, x, y), pixelAt(b, x, y));
+        if (by == 0) continue;
+        ++all.pixels;
+        all.largest = std::max(all.largest, by);
+        const Rect pixel = {x, y, x + 1, y + 1};
+        Rect_Union(&all.within, &pixel);
+      }
+    }
+  }
+  return all;
+}
+
+/// Pixels of which a mask compares anything.
+uint64 comparedPixels(const Picture& mask) {
+  uint64 compared = 0;
+  for (int32 y = 0; y < mask.bounds().bottom; ++y) {
+    for (int32 x = 0; x < mask.bounds().right; ++x) {
+      const uint8* pixel = pixelAt(mask, x, y);
+      if ((pixel[0] | pixel[1] | pixel[2]) != 0) ++compared;
+    }
+  }
+  return compared;
+}
+
+void printDifference(FILE* stream, const Difference& difference, uint64 compared, bool agree,
+                     const std::vector<Rect>& rects) {
+  fprintf(stream, "%llu of %llu pixels differ", static_cast<unsigned long long>(difference.pixels),
+          static_cast<unsigned long long>(compared));
+  if (difference.pixels != 0) {
+    fprintf(stream, ", by up to %u, within %s%s", difference.largest,
+            regionText(difference.within).c_str(), agree ? ": equal within the tolerance" : "");
+    for (const Rect& rect : rects) fprintf(stream, "\n  %s", regionText(rect).c_str());
+  }
+  fputs("\n", stream);
+}
+
+bool haveOneSize(const Picture& a, const Picture& b) {
+  const Rect first = a.bounds();
+  const Rect second = b.bounds();
+  return Rect_IsSizeEqual(&first, &second);
+}
+
 int compare(const CompareOptions& options) {
-  if (!options.out.empty()) typeFromName(options.out);
+  if (!options.image.empty()) typeFromName(options.image);
+  FILE* text = textBeside(options.image);
   Picture first = Picture::loadAs(32, options.first);
   Picture second = Picture::loadAs(32, options.second);
-  const Rect firstBounds = first.bounds();
-  const Rect secondBounds = second.bounds();
-  if (!Rect_IsSizeEqual(&firstBounds, &secondBounds)) {
-    printf("different sizes: %ux%u and %ux%u\n", first.width(), first.height(), second.width(),
-           second.height());
+  if (!haveOneSize(first, second)) {
+    if (!options.quiet)
+      fprintf(text, "different sizes: %ux%u and %ux%u\n", first.width(), first.height(),
+              second.width(), second.height());
     return kDifferent;
   }
   const Picture mask = loadMask(options.mask, first);
-  const Rect maskBounds = mask.bounds();
-  if (!Rect_IsSizeEqual(&firstBounds, &maskBounds))
+  if (!haveOneSize(first, mask))
     throw Failure("the mask '" + options.mask + "' is not of the pictures' size");
   const bool agree = Raster_CompareMasked(first.data(), first.pitch(), 32, second.data(),
                                           second.pitch(), 32, mask.data(), mask.pitch(), 32, 0, 0,
@@ -102,14 +168,10 @@ int compare(const CompareOptions& options) {
   applyMask(first, mask);
   applyMask(second, mask);
   const std::vector<Rect> rects = changedRects(first, second, options.tileSize);
-  if (rects.empty()) {
-    printf("equal\n");
-  } else {
-    printf("%s: differences within %s\n", agree ? "equal within the tolerance" : "different",
-           regionText(boundingRect(first, second, rects)).c_str());
-    for (const Rect& rect : rects) printf("  %s\n", regionText(rect).c_str());
-  }
-  if (!options.out.empty()) drawDifferences(shown, rects, options.out);
+  if (!options.quiet)
+    printDifference(text, differenceWithin(first, second, rects), comparedPixels(mask), agree,
+                    rects);
+  if (!options.image.empty()) drawDifferences(shown, rects, options.image);
   return agree ? kEqual : kDifferent;
 }
 
@@ -119,19 +181,25 @@ void addCompareCommand(Commands& commands) {
   auto options = std::make_shared<CompareOptions>();
   CLI::App* command = commands.add(
       "compare",
-      "Compares two pictures. The exit status is 0 when they are equal, 1 when they differ and 2 "
-      "when that cannot be told.",
+      "Compares the colours of two pictures. The exit status is 0 when they are equal, 1 when they "
+      "differ and 2 when that cannot be told.",
       [options] { return compare(*options); }, kTrouble);
   command->add_option("A", options->first, "a PNG picture")->required();
   command->add_option("B", options->second, "a PNG picture")->required();
-  command->add_option("--mask", options->mask,
-                      "a PNG picture; the bits set in its colours are compared (white: all)");
+  command
+      ->add_option("--mask", options->mask,
+                   "a PNG picture; the bits set in its colours are compared (white: all)")
+      ->type_name("FILE");
   command->add_option("--max-diffs", options->maxDiffs, "so many pixels' worth of bytes may differ")
       ->check(count(0, kMostDiffs));
   command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
       ->check(count(1, 4096))
       ->capture_default_str();
-  command->add_option("--out", options->out, "a picture of the differences to write");
+  command
+      ->add_option("--image,--out", options->image,
+                   "a picture to write: dark, with the differences bright and outlined")
+      ->type_name("FILE");
+  command->add_flag("-q,--quiet", options->quiet, "say nothing: the exit status tells");
 }
 
 }  // namespace tool

@@ -74,7 +74,9 @@ int drawCursor(const CursorOptions& options) {
   Picture picture = Picture::loadAs(32, options.destination);
   CursorImage cursor = options.image.empty() ? maskCursor(options) : alphaCursor(options);
   cursor.scaleBy(options.scale);
-  cursor.drawOn(picture, options.at);
+  if (!cursor.drawOn(picture, options.at))
+    throw Failure("at " + std::to_string(options.at.x) + "," + std::to_string(options.at.y) +
+                  " nothing of the cursor lies on the destination");
   save(picture, options.output.path, saving);
   return kSuccess;
 }
@@ -87,8 +89,8 @@ void addCursorCommand(Commands& commands) {
                                    [options] { return drawCursor(*options); });
   command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
   options->output.addTo(command);
-  CLI::Option_group* kind = command->add_option_group("kind", "What the cursor is made of:");
-  kind->add_option("--image", options->image, "a PNG picture with alpha");
+  CLI::Option_group* kind = command->add_option_group("kind", "What the cursor is made of, one of");
+  kind->add_option("--image", options->image, "a PNG picture with alpha")->type_name("FILE");
   kind->add_option("--planes", options->planes,
                    "two PNG pictures, white where a bit is set: the screen is kept where the first "
                    "one is set, and inverted where the second one then is")

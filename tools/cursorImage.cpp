@@ -82,13 +82,14 @@ void CursorImage::scaleBy(double scale) {
   second = std::move(scaledSecond);
 }
 
-void CursorImage::drawOn(Picture& picture, const Point& at) const {
+bool CursorImage::drawOn(Picture& picture, const Point& at) const {
   const RasterCursor cursor = record();
   const RasterFrameBufferDesc frame = {picture.width(), picture.height(), picture.record.depth,
                                        picture.record.bpp, picture.pitch()};
   RasterCursorBox box;
-  if (Raster_ComputeCursorBox(&frame, &cursor, at.x, at.y, &box))
-    Raster_DrawCursor(picture.data(), &frame, nullptr, 0, &cursor, &box);
+  if (!Raster_ComputeCursorBox(&frame, &cursor, at.x, at.y, &box)) return false;
+  Raster_DrawCursor(picture.data(), &frame, nullptr, 0, &cursor, &box);
+  return true;
 }
 
 }  // namespace tool

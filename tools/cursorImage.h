@@ -31,8 +31,9 @@ class CursorImage {
   /// Enlarges or reduces it about its hot spot.
   void scaleBy(double scale);
 
-  /// Draws it, clipped, with its hot spot at a pixel. A picture of 32 bits takes both kinds.
-  void drawOn(Picture& picture, const Point& at) const;
+  /// Draws it, clipped, with its hot spot at a pixel; false when nothing of it lies on the picture.
+  /// A picture of 32 bits takes both kinds.
+  bool drawOn(Picture& picture, const Point& at) const;
 
  private:
   CursorImage(uint32 type, uint32 width, uint32 height, const Point& hotSpot);

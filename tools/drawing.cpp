@@ -3,7 +3,6 @@
 #include "drawing.h"
 
 #include <algorithm>
-#include <charconv>
 
 #include "commands.h"
 #include "geometry.h"
@@ -24,31 +23,29 @@ Placement place(const Picture& source, const Point& at, const Picture& target) {
   return result;
 }
 
-void premultiply(Picture& picture) {
+namespace {
+
+/// Applies `change(channel, alpha)` to the colours of 32-bit pixels.
+template <class Change> void changeColours(Picture& picture, Change change) {
   for (uint32 y = 0; y < picture.height(); ++y) {
     uint8* pixel = picture.data() + size_t{picture.pitch()} * y;
     for (uint32 x = 0; x < picture.width(); ++x, pixel += 4) {
       for (int channel = 0; channel < 3; ++channel)
-        pixel[channel] = static_cast<uint8>(pixel[channel] * pixel[3] / 255);
+        pixel[channel] = static_cast<uint8>(change(uint32{pixel[channel]}, uint32{pixel[3]}));
     }
   }
 }
 
-uint32 numberOfName(const std::string& text, std::span<const char* const> names) {
-  const auto found = std::find(names.begin(), names.end(), text);
-  if (found != names.end()) return static_cast<uint32>(found - names.begin());
-  uint32 number = 0;
-  const char* end = text.data() + text.size();
-  const auto [next, error] = std::from_chars(text.data(), end, number);
-  if (error == std::errc() && next == end && number < names.size()) return number;
-  throw CLI::ValidationError("there is no operation '" + text + "'; the names are " +
-                             listOf(names));
+}  // namespace
+
+void premultiply(Picture& picture) {
+  changeColours(picture, [](uint32 channel, uint32 alpha) { return channel * alpha / 255; });
 }
 
-std::string listOf(std::span<const char* const> names) {
-  std::string list;
-  for (const char* name : names) list += list.empty() ? name : std::string(", ") + name;
-  return list;
+void unpremultiply(Picture& picture) {
+  changeColours(picture, [](uint32 channel, uint32 alpha) {
+    return alpha == 0 ? 0 : std::min(255u, (channel * 255 + alpha / 2) / alpha);
+  });
 }
 
 }  // namespace tool

@@ -2,6 +2,7 @@
 
 #include "geometry.h"
 
+#include <algorithm>
 #include <charconv>
 
 namespace tool {
@@ -23,17 +24,17 @@ class Reader {
     return value;
   }
   uint32 size() { return static_cast<uint32>(number(1)); }
-  uint32 hexadecimal() {
-    uint32 value = 0;
-    const auto [next, error] = std::from_chars(at, end, value, 16);
-    if (error != std::errc() || next - at != 6) fail();
-    at = next;
-    return value;
-  }
   void expect(char sign) {
     if (at == end || *at != sign) fail();
     ++at;
   }
+  /// Whether the text goes on with a sign, which is then passed over.
+  bool takes(char sign) {
+    const bool is = at != end && *at == sign;
+    if (is) ++at;
+    return is;
+  }
+  bool isAtEnd() const { return at == end; }
   void expectEnd() const {
     if (at != end) fail();
   }
@@ -74,6 +75,7 @@ Rect parseRegion(const std::string& text) {
   const int32 width = reader.number(1);
   reader.expect('x');
   const int32 height = reader.number(1);
+  if (reader.isAtEnd()) return {0, 0, width, height};
   reader.expect('+');
   const int32 x = reader.number(0);
   reader.expect('+');
@@ -83,10 +85,51 @@ Rect parseRegion(const std::string& text) {
 }
 
 uint32 parseColour(const std::string& text) {
-  Reader reader(text, "RRGGBB");
-  const uint32 colour = reader.hexadecimal();
-  reader.expectEnd();
-  return colour;
+  const bool isShort = text.size() == 4 && text[0] == '#';
+  const size_t prefix = text.rfind("0x", 0) == 0 ? 2 : text.rfind('#', 0) == 0 ? 1 : 0;
+  uint32 value = 0;
+  const char* end = text.data() + text.size();
+  const auto [next, error] = std::from_chars(text.data() + prefix, end, value, 16);
+  if (error != std::errc() || next != end || text.size() - prefix != (isShort ? 3 : 6))
+    throw CLI::ValidationError("'" + text +
+                               "' is not of the form RRGGBB, #RRGGBB, #RGB or "
+                               "0xRRGGBB");
+  if (!isShort) return value;
+  return (value >> 8) * 0x110000 + (value >> 4 & 0xF) * 0x1100 + (value & 0xF) * 0x11;
+}
+
+SizeRequest parseSizeRequest(const std::string& text) {
+  constexpr const char* kForm = "WxH, Wx, xH, FACTOR or PERCENT%";
+  if (text.find('x') != std::string::npos) {
+    Reader reader(text, kForm);
+    const uint32 width = reader.takes('x') ? 0 : reader.size();
+    if (width != 0) reader.expect('x');
+    const uint32 height = width != 0 && reader.isAtEnd() ? 0 : reader.size();
+    reader.expectEnd();
+    return {width, height, 0};
+  }
+  constexpr double kLargestFactor = 32767;
+  const bool isPercent = !text.empty() && text.back() == '%';
+  const char* end = text.data() + text.size() - (isPercent ? 1 : 0);
+  double factor = 0;
+  const auto [next, error] = std::from_chars(text.data(), end, factor);
+  if (isPercent) factor /= 100;
+  if (error != std::errc() || next != end || !(factor > 0) || factor > kLargestFactor)
+    throw CLI::ValidationError("'" + text +
+                               "' is neither of the form WxH, Wx or xH nor a factor or "
+                               "percentage above 0");
+  return {0, 0, factor};
+}
+
+Size SizeRequest::of(const Size& original) const {
+  const auto scaled = [](uint32 side, double by) {
+    constexpr double kRoundingError = 1e-9;  // 29 % of 100 are 29, not 28
+    const double result = side * by * (1 + kRoundingError);
+    return static_cast<uint32>(std::clamp(result, 1.0, double{kLargestCoordinate}));
+  };
+  if (factor != 0) return {scaled(original.width, factor), scaled(original.height, factor)};
+  return {width != 0 ? width : scaled(original.width, double{1} * height / original.height),
+          height != 0 ? height : scaled(original.height, double{1} * width / original.width)};
 }
 
 std::string regionText(const Rect& rect) {

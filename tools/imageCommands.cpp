@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: MIT
 //
-// info, convert, combine: pictures as files.
+// convert, combine: pictures as files.
 
 #include <algorithm>
-#include <cstdio>
 #include <memory>
 #include <vector>
 
@@ -11,30 +10,9 @@
 #include "geometry.h"
 #include "imageOptions.h"
 #include "picture.h"
-#include "pngHeader.h"
 
 namespace tool {
 namespace {
-
-int showInfo(const std::string& path) {
-  const PngHeader header = readPngHeader(path);
-  printf("%s: PNG, %ux%u pixels, %s, %u bits per sample%s\n", path.c_str(), header.width,
-         header.height, colourTypeName(header.colourType), header.bitDepth,
-         header.interlaced ? ", interlaced" : "");
-  const Picture picture = Picture::load(path, true);
-  printf("in memory: depth %u, %u bits per pixel, %u bytes per line", picture.record.depth,
-         picture.record.bpp, picture.pitch());
-  if (picture.record.numColors != 0) printf(", %u colours", picture.record.numColors);
-  printf("\n");
-  return kSuccess;
-}
-
-void addInfo(Commands& commands) {
-  auto path = std::make_shared<std::string>();
-  CLI::App* command =
-      commands.add("info", "Says what a PNG picture is.", [path] { return showInfo(*path); });
-  command->add_option("FILE", *path, "a PNG picture")->required();
-}
 
 struct ConvertOptions {
   std::string input;
@@ -43,9 +21,18 @@ struct ConvertOptions {
 };
 
 int convert(const ConvertOptions& options) {
-  Picture picture = Picture::load(options.input, options.output.keepAlpha);
+  const bool isNarrow = options.code != 0 && options.code != 32;
+  if (isNarrow && options.output.keepAlpha)
+    throw CLI::ValidationError("pixels of --depth " + std::to_string(options.code) +
+                               " have no alpha to keep");
+  options.output.forSave();
+  Picture picture = Picture::load(options.input, !options.output.noAlpha);
+  const bool hadAlpha = picture.code() == 32 && isTransparent(picture);
   if (options.code != 0) picture = picture.convertedTo(options.code);
-  save(picture, options.output.path, options.output.forSave());
+  options.output.saveWithAlpha(picture);
+  if (hadAlpha && isNarrow)
+    note("pixels of --depth " + std::to_string(options.code) +
+         " keep no alpha: all pixels became opaque");
   return kSuccess;
 }
 
@@ -55,7 +42,8 @@ void addConvert(Commands& commands) {
                                    [options] { return convert(*options); });
   command->add_option("IN", options->input, "a PNG picture")->required();
   options->output.addTo(command);
-  options->output.addEncodingTo(command);
+  options->output.addCompressionTo(command);
+  options->output.addAlphaTo(command);
   addDepth(command, options->code, {8, 15, 16, 24, 32},
            "the pixel format that the picture goes through");
 }
@@ -92,24 +80,28 @@ void checkExtent(const std::vector<ImageUtilImage>& records, const std::vector<i
 }
 
 int combine(const OutputOptions& output, const std::vector<std::string>& inputs) {
+  output.forSave();
   std::vector<PlacedFile> files(inputs.size());
   std::transform(inputs.begin(), inputs.end(), files.begin(), parsePlacedFile);
   std::vector<Picture> pictures;
   std::vector<ImageUtilImage> records;
   std::vector<int32> positions;
+  bool hasAlpha = false;
   for (const PlacedFile& file : files) {
-    pictures.push_back(Picture::loadAs(24, file.path));  // one format for all of them
-    records.push_back(pictures.back().record);
+    pictures.push_back(Picture::load(file.path, !output.noAlpha));
+    hasAlpha |= pictures.back().code() == 32;
     positions.insert(positions.end(), {file.at.x, file.at.y});
+  }
+  for (Picture& picture : pictures) {
+    picture = picture.convertedTo(hasAlpha ? 32 : 24);  // one format for all of them
+    records.push_back(picture.record);
   }
   checkExtent(records, positions);
   Picture result;
   if (!ImageUtil_Combine(records.data(), positions.data(), static_cast<uint32>(records.size()),
                          &result.record))
     throw Failure("the combined picture is too large");
-  SaveOptions saving = output.forSave();
-  saving.keepAlpha = result.record.bpp == 32;  // gaps are transparent
-  save(result, output.path, saving);
+  output.saveWithAlpha(result);  // gaps are transparent
   return kSuccess;
 }
 
@@ -121,6 +113,7 @@ void addCombine(Commands& commands) {
       "Lays pictures out in one. Later ones cover earlier ones; gaps are transparent in a PNG.",
       [output, inputs] { return combine(*output, *inputs); });
   output->addTo(command);
+  output->addAlphaTo(command);
   command->add_option("PICTURES", *inputs, "a PNG picture and where its top left corner goes")
       ->required()
       ->type_name("FILE@X,Y");
@@ -129,7 +122,6 @@ void addCombine(Commands& commands) {
 }  // namespace
 
 void addImageCommands(Commands& commands) {
-  addInfo(commands);
   addConvert(commands);
   addCombine(commands);
 }

@@ -17,10 +17,17 @@ void OutputOptions::addTo(CLI::App* command) {
       ->check(CLI::IsMember({"png", "bmp"}));
 }
 
-void OutputOptions::addEncodingTo(CLI::App* command) {
+void OutputOptions::addCompressionTo(CLI::App* command) {
   command->add_option("--compression", compression, "effort of the PNG compression")
       ->check(count(0, 9));
-  command->add_flag("--keep-alpha", keepAlpha, "keep the alpha channel of the picture");
+}
+
+void OutputOptions::addAlphaTo(CLI::App* command) {
+  CLI::Option* without = command->add_flag("--no-alpha", noAlpha, "leave the alpha channel out");
+  command
+      ->add_flag("--keep-alpha", keepAlpha,
+                 "fail rather than leave out alpha, which is kept where it can be")
+      ->excludes(without);
 }
 
 SaveOptions OutputOptions::forSave() const {
@@ -31,6 +38,14 @@ SaveOptions OutputOptions::forSave() const {
   if (type == FileType::bmp && (keepAlpha || compression != -1))
     throw CLI::ValidationError("a BMP file has neither alpha nor compression");
   return {type, compression, keepAlpha};
+}
+
+void OutputOptions::saveWithAlpha(const Picture& picture) const {
+  SaveOptions saving = forSave();
+  saving.keepAlpha = picture.code() == 32 && !noAlpha;
+  save(picture, path, saving);
+  if (saving.keepAlpha && saving.type == FileType::bmp && isTransparent(picture))
+    note("a BMP file keeps no alpha: all pixels became opaque");
 }
 
 CLI::Option* addDepth(CLI::App* command, uint32& code, const std::vector<uint32>& allowed,

@@ -18,14 +18,19 @@ struct OutputOptions {
   std::string format;
   int compression = -1;
   bool keepAlpha = false;
+  bool noAlpha = false;
 
   /// OUT.
   void addPathTo(CLI::App* command);
   /// OUT and --format.
   void addTo(CLI::App* command);
-  /// --compression and --keep-alpha.
-  void addEncodingTo(CLI::App* command);
+  void addCompressionTo(CLI::App* command);
+  /// --no-alpha and --keep-alpha, for commands that keep alpha anyhow.
+  void addAlphaTo(CLI::App* command);
   SaveOptions forSave() const;
+  /// Writes a picture with its alpha, of which `picture` has some if it has 32 bits; says so when
+  /// that cannot be kept.
+  void saveWithAlpha(const Picture& picture) const;
 };
 
 /// --depth, one of the given pixel formats.

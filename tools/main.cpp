@@ -4,14 +4,19 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <exception>
 #include <new>
+#include <sstream>
+#include <string>
+#include <vector>
 
 #include "commands.h"
+#include "help.h"
 #include "message.h"
-#include "rasterVersion.h"
+#include "standardOutput.h"
 
 namespace tool {
 namespace {
@@ -31,8 +36,8 @@ void endOnPanic(const char* text) {
   _exit(statusOfPanic);
 }
 
-int usageError(const CLI::ParseError& error) {
-  complain(error.what());
+int usageError(const std::string& text) {
+  complain(text.c_str());
   fputs("Run with --help for more information.\n", stderr);
   return kUsage;
 }
@@ -44,7 +49,7 @@ int runChosen(Commands& commands) {
   try {
     return commands.chosen();
   } catch (const CLI::ParseError& error) {  // arguments that only the body can judge
-    return usageError(error);
+    return usageError(error.what());
   } catch (const std::bad_alloc&) {
     complain("out of memory");
   } catch (const std::exception& failure) {
@@ -53,23 +58,44 @@ int runChosen(Commands& commands) {
   return commands.statusOfFailure;
 }
 
+/// What was printed counts as done when it got where it should.
+int closed(int status, int statusOfFailure) {
+  if (closeStandardOutput() || status == statusOfFailure) return status;
+  complain("cannot write standard output");
+  return statusOfFailure;
+}
+
+/// The arguments, the last one first as the argument library takes them. Standard input at a place
+/// ("-@X,Y") would look like an option.
+std::vector<std::string> argumentsOf(int argc, char** argv) {
+  std::vector<std::string> arguments(argv + std::min(argc, 1), argv + argc);
+  for (std::string& argument : arguments)
+    if (argument.rfind("-@", 0) == 0) argument.replace(0, 1, "/dev/stdin");
+  std::reverse(arguments.begin(), arguments.end());
+  return arguments;
+}
+
 int runCommandLine(int argc, char** argv) {
-  CLI::App app("Screenshots of an X display, and raster graphics on PNG pictures.", "rastertool");
+  CLI::App app("Screenshots of X displays, and raster graphics on pictures in files or pipes.",
+               "rastertool");
   app.require_subcommand(1);
-  app.set_version_flag("--version", "rastertool " RASTER_VERSION);
   Commands commands(app);
-  for (const auto addFamily :
-       {addScreenCommands, addImageCommands, addRopCommand, addBlendCommand, addCursorCommand,
-        addScaleCommands, addCompareCommand, addYuvCommand, addPackCommands})
+  for (const auto addFamily : {addScreenCommands, addInfoCommand, addImageCommands, addRopCommand,
+                               addBlendCommand, addCursorCommand, addScaleCommands,
+                               addCompareCommand, addYuvCommand, addPackCommands, addHelpCommand})
     addFamily(commands);
+  addHelp(app);
   try {
-    app.parse(argc, argv);
-  } catch (const CLI::Success& help) {
-    return app.exit(help);
+    app.parse(argumentsOf(argc, argv));
+  } catch (const CLI::Success& asked) {
+    std::ostringstream text;
+    app.exit(asked, text);
+    fputs(text.str().c_str(), stdout);
+    return closed(kSuccess, kFailure);
   } catch (const CLI::ParseError& error) {
-    return usageError(error);
+    return usageError(explanation(app, error, argc, argv));
   }
-  return runChosen(commands);
+  return closed(runChosen(commands), commands.statusOfFailure);
 }
 
 /// What no command caught, such as no memory for the list of commands.
@@ -83,6 +109,9 @@ int runProgram(int argc, char** argv) noexcept {
 }
 
 }  // namespace
+
+void note(const std::string& text) { complain(text.c_str()); }
+
 }  // namespace tool
 
 int main(int argc, char** argv) { return tool::runProgram(argc, argv); }

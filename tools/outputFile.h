@@ -1,12 +1,11 @@
 // SPDX-License-Identifier: MIT
 //
-// Whole files in and out.
+// Whole files out.
 
 #ifndef RASTER_TOOLS_OUTPUT_FILE_H
 #define RASTER_TOOLS_OUTPUT_FILE_H
 
 #include <string>
-#include <vector>
 
 #include "baseTypes.h"
 
@@ -15,11 +14,6 @@ namespace tool {
 /// Writes a file that appears under `path` all at once (newFile.h), so that there is the whole new
 /// file or what was there before. Where `path` is a device or a pipe, writes to it.
 void writeFile(const std::string& path, const uint8* bytes, size_t size);
-
-/// Reads a part of a file: `size` bytes from its start, or fewer when it is shorter.
-std::vector<uint8> readFileStart(const std::string& path, size_t size);
-
-std::vector<uint8> readFile(const std::string& path);
 
 }  // namespace tool
 

@@ -8,12 +8,13 @@
 #include <cstdlib>
 #include <utility>
 
+#include "anyPng.h"
 #include "commands.h"
 #include "dynBuf.h"
-#include "outputFile.h"
-#include "pngHeader.h"
+#include "pngFile.h"
 #include "raster.h"
 #include "standardError.h"
+#include "standardOutput.h"
 
 namespace tool {
 namespace {
@@ -113,23 +114,55 @@ void Picture::describeLowDepth() {
     record.palette[value] = {blue.widened(value), green.widened(value), red.widened(value), 0};
 }
 
-Picture Picture::load(const std::string& path, bool keepAlpha) {
-  const PngHeader header = readPngHeader(path);
-  if (header.colourType == kGrey || header.colourType == kGreyAlpha)
-    throw Failure("'" + path + "' is a grey picture; only colour and palette pictures are read");
-  if (header.bitDepth == 16)
-    throw Failure("'" + path + "' has 16 bits per sample; only 8 and fewer are read");
-  const uint32 samples = header.colourType == kPalette ? 1 : header.colourType == kRgb ? 3 : 4;
-  if (uint64{header.width} * samples > kLargestPicture ||
-      uint64{header.width} * samples * header.height > kLargestPicture)
-    throw Failure("'" + path + "' is too large: " + std::to_string(header.width) + "x" +
-                  std::to_string(header.height) + " pixels");
+namespace {
+
+/// The library reads colour and palettes at 8 bits and fewer. Of what stands beside the pixels it
+/// keeps the palette, not its transparency.
+bool isForLibrary(const PngFile& png, bool keepAlpha) {
+  const bool isColour = png.colourType == kRgb || png.colourType == kRgba;
+  return png.bitDepth <= 8 && (isColour || png.colourType == kPalette) &&
+         !(keepAlpha && png.hasTransparency);
+}
+
+void checkExtent(const PngFile& png, const std::string& name) {
+  if (isTooLarge(png))
+    throw Failure(name + " is too large: " + std::to_string(png.width) + "x" +
+                  std::to_string(png.height) + " pixels");
+}
+
+}  // namespace
+
+bool isTransparent(const Picture& picture) {
+  for (uint32 y = 0; y < picture.height(); ++y) {
+    const uint8* row = picture.data() + size_t{picture.pitch()} * y;
+    for (uint32 x = 0; x < picture.width(); ++x)
+      if (row[4 * x + 3] != 0xFF) return true;
+  }
+  return false;
+}
+
+bool isTooLarge(const PngFile& png) {
+  return png.height != 0 && uint64{png.width} * 4 > kLargestPicture / png.height;
+}
+
+Picture Picture::decode(const PngFile& png, const std::string& name, bool keepAlpha) {
+  checkExtent(png, name);
+  if (!isForLibrary(png, keepAlpha)) {
+    Picture picture = decodeAnyPng(png, name);
+    return keepAlpha && png.hasAlpha() ? std::move(picture) : picture.convertedTo(24);
+  }
   Picture picture;
   CaughtStandardError messages;
   const uint8 flags = keepAlpha ? IMAGE_UTIL_READ_KEEP_ALPHA : 0;
-  if (!ImageUtil_ReadPNG(&picture.record, path.c_str(), flags))
-    throw Failure("cannot read the picture '" + path + "'" + messages.remark());
+  if (!ImageUtil_ReadPNGBuffer(&picture.record, png.bytes.data(),
+                               static_cast<uint32>(png.bytes.size()), flags))
+    throw Failure("cannot read the picture " + name + messages.remark());
   return picture;
+}
+
+Picture Picture::load(const std::string& path, bool keepAlpha) {
+  InputStream input(path);
+  return decode(readPng(input), input.name(), keepAlpha);
 }
 
 Picture Picture::loadAs(uint32 code, const std::string& path, bool keepAlpha) {
@@ -155,6 +188,7 @@ Rect Picture::bounds() const {
 
 FileType typeFromName(const std::string& path, FileType given) {
   if (given != FileType::fromName) return given;
+  if (isStandardOutput(path)) return FileType::png;
   const std::string ending = lowerCaseEnding(path);
   if (ending == "png") return FileType::png;
   if (ending == "bmp") return FileType::bmp;
@@ -169,7 +203,7 @@ void save(const Picture& picture, const std::string& path, const SaveOptions& op
                         ? ImageUtil_ConstructBMPBuffer(&picture.record, &buffer)
                         : ImageUtil_ConstructPNGBuffer(&picture.record, &params, &buffer);
   if (!done) throw Failure("cannot encode '" + path + "'" + messages.remark());
-  writeFile(path, buffer.data, buffer.size);
+  writeOutput(path, buffer.data, buffer.size);
 }
 
 }  // namespace tool

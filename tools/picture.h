@@ -13,6 +13,8 @@
 
 namespace tool {
 
+struct PngFile;
+
 /// The codes of the pixel formats: 6 and 8 are one byte of colour, 15 and 16 two, 24 three, 32
 /// four.
 class Picture {
@@ -24,9 +26,11 @@ class Picture {
   Picture(Picture&& from) noexcept : record(from.record) { from.record.data = nullptr; }
   Picture& operator=(Picture&& from) noexcept;
 
-  /// Reads a PNG file; its colours are indices into a palette, or code 24, or code 32 when it has
-  /// an alpha channel that is to be kept.
+  /// Reads a PNG file ("-": standard input); its colours are indices into a palette, or code 24,
+  /// or code 32 when it has alpha that is to be kept.
   static Picture load(const std::string& path, bool keepAlpha = false);
+  /// The same of a file that has been read; messages call it `name`.
+  static Picture decode(const PngFile& png, const std::string& name, bool keepAlpha = false);
   /// Reads a PNG file and brings it into a format.
   static Picture loadAs(uint32 code, const std::string& path, bool keepAlpha = false);
 
@@ -48,6 +52,12 @@ class Picture {
   void describeLowDepth();
 };
 
+/// Whether a picture of code 32 has pixels that are not opaque.
+bool isTransparent(const Picture& picture);
+
+/// Whether a picture has more pixels than this program takes.
+bool isTooLarge(const PngFile& png);
+
 enum class FileType { fromName, png, bmp };
 
 struct SaveOptions {
@@ -56,7 +66,7 @@ struct SaveOptions {
   bool keepAlpha = false;
 };
 
-/// The type that a path's ending names; a usage error when it names none.
+/// The type that a path's ending names; PNG for standard output, a usage error when it names none.
 FileType typeFromName(const std::string& path, FileType given = FileType::fromName);
 
 void save(const Picture& picture, const std::string& path, const SaveOptions& options = {});

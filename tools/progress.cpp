@@ -27,8 +27,9 @@ Progress::~Progress() {
 
 void Progress::show(uint64 done) {
   if (!onTerminal || Clock::now() < next) return;
-  fprintf(stderr, "\r%s: %llu of %llu\033[K", work.c_str(), static_cast<unsigned long long>(done),
-          static_cast<unsigned long long>(whole));
+  fprintf(stderr, "\r%s: %llu", work.c_str(), static_cast<unsigned long long>(done));
+  if (whole != 0) fprintf(stderr, " of %llu", static_cast<unsigned long long>(whole));
+  fputs("\033[K", stderr);
   shown = true;
   next = Clock::now() + kPace;
 }

@@ -12,7 +12,8 @@
 
 namespace tool {
 
-/// Shows nothing when standard error is no terminal or the work is done within half a second.
+/// A total of 0 is one that is not known. Shows nothing when standard error is no terminal or the
+/// work is done within half a second.
 class Progress {
  public:
   Progress(std::string name, uint64 total);

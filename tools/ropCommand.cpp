@@ -9,16 +9,30 @@
 #include "drawing.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "names.h"
 #include "picture.h"
 #include "raster.h"
 
 namespace tool {
 namespace {
 
-/// By number.
-constexpr const char* kRopNames[RASTER_ROP_COUNT] = {
-    "clear", "and",   "andReverse", "copy",      "andInverted",  "noop",       "xor",  "or",
-    "nor",   "equiv", "invert",     "orReverse", "copyInverted", "orInverted", "nand", "set"};
+/// By number: our own name, and those of the X protocol and of Windows.
+constexpr const char* kRopNames[RASTER_ROP_COUNT] = {"clear GXclear blackness",
+                                                     "and GXand srcAnd",
+                                                     "andReverse GXandReverse srcErase",
+                                                     "copy GXcopy srcCopy source src",
+                                                     "andInverted GXandInverted",
+                                                     "noop GXnoop nop",
+                                                     "xor GXxor srcInvert",
+                                                     "or GXor srcPaint",
+                                                     "nor GXnor notSrcErase",
+                                                     "equiv GXequiv xnor",
+                                                     "invert GXinvert dstInvert not",
+                                                     "orReverse GXorReverse",
+                                                     "copyInverted GXcopyInverted notSrcCopy",
+                                                     "orInverted GXorInverted mergePaint",
+                                                     "nand GXnand",
+                                                     "set GXset whiteness"};
 
 struct RopOptions {
   std::string destination;
@@ -88,18 +102,25 @@ void addRopCommand(Commands& commands) {
   command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
   options->output.addTo(command);
   addParsed(command, "--op", options->rop, parseRop, "NAME|0-15", "the operation")->required();
-  CLI::Option_group* from = command->add_option_group("source", "What is combined with it:");
-  from->add_option("--source", options->source, "a PNG picture");
-  addParsed(from, "--color,--colour", options->colour, parseColour, "RRGGBB", "one colour");
-  from->add_option("--tile", options->tile, "a PNG picture that is repeated");
+  CLI::Option_group* from = command->add_option_group("source", "What is combined with it, one of");
+  CLI::Option* source =
+      from->add_option("--source", options->source, "a PNG picture")->type_name("FILE");
+  addParsed(from, "--color,--colour", options->colour, parseColour, "COLOUR",
+            "one colour: RRGGBB, #RGB, 0xRRGGBB");
+  CLI::Option* tile = from->add_option("--tile", options->tile, "a PNG picture that is repeated")
+                          ->type_name("FILE");
   from->require_option(1);
   addParsed(command, "--at", options->at, parsePoint, "X,Y",
-            "where the top left corner of --source goes");
+            "where the top left corner of --source goes")
+      ->needs(source);
   addParsed(command, "--phase", options->phase, parsePhase, "X,Y",
-            "the pixel of --tile that lands on the top left corner");
+            "the pixel of --tile that lands on the top left corner")
+      ->needs(tile);
   addDepth(command, options->code, {16, 24, 32}, "the pixel format to work in")
       ->capture_default_str();
-  command->footer("Operations: " + listOf(kRopNames));
+  command->footer(
+      "Operations, in upper or lower case; X11's and Windows' names are known as well: " +
+      listOf(kRopNames));
 }
 
 }  // namespace tool

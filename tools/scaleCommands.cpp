@@ -2,11 +2,12 @@
 //
 // scale, crop.
 
-#include <charconv>
 #include <memory>
 #include <optional>
+#include <utility>
 
 #include "commands.h"
+#include "drawing.h"
 #include "geometry.h"
 #include "imageOptions.h"
 #include "picture.h"
@@ -20,23 +21,9 @@ constexpr uint32 kLargestSide = 32767;
 struct ScaleOptions {
   std::string input;
   OutputOptions output;
-  std::string size;
+  SizeRequest size;
   bool nearest = false;
 };
-
-/// WxH, or a factor.
-Size scaledSize(const std::string& text, const Picture& picture) {
-  if (text.find('x') != std::string::npos) return parseSize(text);
-  double factor = 0;
-  const char* end = text.data() + text.size();
-  const auto [next, error] = std::from_chars(text.data(), end, factor);
-  if (error != std::errc() || next != end || !(factor > 0) || factor > kLargestSide)
-    throw CLI::ValidationError("'" + text + "' is neither of the form WxH nor a factor above 0");
-  const auto scaled = [factor](uint32 side) {
-    return side * factor < 1 ? 1u : static_cast<uint32>(side * factor);
-  };
-  return {scaled(picture.width()), scaled(picture.height())};
-}
 
 void checkSides(uint32 width, uint32 height) {
   if (width > kLargestSide || height > kLargestSide)
@@ -44,21 +31,38 @@ void checkSides(uint32 width, uint32 height) {
                   " pixels");
 }
 
-int scale(const ScaleOptions& options) {
-  const SaveOptions saving = options.output.forSave();
-  const Picture picture = Picture::loadAs(32, options.input);
-  const Size size = scaledSize(options.size, picture);
-  checkSides(picture.width(), picture.height());
-  checkSides(size.width, size.height);
+/// Colours are smoothed by as much as they are seen, or those of transparent pixels would show.
+template <class Resize> Picture smoothed(Picture picture, Resize resize) {
+  premultiply(picture);
+  Picture result = resize(picture);
+  unpremultiply(result);
+  return result;
+}
+
+Picture resized(const Picture& picture, const Size& size, bool nearest) {
   Picture result(size.width, size.height, 32);
   const bool done =
       Raster_Scale(result.data(), result.pitch(), 32, 24, size.width, size.height, 0, 0, 0,
                    static_cast<int32>(size.width), static_cast<int32>(size.height), picture.data(),
                    static_cast<int32>(picture.pitch()), 32, 24, 0, picture.width(),
                    picture.height(), 0, double{1} * size.width / picture.width(),
-                   double{1} * size.height / picture.height(), options.nearest ? 0 : 1);
+                   double{1} * size.height / picture.height(), nearest ? 0 : 1);
   if (!done) throw Failure("the factors are out of range");
-  save(result, options.output.path, saving);
+  return result;
+}
+
+int scale(const ScaleOptions& options) {
+  options.output.forSave();
+  Picture picture = Picture::load(options.input, !options.output.noAlpha);
+  const bool hasAlpha = picture.code() == 32;
+  if (!hasAlpha) picture = picture.convertedTo(32);
+  const Size size = options.size.of({picture.width(), picture.height()});
+  checkSides(picture.width(), picture.height());
+  checkSides(size.width, size.height);
+  const auto resize = [&](const Picture& from) { return resized(from, size, options.nearest); };
+  Picture result = options.nearest ? resize(picture) : smoothed(std::move(picture), resize);
+  if (!hasAlpha) result = result.convertedTo(24);
+  options.output.saveWithAlpha(result);
   return kSuccess;
 }
 
@@ -68,9 +72,10 @@ void addScale(Commands& commands) {
                                    [options] { return scale(*options); });
   command->add_option("IN", options->input, "a PNG picture")->required();
   options->output.addTo(command);
-  command->add_option("SIZE", options->size, "the new size, or a factor")
-      ->required()
-      ->type_name("WxH|FACTOR");
+  options->output.addAlphaTo(command);
+  addParsed(command, "SIZE", options->size, parseSizeRequest, "SIZE",
+            "the new size: WxH, Wx or xH to keep the sides' ratio, a factor, or a percentage")
+      ->required();
   command->add_flag("--nearest", options->nearest, "repeat or drop pixels instead of smoothing");
 }
 
@@ -78,27 +83,34 @@ struct CropOptions {
   std::string input;
   OutputOptions output;
   Rect region = {};
-  std::optional<Size> size;
+  std::optional<SizeRequest> size;
 };
 
+/// A part of a picture of colours, of which the library makes a record of its own.
+Picture cropped(const Picture& picture, const Rect& region, const Size& size) {
+  Picture result;
+  if (!ImageUtil_CropAndScaleImage(&picture.record, region.left, region.top, region.right,
+                                   region.bottom, 0, 0, static_cast<int32>(size.width),
+                                   static_cast<int32>(size.height), &result.record))
+    throw Failure("the picture cannot be cropped to " + regionText(region));
+  return result;
+}
+
 int crop(const CropOptions& options) {
-  const SaveOptions saving = options.output.forSave();
-  Picture picture = Picture::load(options.input);
+  options.output.forSave();
+  Picture picture = Picture::load(options.input, !options.output.noAlpha);
   if (picture.record.bpp == 8) picture = picture.convertedTo(24);  // a crop has no palette
   const Rect bounds = picture.bounds();
   if (!Rect_ContainsRect(&bounds, &options.region))
     throw Failure(regionText(options.region) + " does not lie within the picture of " +
                   regionText(bounds));
-  const Size size = options.size.value_or(Size{widthOf(options.region), heightOf(options.region)});
-  checkSides(widthOf(options.region), heightOf(options.region));
+  const Size part = {widthOf(options.region), heightOf(options.region)};
+  const Size size = options.size ? options.size->of(part) : part;
+  checkSides(part.width, part.height);
   checkSides(size.width, size.height);
-  Picture result;
-  if (!ImageUtil_CropAndScaleImage(&picture.record, options.region.left, options.region.top,
-                                   options.region.right, options.region.bottom, 0, 0,
-                                   static_cast<int32>(size.width), static_cast<int32>(size.height),
-                                   &result.record))
-    throw Failure("the picture cannot be cropped to " + regionText(options.region));
-  save(result, options.output.path, saving);
+  const auto cut = [&](const Picture& from) { return cropped(from, options.region, size); };
+  const bool isSmoothed = options.size && picture.code() == 32;
+  options.output.saveWithAlpha(isSmoothed ? smoothed(std::move(picture), cut) : cut(picture));
   return kSuccess;
 }
 
@@ -109,9 +121,12 @@ void addCrop(Commands& commands) {
                    [options] { return crop(*options); });
   command->add_option("IN", options->input, "a PNG picture")->required();
   options->output.addTo(command);
-  addParsed(command, "REGION", options->region, parseRegion, "WxH+X+Y", "the part to keep")
+  options->output.addAlphaTo(command);
+  addParsed(command, "REGION", options->region, parseRegion, "WxH[+X+Y]",
+            "the part to keep; without +X+Y at the top left corner")
       ->required();
-  addParsed(command, "--scale", options->size, parseSize, "WxH", "the size to scale it to");
+  addParsed(command, "--scale", options->size, parseSizeRequest, "SIZE",
+            "the size to scale it to: WxH, Wx, xH, a factor or a percentage");
 }
 
 }  // namespace

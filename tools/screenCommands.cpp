@@ -18,6 +18,7 @@
 #include "numbers.h"
 #include "picture.h"
 #include "progress.h"
+#include "standardOutput.h"
 
 namespace tool {
 namespace {
@@ -27,7 +28,8 @@ struct ScreenOptions {
   std::optional<Rect> region;
 
   void addTo(CLI::App* command) {
-    command->add_option("--display", display, "the X display; without it, the one in DISPLAY");
+    command->add_option("--display", display, "the X display; without it, the one in DISPLAY")
+        ->type_name("NAME");
     addParsed(command, "--region", region, parseRegion, "WxH+X+Y", "a part of the screen");
   }
 
@@ -66,8 +68,8 @@ int screenshot(const ScreenshotOptions& options) {
     drawCursor(picture, region, display.cursor(), options.cursorScale);
   }
   save(picture, options.output.path, saving);
-  printf("%s: %s of a screen with %s\n", options.output.path.c_str(), regionText(region).c_str(),
-         display.description().c_str());
+  fprintf(textBeside(options.output.path), "%s: %s of a screen with %s\n",
+          options.output.path.c_str(), regionText(region).c_str(), display.description().c_str());
   return kSuccess;
 }
 
@@ -89,29 +91,53 @@ struct WatchOptions {
   double interval = 1;
   uint64 count = 1;
   uint32 tileSize = 16;
+  std::string raw;
 };
 
-void printChanges(uint64 number, const Picture& before, const Picture& after,
+void printChanges(FILE* text, uint64 number, const Picture& before, const Picture& after,
                   const std::vector<Rect>& rects) {
   if (rects.empty()) {
-    printf("%llu: no change\n", static_cast<unsigned long long>(number));
+    fprintf(text, "%llu: no change\n", static_cast<unsigned long long>(number));
   } else {
-    printf("%llu: changes within %s\n", static_cast<unsigned long long>(number),
-           regionText(boundingRect(before, after, rects)).c_str());
+    fprintf(text, "%llu: changes within %s\n", static_cast<unsigned long long>(number),
+            regionText(boundingRect(before, after, rects)).c_str());
   }
-  for (const Rect& rect : rects) printf("  %s\n", regionText(rect).c_str());
-  fflush(stdout);
+  for (const Rect& rect : rects) fprintf(text, "  %s\n", regionText(rect).c_str());
+  flushText(text);
 }
+
+/// Captures as they come, four bytes a pixel without gaps: blue, green, red and one that says
+/// nothing.
+class RawFrames {
+ public:
+  explicit RawFrames(const std::string& path) {
+    if (!path.empty()) output.emplace(path);
+  }
+
+  void write(const Picture& picture) {
+    if (!output) return;
+    const Picture wide = picture.convertedTo(32);
+    for (uint32 y = 0; y < wide.height(); ++y)
+      output->write(wide.data() + size_t{wide.pitch()} * y, size_t{4} * wide.width());
+  }
+
+ private:
+  std::optional<OutputStream> output;
+};
 
 int watch(const WatchOptions& options) {
   Display display(options.screen.display);
   const Rect region = options.screen.regionOf(display);
+  FILE* text = textBeside(options.raw);
+  RawFrames frames(options.raw);
   Picture before = display.capture(region);
+  frames.write(before);
   Progress progress("captures", options.count);
   for (uint64 number = 1; options.count == 0 || number <= options.count; ++number) {
     std::this_thread::sleep_for(std::chrono::duration<double>(options.interval));
     Picture after = display.capture(region);
-    printChanges(number, before, after, changedRects(before, after, options.tileSize));
+    frames.write(after);
+    printChanges(text, number, before, after, changedRects(before, after, options.tileSize));
     progress.show(number);
     before = std::move(after);
   }
@@ -133,6 +159,11 @@ void addWatch(Commands& commands) {
   command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
       ->check(count(1, 4096))
       ->capture_default_str();
+  command
+      ->add_option("--raw", options->raw,
+                   "also write every capture, the first one included, as raw video: four bytes a "
+                   "pixel, blue first (FFmpeg's bgr0)")
+      ->type_name("FILE");
 }
 
 }  // namespace

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 //
-// yuv: frames of raw video as pictures.
+// yuv: frames of uncompressed video as pictures.
 
 #include <cstdio>
 #include <memory>
@@ -10,68 +10,26 @@
 #include "commands.h"
 #include "geometry.h"
 #include "imageOptions.h"
+#include "inputStream.h"
 #include "numbers.h"
-#include "outputFile.h"
 #include "picture.h"
 #include "progress.h"
-#include "raster.h"
+#include "standardOutput.h"
+#include "videoFrames.h"
 
 namespace tool {
 namespace {
-
-struct Layout {
-  const char* name;
-  uint32 code;
-  uint64 (*frameSize)(uint64 width, uint64 height);
-};
-
-uint64 packedSize(uint64 width, uint64 height) { return height * 2 * ((width + 1) & ~uint64{1}); }
-
-uint64 planarSize(uint64 width, uint64 height) {
-  const uint64 chroma = ((width + 1) / 2) * ((height + 1) / 2);
-  return ((width + 1) & ~uint64{1}) * ((height + 1) & ~uint64{1}) + 2 * chroma;
-}
-
-constexpr Layout kLayouts[] = {{"YUY2", RASTER_VIDEO_YUY2, packedSize},
-                               {"UYVY", RASTER_VIDEO_UYVY, packedSize},
-                               {"YV12", RASTER_VIDEO_YV12, planarSize}};
-
-const Layout& layoutOfName(const std::string& name) {
-  for (const Layout& layout : kLayouts)
-    if (name == layout.name) return layout;
-  throw CLI::ValidationError("there is no frame layout '" + name + "'");
-}
 
 struct YuvOptions {
   std::string input;
   OutputOptions output;
   std::string layout;
-  Size size = {};
+  bool libraryOrder = false;
+  std::optional<Size> size;
   uint32 code = 32;
   uint64 frame = 0;
   bool all = false;
 };
-
-/// The video conversion has its 5-5-5 fields one bit higher than every other function.
-void lowerFields(std::vector<uint8>& pixels) {
-  for (size_t i = 0; i + 1 < pixels.size(); i += 2) {
-    const uint32 pixel = (uint32{pixels[i]} | uint32{pixels[i + 1]} << 8) >> 1;
-    pixels[i] = static_cast<uint8>(pixel);
-    pixels[i + 1] = static_cast<uint8>(pixel >> 8);
-  }
-}
-
-Picture decodeFrame(const YuvOptions& options, const uint8* frame) {
-  Picture picture(options.size.width, options.size.height, options.code);
-  const uint32 rowBytes = picture.width() * picture.bytesPerPixel();
-  std::vector<uint8> rows(size_t{rowBytes} * picture.height());
-  Raster_YUVtoRGB(frame, rows.data(), picture.width(), picture.height(),
-                  layoutOfName(options.layout).code, static_cast<int32>(options.code));
-  if (options.code == 15) lowerFields(rows);
-  Raster_RectCopy(picture.data(), picture.pitch(), rows.data(), rowBytes, picture.bytesPerPixel(),
-                  0, 0, 0, 0, picture.width(), picture.height());
-  return picture;
-}
 
 /// shot.png becomes shot-0007.png.
 std::string numberedPath(const std::string& path, uint64 number) {
@@ -84,59 +42,71 @@ std::string numberedPath(const std::string& path, uint64 number) {
   return numbered.insert(hasEnding ? dot : path.size(), digits);
 }
 
-int convertFrames(const YuvOptions& options) {
-  const SaveOptions saving = options.output.forSave();
-  const Layout& layout = layoutOfName(options.layout);
-  const uint64 frameSize = layout.frameSize(options.size.width, options.size.height);
-  const std::vector<uint8> video = readFile(options.input);
-  const uint64 frames = video.size() / frameSize;
-  const uint64 first = options.all ? 0 : options.frame;
-  const uint64 end = options.all ? frames : first + 1;
-  if (frames == 0 || end > frames)
-    throw Failure("'" + options.input + "' holds " + std::to_string(frames) + " whole frames of " +
-                  std::to_string(frameSize) + " bytes" +
-                  (options.all ? "" : ", not one of number " + std::to_string(first)));
-  Progress progress("frames", frames);
-  for (uint64 number = first; number < end; ++number) {
-    const Picture picture =
-        decodeFrame(options, video.data() + static_cast<size_t>(number * frameSize));
-    save(picture, options.all ? numberedPath(options.output.path, number) : options.output.path,
-         saving);
-    progress.show(number + 1);
-  }
-  return kSuccess;
+/// A file that begins as YUV4MPEG2 files do says all that raw video has to be told about.
+FrameReader readerFor(const YuvOptions& options, InputStream& input) {
+  if (options.layout.empty() && !options.size) return FrameReader(input);
+  if (options.input.ends_with(".y4m"))
+    throw CLI::ValidationError(
+        "a .y4m file says its format and size itself: leave --format and "
+        "--size out");
+  if (options.layout.empty() || !options.size)
+    throw CLI::ValidationError("raw video needs both --format and --size");
+  return {input, videoLayout(options.layout, options.libraryOrder), *options.size};
 }
 
-Size parseFrameSize(const std::string& text) {
-  constexpr uint32 kLargestSide = 16384;
-  const Size size = parseSize(text);
-  if (size.width > kLargestSide || size.height > kLargestSide)
-    throw CLI::ValidationError("no side of a frame may be over " + std::to_string(kLargestSide));
-  return size;
+[[noreturn]] void noSuchFrame(const InputStream& input, const FrameReader& frames) {
+  const uint64 bytes = frameBytes(frames.layout(), frames.size());
+  const uint64 count = frames.total().value_or(frames.position());
+  throw Failure(input.name() + " holds " + std::to_string(count) + " whole frames of " +
+                std::to_string(bytes) + " bytes");
+}
+
+int convertFrames(const YuvOptions& options) {
+  const SaveOptions saving = options.output.forSave();
+  if (!options.layout.empty()) videoLayout(options.layout, options.libraryOrder);
+  InputStream input(options.input);
+  FrameReader frames = readerFor(options, input);
+  const uint64 first = options.all ? 0 : options.frame;
+  std::vector<uint8> frame;
+  if (!frames.goTo(first) || !frames.read(frame)) noSuchFrame(input, frames);
+  Progress progress("frames", frames.total().value_or(0));
+  const bool isNumbered = options.all && !isStandardOutput(options.output.path);
+  do {
+    const uint64 number = frames.position() - 1;
+    save(decodeFrame(frames.layout(), frames.size(), frame, options.code),
+         isNumbered ? numberedPath(options.output.path, number) : options.output.path, saving);
+    progress.show(number + 1);
+  } while (options.all && frames.read(frame));
+  return kSuccess;
 }
 
 }  // namespace
 
 void addYuvCommand(Commands& commands) {
   auto options = std::make_shared<YuvOptions>();
-  CLI::App* command = commands.add("yuv", "Converts frames of raw video to pictures.",
+  CLI::App* command = commands.add("yuv", "Converts frames of uncompressed video to pictures.",
                                    [options] { return convertFrames(*options); });
-  command->add_option("IN", options->input, "frames of raw video, one after the other")->required();
-  options->output.addPathTo(command);
-  std::vector<std::string> names;
-  for (const Layout& layout : kLayouts) names.emplace_back(layout.name);
-  command->add_option("--format", options->layout, "how a frame lies in memory")
-      ->required()
-      ->check(CLI::IsMember(names));
-  addParsed(command, "--size", options->size, parseFrameSize, "WxH", "pixels of a frame")
+  command->add_option("IN", options->input, "frames one after the other, raw or as .y4m")
       ->required();
+  options->output.addPathTo(command);
+  command->add_option("--format", options->layout, "how a frame of raw video lies in memory")
+      ->type_name("NAME");
+  command->add_flag("--library-order", options->libraryOrder,
+                    "YUY2, UYVY and YV12 as the library has them, with the colour differences the "
+                    "other way round");
+  addParsed(command, "--size", options->size, parseFrameSize, "WxH",
+            "pixels of a frame of raw video");
   addDepth(command, options->code, {15, 16, 24, 32}, "the pixel format to convert to")
       ->capture_default_str();
   CLI::Option* frame =
       command->add_option("--frame", options->frame, "the number of the frame, from 0")
           ->check(count(0, UINT64_MAX));
-  command->add_flag("--all", options->all, "every frame: OUT gets a number before its ending")
+  command
+      ->add_flag("--all", options->all,
+                 "every frame: OUT gets a number before its ending; on standard output "
+                 "the pictures follow each other")
       ->excludes(frame);
+  command->footer("Formats, in upper or lower case: " + videoLayoutNames());
 }
 
 }  // namespace tool

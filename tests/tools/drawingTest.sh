@@ -41,6 +41,24 @@ samePixels out.png 0xFF0000 0xFF0000 0xFF0000 0xFF0000
 # A source that sticks out is clipped, one that lies outside is an error.
 ok rop src.png out.png --op copy --source dst.png --at -1,0
 samePixels out.png 0x112233
+
+# Other names, in any case; colours in other forms.
+for name in copy COPY GXcopy SRCCOPY src Copy 3; do
+  ok rop dst.png out.png --op "$name" --color '#35a'
+  samePixels out.png 0x3355AA 0x3355AA 0x3355AA 0x3355AA
+done
+for colour in 3355AA 3355aa '#3355aa' 0x3355aa '#35A'; do
+  ok rop dst.png out.png --op and-inverted --colour "$colour"
+  samePixels out.png 0x0C0A05 0x002211 0xCCAA55 0x000000
+done
+for colour in '#' 35a '#3355aaf' 0x35a '0x-3355a' '+3355aa' '#3355ag' red; do
+  refused 2 'RRGGBB' rop dst.png no.png --op copy "--colour=$colour"
+done
+refused 2 'at requires' rop dst.png no.png --op copy --tile src.png --at 1,1
+refused 2 'at requires' rop dst.png no.png --op copy --colour 000000 --at 1,1
+refused 2 'phase requires' rop dst.png no.png --op copy --source src.png --phase 1,1
+absent no.png
+
 rm -f out.png
 refused 1 'nothing of the source lies on the destination' rop src.png out.png --op copy --source dst.png --at 5,5
 absent out.png
@@ -61,6 +79,11 @@ ok blend dst.png half.png out.png --at 1,0 --op destination --dst-alpha 0
 samePixels out.png 0x0F0F0F 0x000000 0xFFFFFF 0x000000
 ok blend dst.png half.png out.png --at 1,0 --op over --src-alpha 0
 ok compare dst.png out.png
+ok blend dst.png half.png out.png --at 1,0
+for name in SRCOVER source-over OVER 3; do
+  ok blend dst.png half.png named.png --at 1,0 --op "$name"
+  ok compare out.png named.png
+done
 for depth in 6 8 15 16 24 32; do
   ok blend dst.png half.png out.png --depth "$depth" --op source --at 0,1
 done

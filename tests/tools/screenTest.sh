@@ -57,6 +57,27 @@ if have xsetroot; then
   says '1: changes within 200x120+0+0'
 fi
 
+# Captures as raw video: the first one, and one for every line of words, which go elsewhere then.
+"$TOOL" watch --interval 0.05 --count 3 --raw - >frames.raw 2>words || fail "watch --raw -: $(cat words)"
+[ "$(wc -c <frames.raw)" = $((4 * 200 * 120 * 4)) ] || fail "$(wc -c <frames.raw) bytes of 4 captures"
+[ "$(wc -l <words)" -ge 3 ] || fail "words beside raw video: $(cat words)"
+ok watch --interval 0.05 --count 1 --raw file.raw --region 50x40+3+5
+says '1: no change'
+[ "$(wc -c <file.raw)" = $((2 * 50 * 40 * 4)) ] || fail "$(wc -c <file.raw) bytes of 2 captures"
+if have ffmpeg; then
+  ok screenshot still.png
+  "$TOOL" watch --interval 0.05 --count 1 --raw - 2>words | ffmpeg -nostdin -loglevel error -f rawvideo \
+    -pixel_format bgr0 -video_size 200x120 -i - -frames:v 1 -y ffmpeg.png || fail 'raw video to ffmpeg'
+  ok compare still.png ffmpeg.png
+else
+  note 'not checked: no ffmpeg here'
+fi
+"$TOOL" screenshot - >piped.png 2>words || fail "a screenshot to standard output: $(cat words)"
+grep -q 'of a screen with' words || fail "words beside a screenshot: $(cat words)"
+ok compare still.png piped.png
+"$TOOL" watch --interval 0.05 --count 0 >/dev/full 2>words
+[ $? = 1 ] || fail 'watch >/dev/full does not end with 1'
+
 # The cursor lies where the pointer is: in the middle of a server without a mouse.
 if have xsetroot; then
   xsetroot -cursor_name left_ptr -solid '#204060'

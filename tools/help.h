@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: MIT
+//
+// What the program says about itself: help that fits a terminal, the version, and better words for
+// the commonest mistakes.
+
+#ifndef RASTER_TOOLS_HELP_H
+#define RASTER_TOOLS_HELP_H
+
+#include <CLI/CLI.hpp>
+#include <string>
+
+#include "commands.h"
+
+namespace tool {
+
+void addHelpCommand(Commands& commands);
+
+/// Gives the program and all the commands that it has this form of help, -h and -V.
+void addHelp(CLI::App& app);
+
+/// The version, and the instruction-set level that the library runs at.
+std::string versionText();
+
+/// What is wrong with a command line, and what may have been meant.
+std::string explanation(const CLI::App& app, const CLI::ParseError& error, int argc,
+                        const char* const* argv);
+
+}  // namespace tool
+
+#endif
