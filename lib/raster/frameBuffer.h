@@ -53,6 +53,73 @@ inline RowRun joinRows(intptr_t step, size_t bytes, uint32 rows) {
   return gapless ? RowRun{bytes * rows, 1} : RowRun{bytes, rows};
 }
 
+/// Rows of a destination: the first one, the signed step to the next one, their length and number.
+struct Rows {
+  uint8* first;
+  intptr_t step;
+  size_t bytes;
+  uint32 rows;
+
+  /// As one long row, where there is nothing between the rows.
+  Rows joined() const {
+    const RowRun run = joinRows(step, bytes, rows);
+    return {first, step, run.bytes, run.rows};
+  }
+};
+
+/// Rows of a destination and as many of a source: on each side the first one and the signed step to
+/// the next one, then the bytes of a row and the number of rows.
+struct RowPair {
+  uint8* dst;
+  intptr_t dstStep;
+  const uint8* src;
+  intptr_t srcStep;
+  size_t bytes;  ///< of a destination row; of a source row too where nothing else is said
+  uint32 rows;
+
+  // The fields of the results are made one by one: a copy of the record would load what was just
+  // stored in pieces as a whole, and so wait for the stores (store-to-load forwarding).
+
+  /// As one long row on each side, where there is nothing between the rows of either.
+  RowPair joined(size_t srcBytes) const {
+    const RowRun run = joinRows(dstStep, bytes, rows);
+    const bool both = joinRows(srcStep, srcBytes, rows).rows == run.rows;
+    return {dst, dstStep, src, srcStep, both ? run.bytes : bytes, both ? run.rows : rows};
+  }
+  RowPair joined() const { return joined(bytes); }
+
+  /// From the first row down, or from the last one up.
+  RowPair inOrder(bool fromLast) const {
+    const uint32 first = fromLast ? rows - 1 : 0;
+    return {rowAt(dst, dstStep, first, 0, 0),
+            fromLast ? -dstStep : dstStep,
+            rowAt(src, srcStep, first, 0, 0),
+            fromLast ? -srcStep : srcStep,
+            bytes,
+            rows};
+  }
+
+  /// How many bytes beyond the source the destination lies in the first row, modulo the size of the
+  /// address space.
+  uintptr_t ahead() const {
+    return reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
+  }
+
+  /// Whether the first row shares bytes with its source.
+  bool overlap() const { return ahead() < bytes || 0 - ahead() < bytes; }
+
+  /// Whether rows that are walked from their ends may be walked from the last one up and gain from
+  /// it: every row lies in its source, further right, and meets no other one. Memory is read
+  /// fastest in one direction throughout.
+  bool gainFromLast() const {
+    return rows != 0 && dstStep == srcStep && dstStep > 0 && ahead() != 0 && ahead() < bytes &&
+           ahead() + bytes <= static_cast<uintptr_t>(dstStep);
+  }
+};
+
+/// The order of the pixels in a row.
+enum class Walk { kToRight, kToLeft };
+
 /// The memory from the first to the last byte of some rows, gaps included. Rows that wrap around
 /// the end of the address space count as everywhere.
 struct RowSpan {

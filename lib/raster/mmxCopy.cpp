@@ -48,13 +48,14 @@ void streamRow(uint8* dst, const uint8* src, size_t head, size_t rest) {
 
 }  // namespace
 
-void mmxCopyRows(uint8* dst, intptr_t dstStep, const uint8* src, intptr_t srcStep, size_t bytes,
-                 uint32 height) {
-  const size_t head = -reinterpret_cast<uintptr_t>(dst) & 7;
-  for (; height != 0; --height) {
-    streamRow(dst, src, head, bytes - head);
-    dst = nextRow(dst, dstStep);
-    src = nextRow(src, srcStep);
+void mmxCopyRows(const RowPair& rows) {
+  const size_t head = -reinterpret_cast<uintptr_t>(rows.dst) & 7;
+  uint8* dst = rows.dst;
+  const uint8* src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
+    streamRow(dst, src, head, rows.bytes - head);
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
   }
   asm volatile("sfence\n\temms" ::: "memory");
 }

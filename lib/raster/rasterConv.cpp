@@ -110,17 +110,13 @@ void copyPixels(const Rectangle& r, int32 depth) {
   const uint32 bytesPerPixel = bytesPerPixelOf(depth);
   const size_t bytes = size_t{r.width} * bytesPerPixel;
   if (bytes == 0) return;
-  CopyRows rows{.dst = rowAt(r.dst, pitchOf(r.dstPitch), r.dstY, r.dstX, bytesPerPixel),
-                .dstStep = pitchOf(r.dstPitch),
-                .src = rowAt(r.src, pitchOf(r.srcPitch), r.srcY, r.srcX, bytesPerPixel),
-                .srcStep = pitchOf(r.srcPitch),
-                .bytes = bytes,
-                .height = r.height};
-  if (r.srcPitch == bytes && r.dstPitch == bytes) {
-    rows.bytes *= rows.height;
-    rows.height = 1;
-  }
-  copyRows(rows);
+  const RowPair rows = {.dst = rowAt(r.dst, pitchOf(r.dstPitch), r.dstY, r.dstX, bytesPerPixel),
+                        .dstStep = pitchOf(r.dstPitch),
+                        .src = rowAt(r.src, pitchOf(r.srcPitch), r.srcY, r.srcX, bytesPerPixel),
+                        .srcStep = pitchOf(r.srcPitch),
+                        .bytes = bytes,
+                        .rows = r.height};
+  copyRows(rows.joined());
 }
 
 /// Runs the kernel for a pair of formats, given by their indices in the table.
@@ -133,19 +129,13 @@ void convertRectangle(const Rectangle& r, size_t srcIndex, uint32 srcBytes, size
   // the first row as well as for the steps (a fill takes the full one for the first row).
   const intptr_t dstStep = rowStep(pitchOf(r.dstPitch), dstBytes);
   const intptr_t srcStep = rowStep(pitchOf(r.srcPitch), srcBytes);
-  ConvertJob job{.dst = rowAt(r.dst, dstStep, r.dstY, r.dstX, dstBytes),
-                 .dstStep = dstStep,
-                 .src = rowAt(r.src, srcStep, r.srcY, r.srcX, srcBytes),
-                 .srcStep = srcStep,
-                 .pixels = r.width,
-                 .height = r.height,
-                 .palette = bytesOf(palette)};
-  if (joinRows(dstStep, job.pixels * dstBytes, job.height).rows == 1 &&
-      joinRows(srcStep, job.pixels * srcBytes, job.height).rows == 1) {
-    job.pixels *= job.height;
-    job.height = 1;
-  }
-  kernel(job);
+  const RowPair rows = {.dst = rowAt(r.dst, dstStep, r.dstY, r.dstX, dstBytes),
+                        .dstStep = dstStep,
+                        .src = rowAt(r.src, srcStep, r.srcY, r.srcX, srcBytes),
+                        .srcStep = srcStep,
+                        .bytes = size_t{r.width} * dstBytes,
+                        .rows = r.height};
+  kernel(rows.joined(size_t{r.width} * srcBytes), bytesOf(palette));
 }
 
 /// Converts to a destination format that is one of the list; returns false otherwise.

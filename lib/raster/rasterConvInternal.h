@@ -12,23 +12,13 @@
 
 namespace raster {
 
-/// Rows of pixels to be converted: on each side the first row and the signed step to the next one.
-struct ConvertJob {
-  uint8* dst;
-  intptr_t dstStep;
-  const uint8* src;
-  intptr_t srcStep;
-  size_t pixels;  ///< a row
-  uint32 height;
-  const uint8* palette;  ///< the bytes of its 32-bit entries; null without a palette
-};
-
 /// Where a palette has the entry of a pixel.
 inline const uint8* entryAt(const uint8* palette, uint32 pixel) {
   return rowAt(palette, 0, 0, pixel, sizeof(uint32));
 }
 
-using ConvertKernel = void (*)(const ConvertJob& job);
+/// Converts rows; `palette` is the bytes of 32-bit entries, null without a palette.
+using ConvertKernel = void (*)(const RowPair& rows, const uint8* palette);
 
 /// The kernels from one source, in the order of DestinationFormats; null where the formats agree.
 using ConvertKernelsFrom = std::array<ConvertKernel, std::tuple_size_v<DestinationFormats>>;

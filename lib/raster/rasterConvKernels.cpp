@@ -39,49 +39,44 @@ uint32 loadConverted(const uint8* at, [[maybe_unused]] const uint8* palette) {
 }
 
 /// Pixel after pixel.
-template <class From, class To> void convertRowsPlainly(const ConvertJob& job) {
-  const size_t pixels = job.pixels;
-  const uint8* const palette = job.palette;
-  uint8* HWY_RESTRICT dst = job.dst;
-  const uint8* HWY_RESTRICT src = job.src;
-  for (uint32 y = job.height; y != 0; --y) {
+template <class From, class To> void convertRowsPlainly(const RowPair& rows, const uint8* palette) {
+  const size_t pixels = rows.bytes / To::kBytes;
+  uint8* HWY_RESTRICT dst = rows.dst;
+  const uint8* HWY_RESTRICT src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
     for (size_t x = 0; x < pixels; ++x)
       storePixel<To::kBytes>(dst + x * To::kBytes,
                              loadConverted<From, To>(src + x * From::kBytes, palette));
-    dst = nextRow(dst, job.dstStep);
-    src = nextRow(src, job.srcStep);
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
   }
 }
 
 /// The least number of pixels that make up for converting a palette.
 constexpr size_t kMinPixelsForTable = 256;
 
-template <class To> void convertRowsByTable(const ConvertJob& job) {
-  ColorTable<To> table(job.palette);
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  for (uint32 y = job.height; y != 0; --y) {
-    table.convertRow(dst, src, job.pixels);
-    dst = nextRow(dst, job.dstStep);
-    src = nextRow(src, job.srcStep);
-  }
+template <class To> void convertRowsByTable(const RowPair& rows, const uint8* palette) {
+  ColorTable<To> table(palette);
+  const size_t pixels = rows.bytes / To::kBytes;
+  forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { table.convertRow(dst, src, pixels); });
 }
 
-template <class To> void convertPaletteRows(const ConvertJob& job) {
+template <class To> void convertPaletteRows(const RowPair& rows, const uint8* palette) {
   if constexpr (ColorTable<To>::kPays) {
-    if (job.pixels >= ColorTable<To>::kMinRow && job.pixels * job.height >= kMinPixelsForTable)
-      return convertRowsByTable<To>(job);
+    const size_t pixels = rows.bytes / To::kBytes;
+    if (pixels >= ColorTable<To>::kMinRow && pixels * rows.rows >= kMinPixelsForTable)
+      return convertRowsByTable<To>(rows, palette);
   }
-  convertRowsPlainly<Palette, To>(job);
+  convertRowsPlainly<Palette, To>(rows, palette);
 }
 
 #if HWY_TARGET == HWY_SCALAR
 
-template <class From, class To> void convertRows(const ConvertJob& job) {
+template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
-    convertPaletteRows<To>(job);
+    convertPaletteRows<To>(rows, palette);
   } else {
-    convertRowsPlainly<From, To>(job);
+    convertRowsPlainly<From, To>(rows, palette);
   }
 }
 
@@ -109,38 +104,41 @@ HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
 
 /// Block after block; the last one ends with the row and may do some pixels again. Rows that are
 /// shorter than a block take smaller ones.
-template <class From, class To, class D> void convertRowsByBlocks(D d, const ConvertJob& job) {
+template <class From, class To, class D> void convertRowsByBlocks(D d, const RowPair& rows) {
   constexpr size_t kPixels = kBlockPixels<D>;
-  if (job.pixels < kPixels) {
+  const size_t pixels = rows.bytes / To::kBytes;
+  if (pixels < kPixels) {
     if constexpr (kPixels > 16) {
-      convertRowsByBlocks<From, To>(hn::Half<D>(), job);
+      convertRowsByBlocks<From, To>(hn::Half<D>(), rows);
     } else {
-      convertRowsPlainly<From, To>(job);
+      convertRowsPlainly<From, To>(rows, nullptr);
     }
     return;
   }
-  const size_t last = job.pixels - kPixels;
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  for (uint32 y = job.height; y != 0; --y) {
+  const size_t last = pixels - kPixels;
+  // Not through forRows: the constants of a conversion would be made for every row.
+  uint8* dst = rows.dst;
+  const uint8* src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
     for (size_t x = 0; x < last; x += kPixels)
       convertBlock<From, To>(d, dst + x * To::kBytes, src + x * From::kBytes);
     convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes);
-    dst = nextRow(dst, job.dstStep);
-    src = nextRow(src, job.srcStep);
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
   }
 }
 
-template <class From, class To> void convertRows(const ConvertJob& job) {
+template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
-    convertPaletteRows<To>(job);
+    convertPaletteRows<To>(rows, palette);
   } else {
+    (void)palette;
     constexpr bool kShort = From::kBytes <= 2 && To::kBytes <= 2;
     // Between 3 and 4 bytes a pixel there is nothing to compute, and half a cache line at a time
     // was measured to be faster than a whole one.
     constexpr size_t kMaxLanes = From::kBytes + To::kBytes == 7 ? 8 : 64;
     using Lane = std::conditional_t<kShort, uint16, uint32>;
-    convertRowsByBlocks<From, To>(hn::CappedTag<Lane, kMaxLanes>(), job);
+    convertRowsByBlocks<From, To>(hn::CappedTag<Lane, kMaxLanes>(), rows);
   }
 }
 

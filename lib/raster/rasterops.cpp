@@ -11,6 +11,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "byteRows-inl.h"
 #include "pixelPattern-inl.h"
 #include "rasteropsInternal.h"
 #include "rows-inl.h"
@@ -21,38 +22,30 @@ namespace {
 
 #if HWY_TARGET == HWY_SCALAR
 
-void fillRows(const FillRows& job) {
-  uint8* row = job.row;
-  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step)) {
+void fillRows(const Rows& rows, const PixelWords& pixels) {
+  forRows(rows, [&](uint8* row) {
     size_t i = 0;
-    for (; job.bytes - i >= sizeof job.pixels; i += sizeof job.pixels)
-      memcpy(row + i, &job.pixels, sizeof job.pixels);
-    memcpy(row + i, &job.pixels, job.bytes - i);
-  }
+    for (; rows.bytes - i >= sizeof pixels; i += sizeof pixels)
+      memcpy(row + i, &pixels, sizeof pixels);
+    memcpy(row + i, &pixels, rows.bytes - i);
+  });
 }
 
-void copyRows(const CopyRows& job) {
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  for (uint32 y = job.height; y != 0;
-       --y, dst = nextRow(dst, job.dstStep), src = nextRow(src, job.srcStep))
-    memmove(dst, src, job.bytes);
+void copyRows(const RowPair& rows) {
+  forRows(rows, [&](uint8* dst, const uint8* src) { memmove(dst, src, rows.bytes); });
 }
 
 #else
 
 using Bytes = hn::ScalableTag<uint8>;
-using Words = hn::ScalableTag<uint32>;
 
 /// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
 /// The end of a row is stored as one vector that overlaps what is there already.
 template <class D, class V = hn::Vec<D>>
-HWY_INLINE void fillLongRows(D d, const FillRows& job, V first, V second, V third, V last) {
+HWY_INLINE void fillLongRows(D d, const Rows& rows, V first, V second, V third, V last) {
   constexpr size_t n = kLanes<D>;
-  const size_t bytes = job.bytes;
-  const intptr_t step = job.step;  // read here, as a store to a pixel might change it
-  uint8* row = job.row;
-  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, step)) {
+  const size_t bytes = rows.bytes;  // read here, as a store to a pixel might change it
+  forRows(rows, [&](uint8* row) HWY_ATTR {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
       hn::StoreU(first, d, row + i);
@@ -62,141 +55,91 @@ HWY_INLINE void fillLongRows(D d, const FillRows& job, V first, V second, V thir
     if (bytes - i >= n) hn::StoreU(first, d, row + i);
     if (bytes - i >= 2 * n) hn::StoreU(second, d, row + i + n);
     hn::StoreU(last, d, row + bytes - n);
-  }
+  });
 }
 
-/// Fills with words that are all the same: in vectors of `d`, or smaller ones for short rows.
-template <class D> HWY_INLINE void fillWithWord(D d, const FillRows& job) {
-  if (job.bytes >= kLanes<D>) {
-    const auto same = hn::BitCast(d, hn::Set(hn::Repartition<uint32, D>(), job.pixels.word[0]));
-    fillLongRows(d, job, same, same, same, same);
-  } else if constexpr (kLanes < D >> sizeof(uint32)) {
-    fillWithWord(hn::Half<D>(), job);
-  } else {
-    uint8* row = job.row;
-    for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step))
-      memcpy(row, &job.pixels, job.bytes);
-  }
+/// Fills with words that are all the same.
+HWY_INLINE void fillWithWord(const Rows& rows, uint32 word) {
+  const auto fill = [&](auto d) HWY_ATTR __attribute__((always_inline)) {
+    const auto same = hn::BitCast(d, hn::Set(hn::Repartition<uint32, decltype(d)>(), word));
+    fillLongRows(d, rows, same, same, same, same);
+  };
+  const bool filled = withLargestVector<sizeof word>(Bytes(), rows.bytes, fill);
+  if (!filled) forRows(rows, [&](uint8* row) HWY_ATTR { memcpy(row, &word, rows.bytes); });
 }
 
-HWY_NOINLINE void fillWithPattern(const FillRows& job) {
+HWY_NOINLINE void fillWithPattern(const Rows& rows, const PixelWords& pixels) {
   const Bytes d;
   const size_t n = hn::Lanes(d);
-  const PixelPattern pattern = patternOf(job.pixels);
-  if (job.bytes >= n) {
-    const size_t lastPhase = (job.bytes - n) % sizeof job.pixels;
-    fillLongRows(d, job, hn::LoadU(d, pattern.bytes), hn::LoadU(d, pattern.bytes + n),
+  const size_t bytes = rows.bytes;
+  const PixelPattern pattern = patternOf(pixels);
+  if (bytes >= n) {
+    const size_t lastPhase = (bytes - n) % sizeof pixels;
+    fillLongRows(d, rows, hn::LoadU(d, pattern.bytes), hn::LoadU(d, pattern.bytes + n),
                  hn::LoadU(d, pattern.bytes + 2 * n), hn::LoadU(d, pattern.bytes + lastPhase));
     return;
   }
-  uint8* row = job.row;
-  for (uint32 y = job.height; y != 0; --y, row = nextRow(row, job.step)) {
-    forLanes(d, job.bytes, [&](auto tag, size_t i) {
-      storeLanes(tag, loadLanes(tag, pattern.bytes + i), row + i);
-    });
-  }
+  const auto patternAt = [&](auto tag, const uint8* /*src*/, const uint8* /*dst*/, size_t at)
+                             HWY_ATTR { return loadLanes(tag, pattern.bytes + at); };
+  withShortRow(d, bytes, patternAt, [&](auto row) HWY_ATTR {
+    forRows(rows, [&](uint8* dst) HWY_ATTR { row(dst, nullptr, bytes); });
+  });
 }
 
-void fillRows(const FillRows& job) {
-  const uint32* const word = job.pixels.word;
-  if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(job);
-  fillWithWord(Bytes(), job);
+void fillRows(const Rows& rows, const PixelWords& pixels) {
+  const uint32* const word = pixels.word;
+  if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(rows, pixels);
+  fillWithWord(rows, word[0]);
 }
 
-/// Copies rows of one to two blocks of `d`. A row is loaded whole before it is stored, so source
-/// and destination may overlap.
-template <class D> HWY_INLINE void copyShortRows(D d, const CopyRows& job) {
-  if (job.bytes < kLanes<D>) {
-    if constexpr (kLanes < D >> 1) copyShortRows(hn::Half<D>(), job);
-    return;
-  }
-  const size_t last = job.bytes - kLanes<D>;
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  const intptr_t dstStep = job.dstStep;  // as above
-  const intptr_t srcStep = job.srcStep;
-  for (uint32 y = job.height; y != 0;
-       --y, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep)) {
-    const auto head = hn::LoadU(d, src);
-    const auto tail = hn::LoadU(d, src + last);
-    hn::StoreU(head, d, dst);
-    hn::StoreU(tail, d, dst + last);
-  }
-}
+/// The lanes of the source.
+constexpr auto kCopied = [](auto d, const uint8* src, const uint8* /*dst*/, size_t at)
+                             HWY_ATTR { return loadLanes(d, src + at); };
 
-constexpr Bytes kBytes;
-constexpr size_t kStep = kLanes<Bytes>;
-
-/// Moves four vectors, loaded before they are stored.
-HWY_INLINE void moveFour(uint8* dst, const uint8* src) {
-  const auto a = hn::LoadU(kBytes, src);
-  const auto b = hn::LoadU(kBytes, src + kStep);
-  const auto c = hn::LoadU(kBytes, src + 2 * kStep);
-  const auto d = hn::LoadU(kBytes, src + 3 * kStep);
-  hn::StoreU(a, kBytes, dst);
-  hn::StoreU(b, kBytes, dst + kStep);
-  hn::StoreU(c, kBytes, dst + 2 * kStep);
-  hn::StoreU(d, kBytes, dst + 3 * kStep);
-}
-HWY_INLINE void moveOne(uint8* dst, const uint8* src) {
-  hn::StoreU(hn::LoadU(kBytes, src), kBytes, dst);
-}
-
-/// As memmove, of more than a vector. Both ends are loaded first and stored last, so that what lies
-/// between them is stored aligned.
+/// As memmove, of more than a vector.
 void moveRow(uint8* dst, const uint8* src, size_t bytes) {
-  const auto head = hn::LoadU(kBytes, src);
-  const auto tail = hn::LoadU(kBytes, src + bytes - kStep);
   const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
   if (ahead >= bytes) {
-    size_t i = kStep - reinterpret_cast<uintptr_t>(dst) % kStep;
-    for (; i + 4 * kStep < bytes; i += 4 * kStep) moveFour(dst + i, src + i);
-    for (; i + kStep < bytes; i += kStep) moveOne(dst + i, src + i);
+    storeLongRow<Walk::kToRight>(dst, src, bytes, kCopied);
   } else {
-    size_t end = bytes - reinterpret_cast<uintptr_t>(dst + bytes) % kStep;
-    for (; end > 4 * kStep; end -= 4 * kStep)
-      moveFour(dst + end - 4 * kStep, src + end - 4 * kStep);
-    for (; end > kStep; end -= kStep) moveOne(dst + end - kStep, src + end - kStep);
+    storeLongRow<Walk::kToLeft>(dst, src, bytes, kCopied);
   }
-  hn::StoreU(head, kBytes, dst);
-  hn::StoreU(tail, kBytes, dst + bytes - kStep);
 }
 
 // Rows up to here are moved by moveRow, which is faster than the C library's memmove for them: in
 // the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
 constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 32 * 1024;
 
-HWY_NOINLINE void copyLongRows(const CopyRows& job) {
-  uint8* dst = job.dst;
-  const uint8* src = job.src;
-  const intptr_t dstStep = job.dstStep;
-  const intptr_t srcStep = job.srcStep;
-  const size_t bytes = job.bytes;
-  for (uint32 y = job.height; y != 0;
-       --y, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep)) {
+HWY_NOINLINE void copyLongRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
     if (bytes <= kMaxOwnBytes) {
       moveRow(dst, src, bytes);
     } else {
       memmove(dst, src, bytes);
     }
-  }
+  });
 }
 
 // Two functions, as the short rows need nothing from the stack and so no alignment of it.
-void copyRows(const CopyRows& job) {
-  if (job.bytes > 2 * kStep) return copyLongRows(job);
-  copyShortRows(kBytes, job);
+void copyRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  if (bytes > 2 * kLanes<Bytes>) return copyLongRows(rows);
+  withShortRow(Bytes(), bytes, kCopied, [&](auto copy) HWY_ATTR {
+    forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { copy(dst, src, bytes); });
+  });
 }
 
 #endif
 
-void fillAlphaRows(uint8* row, intptr_t step, size_t pixels, uint32 height, uint32 alphaBits) {
-  for (; height != 0; --height, row = nextRow(row, step)) {
-    forLanes(hn::ScalableTag<uint32>(), pixels, [&](auto d, size_t x) {
+void fillAlphaRows(const Rows& rows, uint32 alphaBits) {
+  const size_t pixels = rows.bytes / 4;
+  forRows(rows, [&](uint8* row) HWY_ATTR {
+    forLanes(hn::ScalableTag<uint32>(), pixels, [&](auto d, size_t x) HWY_ATTR {
       const auto color = hn::And(loadLanes(d, row + 4 * x), hn::Set(d, 0x00FFFFFFu));
       storeLanes(d, hn::Or(color, hn::Set(d, alphaBits)), row + 4 * x);
     });
-  }
+  });
 }
 
 constexpr RasteropsKernels kKernels = {fillRows, copyRows, fillAlphaRows};
@@ -231,84 +174,51 @@ constexpr uint32 kMmxMinRows = 16;
 const RasteropsKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(rasteropsKernels)(); }
 const RasteropsKernels& kernels() { return chosenKernels<lookUpKernels>(); }
 
-/// Whether `bytes` bytes at `dst` overlap as many at `src`.
-bool overlap(const uint8* dst, const uint8* src, size_t bytes) {
-  const uintptr_t d = reinterpret_cast<uintptr_t>(dst);
-  const uintptr_t s = reinterpret_cast<uintptr_t>(src);
-  return s - bytes < d && d < s + bytes;
+/// Whether one move of all bytes does what a walk of the rows does: there is nothing between them,
+/// and where both sides overlap the rows are walked away from each other, as memmove does.
+bool isOneMove(const RowPair& joined, bool bottomUp) {
+  if (joined.rows != 1) return false;
+  const bool movesUp =
+      reinterpret_cast<uintptr_t>(joined.dst) > reinterpret_cast<uintptr_t>(joined.src);
+  return !joined.overlap() || movesUp == bottomUp;
 }
 
-/// A copy of rows: the top row of both sides, and whether the rows are walked from the last one up.
-struct RowCopy {
-  uint8* dst;
-  intptr_t dstPitch;
-  const uint8* src;
-  intptr_t srcPitch;
-  size_t bytes;
-  uint32 height;
-  bool bottomUp;
-
-  /// Whether one move of all bytes does the same: the rows follow each other without a gap, and
-  /// where they overlap they are walked away from each other, as memmove does.
-  bool isOneMove() const {
-    if (dstPitch != srcPitch || joinRows(dstPitch, bytes, height).rows == height) return false;
-    if (!overlap(dst, src, bytes * height)) return true;
-    const bool movesUp = reinterpret_cast<uintptr_t>(dst) > reinterpret_cast<uintptr_t>(src);
-    return movesUp == bottomUp;
+/// Copies rows, given from the top one down, in the order of rows that is asked for.
+void copyInOrder(const RowPair& rows, bool bottomUp) {
+  const bool streams = rasterops_mmx != 0 && rows.bytes >= kMmxMinBytes && rows.rows >= kMmxMinRows;
+  if (!streams) {
+    const RowPair joined = rows.joined();
+    if (isOneMove(joined, bottomUp)) return copyRows(joined);
   }
-
-  /// Whether the rows may be walked from the last one up and gain from it: a row that moves right
-  /// within itself is moved from its end, and memory is read fastest in one direction throughout.
-  /// Allowed while no row meets another one.
-  bool gainsFromBottomUp() const {
-    const uintptr_t distance = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
-    return dstPitch == srcPitch && dstPitch > 0 && distance != 0 && distance < bytes &&
-           distance + bytes <= static_cast<uintptr_t>(dstPitch);
-  }
-};
-
-void copyRectangle(const RowCopy& copy) {
-  const bool bottomUp = copy.bottomUp || copy.gainsFromBottomUp();
-  const uint32 first = bottomUp ? copy.height - 1 : 0;
-  uint8* const d = rowAt(copy.dst, copy.dstPitch, first, 0, 0);
-  const uint8* const s = rowAt(copy.src, copy.srcPitch, first, 0, 0);
-  const intptr_t dstStep = bottomUp ? -copy.dstPitch : copy.dstPitch;
-  const intptr_t srcStep = bottomUp ? -copy.srcPitch : copy.srcPitch;
-  const bool streams =
-      rasterops_mmx != 0 && copy.bytes >= kMmxMinBytes && copy.height >= kMmxMinRows;
-  if (streams && !overlap(d, s, copy.bytes)) {
-    mmxCopyRows(d, dstStep, s, srcStep, copy.bytes, copy.height);
-  } else if (copy.isOneMove()) {
-    kernels().copyRows({copy.dst, 0, copy.src, 0, copy.bytes * copy.height, 1});
-  } else {
-    kernels().copyRows({d, dstStep, s, srcStep, copy.bytes, copy.height});
-  }
+  const RowPair walked = rows.inOrder(bottomUp || rows.gainFromLast());
+  if (streams && !walked.overlap()) return mmxCopyRows(walked);
+  copyRows(walked);
 }
 
 }  // namespace
 
-void copyRows(const CopyRows& rows) { kernels().copyRows(rows); }
+void copyRows(const RowPair& rows) { kernels().copyRows(rows); }
 
 void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
               uint32 width, uint32 height) {
   if (bytesPerPixel < 1 || bytesPerPixel > 4) unsupportedPixelSize(kSource);
   const intptr_t step = rowStep(pitch, bytesPerPixel);
-  const RowRun run = joinRows(step, size_t{width} * bytesPerPixel, height);
-  kernels().fillRows({rowAt(fb, pitch, y, x, bytesPerPixel), step, run.bytes, run.rows,
-                      repeatPixel(pixel, bytesPerPixel)});
+  const Rows rows = {rowAt(fb, pitch, y, x, bytesPerPixel), step, size_t{width} * bytesPerPixel,
+                     height};
+  kernels().fillRows(rows.joined(), repeatPixel(pixel, bytesPerPixel));
 }
 
 void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
               uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
               uint32 width, uint32 height) {
   if (height == 0) return;
-  copyRectangle({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
-                 .dstPitch = dstPitch,
-                 .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
-                 .srcPitch = srcPitch,
-                 .bytes = size_t{width} * bytesPerPixel,
-                 .height = height,
-                 .bottomUp = dstY > srcY});
+  copyInOrder({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
+               .dstStep = dstPitch,
+               .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
+               .srcStep = srcPitch,
+               .bytes = size_t{width} * bytesPerPixel,
+               .rows = height},
+              dstY > srcY);
 }
 
 }  // namespace raster
@@ -331,9 +241,8 @@ void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32
                           uint32 height) {
   using namespace raster;
   const intptr_t step = pitchOf(pitch);
-  const RowRun run = joinRows(step, size_t{width} * 4, height);
-  kernels().fillAlphaRows(rowAt(fb, step, y, x, 4), step, run.bytes / 4, run.rows,
-                          uint32{alpha} << 24);
+  const Rows rows = {rowAt(fb, step, y, x, 4), step, size_t{width} * 4, height};
+  kernels().fillAlphaRows(rows.joined(), uint32{alpha} << 24);
 }
 
 }  // extern "C"

@@ -10,34 +10,15 @@
 
 namespace raster {
 
-/// Rows to be filled: the first one, the signed step to the next one, their length and number.
-struct FillRows {
-  uint8* row;
-  intptr_t step;
-  size_t bytes;
-  uint32 height;
-  PixelWords pixels;
-};
-
-/// Rows to be copied.
-struct CopyRows {
-  uint8* dst;
-  intptr_t dstStep;
-  const uint8* src;
-  intptr_t srcStep;
-  size_t bytes;
-  uint32 height;
-};
-
 /// What the kernels of one instruction-set level offer.
 struct RasteropsKernels {
-  void (*fillRows)(const FillRows& job);
-  void (*copyRows)(const CopyRows& job);
-  void (*fillAlphaRows)(uint8* row, intptr_t step, size_t pixels, uint32 height, uint32 alphaBits);
+  void (*fillRows)(const Rows& rows, const PixelWords& pixels);
+  void (*copyRows)(const RowPair& rows);
+  void (*fillAlphaRows)(const Rows& rows, uint32 alphaBits);
 };
 
 /// Copies rows from the first one to the last one, each as memmove does.
-void copyRows(const CopyRows& rows);
+void copyRows(const RowPair& rows);
 
 /// As Raster_RectFill.
 void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,

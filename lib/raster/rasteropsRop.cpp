@@ -12,6 +12,7 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include "byteRows-inl.h"
 #include "pixelPattern-inl.h"
 #include "rasteropsRopInternal.h"
 #include "rop-inl.h"
@@ -23,86 +24,43 @@ namespace {
 
 using Bytes = hn::ScalableTag<uint8>;
 
-/// Runs row(dst, src, bytes) from the first row to the last one. The steps of several rows are
-/// equal: one register less.
-template <class Row> HWY_INLINE void forRows(const RopRows& rows, const Row& row) {
+/// Vectors in order: for rows that overlap far.
+template <class Rop, Walk kWalk> void combineRowsInOrder(const RowPair& rows) {
   const size_t bytes = rows.bytes;
-  const intptr_t step = rows.dstStep;
-  uint8* dst = rows.dst;
-  const uint8* src = rows.src;
-  for (uint32 y = rows.height; y != 0; --y, dst = nextRow(dst, step), src = nextRow(src, step))
-    row(dst, src, bytes);
+  forRowsInStep(rows, [&](uint8* dst, const uint8* src)
+                          HWY_ATTR { combineInOrder<Rop, kWalk>(dst, src, bytes); });
 }
 
+/// For rows that do not overlap.
+template <class Rop, Walk kWalk> void combineRows(const RowPair& rows) {
 #if HWY_TARGET == HWY_SCALAR
-
-template <class Rop> void freshRowsToRight(const RopRows& rows) {
-  forRows(rows, combineToRight<Rop>);
-}
-template <class Rop> void freshRowsToLeft(const RopRows& rows) {
-  forRows(rows, combineToLeft<Rop>);
-}
-
+  combineRowsInOrder<Rop, kWalk>(rows);
 #else
-
-/// Where no step of a row reads what an earlier one stored: short rows in a loop of their own.
-template <class Rop, class LongRow>
-HWY_INLINE void freshRows(const RopRows& rows, const LongRow& combineLong) {
-  if (rows.bytes > 2 * kLanes<Bytes>) {
-    forRows(rows, combineLong);
+  const CombinedAt<Rop> combinedAt;
+  const size_t bytes = rows.bytes;
+  if (bytes > 2 * kLanes<Bytes>) {
+    forRowsInStep(rows, [&](uint8* dst, const uint8* src)
+                            HWY_ATTR { storeLongRow<kWalk>(dst, src, bytes, combinedAt); });
   } else {
-    withShortRow(Bytes(), rows.bytes, CombinedAt<Rop>(),
-                 [&](auto row) HWY_ATTR { forRows(rows, row); });
+    withShortRow(Bytes(), bytes, combinedAt, [&](auto row) HWY_ATTR {
+      forRowsInStep(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { row(dst, src, bytes); });
+    });
   }
-}
-template <class Rop> HWY_INLINE void freshRowsToRight(const RopRows& rows) {
-  freshRows<Rop>(rows, combineLongToRight<Rop>);
-}
-template <class Rop> HWY_INLINE void freshRowsToLeft(const RopRows& rows) {
-  freshRows<Rop>(rows, combineLongToLeft<Rop>);
-}
-
 #endif
-
-/// Whether no step of a row reads what an earlier one stored, `ahead` bytes in the direction of the
-/// walk from where it read.
-template <class Rop> bool staysFresh(uintptr_t ahead, size_t bytes) {
-  return !kReadsSrc<Rop> || ahead == 0 || ahead >= bytes;
-}
-
-template <class Rop> void rowsToRight(const RopRows& rows) {
-  const uintptr_t ahead =
-      reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
-  if (staysFresh<Rop>(ahead, rows.bytes)) {
-    freshRowsToRight<Rop>(rows);
-  } else {
-    forRows(rows, combineToRight<Rop>);
-  }
-}
-
-template <class Rop> void rowsToLeft(const RopRows& rows) {
-  const uintptr_t ahead =
-      reinterpret_cast<uintptr_t>(rows.src) - reinterpret_cast<uintptr_t>(rows.dst);
-  if (staysFresh<Rop>(ahead, rows.bytes)) {
-    freshRowsToLeft<Rop>(rows);
-  } else {
-    forRows(rows, combineToLeft<Rop>);
-  }
 }
 
 #if HWY_TARGET == HWY_SCALAR
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
-              const PixelWords& flip) {
-  for (; height != 0; --height, row = nextRow(row, step)) {
-    for (size_t i = 0; i < bytes; i += sizeof keep) {
-      const size_t count = bytes - i < sizeof keep ? bytes - i : sizeof keep;
+void fillRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
+  forRows(rows, [&](uint8* row) {
+    for (size_t i = 0; i < rows.bytes; i += sizeof keep) {
+      const size_t count = rows.bytes - i < sizeof keep ? rows.bytes - i : sizeof keep;
       PixelWords d = {};
       memcpy(&d, row + i, count);
       for (size_t k = 0; k < 3; ++k) d.word[k] = (d.word[k] & keep.word[k]) ^ flip.word[k];
       memcpy(row + i, &d, count);
     }
-  }
+  });
 }
 
 #else
@@ -121,14 +79,14 @@ struct FillPatterns {
 };
 
 /// Fills rows of more than two vectors.
-HWY_NOINLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 height,
-                               const PixelWords& keep, const PixelWords& flip) {
+HWY_NOINLINE void fillLongRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
   const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
+  const size_t bytes = rows.bytes;
   const auto fill = [&](auto tag, uint8* dst, size_t at)
                         HWY_ATTR { storeLanes(tag, filledAt(tag, nullptr, dst, at), dst + at); };
-  for (; height != 0; --height, row = nextRow(row, step)) {
+  forRows(rows, [&](uint8* row) HWY_ATTR {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
       for (size_t k = 0; k < 3 * n; k += kCacheLine) fetchAhead(row + i + k);
@@ -137,28 +95,33 @@ HWY_NOINLINE void fillLongRows(uint8* row, intptr_t step, size_t bytes, uint32 h
       fill(d, row + i, 2 * n);
     }
     forLanes(d, bytes - i, [&](auto tag, size_t k) HWY_ATTR { fill(tag, row + i, k); });
-  }
+  });
 }
 
-void fillRows(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
-              const PixelWords& flip) {
-  if (bytes > 2 * kLanes<Bytes>) {
-    fillLongRows(row, step, bytes, height, keep, flip);
-    return;
-  }
+void fillRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
+  const size_t bytes = rows.bytes;
+  if (bytes > 2 * kLanes<Bytes>) return fillLongRows(rows, keep, flip);
   const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
   withShortRow(Bytes(), bytes, filledAt, [&](auto shortRow) HWY_ATTR {
-    for (uint32 y = height; y != 0; --y, row = nextRow(row, step)) shortRow(row, nullptr, bytes);
+    forRows(rows, [&](uint8* row) HWY_ATTR { shortRow(row, nullptr, bytes); });
   });
 }
 
 #endif
 
-constexpr auto kToRight =
-    ropTable([](auto rop) -> RopRowsKernel { return rowsToRight<decltype(rop)>; });
-constexpr auto kToLeft =
-    ropTable([](auto rop) -> RopRowsKernel { return rowsToLeft<decltype(rop)>; });
-constexpr RopKernels kKernels = {kLanes<Bytes>, fillRows, kToRight.data(), kToLeft.data()};
+template <Walk kWalk>
+constexpr auto kRows = ropTable([](auto rop) -> RopRowsKernel {
+  return combineRows<decltype(rop), kWalk>;
+});
+template <Walk kWalk>
+constexpr auto kRowsInOrder = ropTable([](auto rop) -> RopRowsKernel {
+  return combineRowsInOrder<decltype(rop), kWalk>;
+});
+constexpr RopKernels kKernels = {
+    kLanes<Bytes>,
+    fillRows,
+    {{kRows<Walk::kToRight>.data(), kRowsInOrder<Walk::kToRight>.data()},
+     {kRows<Walk::kToLeft>.data(), kRowsInOrder<Walk::kToLeft>.data()}}};
 
 }  // namespace
 
@@ -192,80 +155,51 @@ constexpr auto kOnPixel = HWY_NAMESPACE::ropTable([](auto rop) -> RopOnPixel {
   return [](uint32 s, uint32 d) { return decltype(rop){}(s, d); };
 });
 
-/// The walk as it is defined: units of 1, 2 or 4 bytes, each read, combined and stored before the
-/// next one is looked at.
-template <class Rop, unsigned kUnit> void walkUnits(const RopRows& rows, RopWalk walk) {
-  const intptr_t advance = walk == RopWalk::kToRight ? intptr_t{kUnit} : -intptr_t{kUnit};
-  const size_t first = walk == RopWalk::kToRight ? 0 : rows.bytes - kUnit;
+/// The walk as it is defined, of an operation that reads the source: units of 1, 2 or 4 bytes, each
+/// read, combined and stored before the next one is looked at.
+template <class Rop, unsigned kUnit> void walkUnits(const RowPair& rows, Walk walk) {
+  const intptr_t advance = walk == Walk::kToRight ? intptr_t{kUnit} : -intptr_t{kUnit};
+  const size_t first = walk == Walk::kToRight ? 0 : rows.bytes - kUnit;
   uint8* dstRow = rows.dst + first;
   const uint8* srcRow = rows.src + first;
-  for (uint32 y = rows.height; y != 0;
+  for (uint32 y = rows.rows; y != 0;
        --y, dstRow = nextRow(dstRow, rows.dstStep), srcRow = nextRow(srcRow, rows.srcStep)) {
     uint8* dst = dstRow;
     const uint8* src = srcRow;
     for (size_t i = rows.bytes / kUnit; i != 0;
          --i, dst = nextRow(dst, advance), src = nextRow(src, advance)) {
-      const uint32 s = HWY_NAMESPACE::kReadsSrc<Rop> ? loadPixel<kUnit>(src) : 0;
       const uint32 d = HWY_NAMESPACE::kReadsDst<Rop> ? loadPixel<kUnit>(dst) : 0;
-      storePixel<kUnit>(dst, Rop{}(s, d));
+      storePixel<kUnit>(dst, Rop{}(loadPixel<kUnit>(src), d));
     }
   }
 }
 
-using RopWalker = void (*)(const RopRows& rows, RopWalk walk);
+using RopWalker = void (*)(const RowPair& rows, Walk walk);
 template <unsigned kUnit>
 constexpr auto kWalkers = HWY_NAMESPACE::ropTable([](auto rop) -> RopWalker {
   return walkUnits<decltype(rop), kUnit>;
 });
 
-/// Pixels of three bytes are combined byte by byte.
-uint32 unitOf(uint32 bytesPerPixel) { return bytesPerPixel == 3 ? 1 : bytesPerPixel; }
-
-void walkRows(const RopRows& rows, uint32 unit, uint32 rop, RopWalk walk) {
-  if (rows.bytes == 0) return;
+void walkRows(const RowPair& rows, uint32 unit, uint32 rop, Walk walk) {
   const auto& walkers = unit == 1 ? kWalkers<1> : unit == 2 ? kWalkers<2> : kWalkers<4>;
   walkers[rop](rows, walk);
 }
 
-/// Whether a kernel gives the result of the walk on the first row: nothing that it stores is to be
-/// read again within the next step. Steps to the right write ahead of the source where the
-/// destination lies at a higher address, steps to the left where it lies at a lower one.
-bool kernelEqualsWalk(const RopRows& rows, uint32 unit, RopWalk walk) {
-  const uintptr_t right =
-      reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
-  const uintptr_t ahead = walk == RopWalk::kToRight ? right : 0 - right;
-  return ahead == 0 || ahead >= std::max(kernels().stepBytes, size_t{unit}) || ahead >= rows.bytes;
+/// Steps to the right store ahead of where they read where the destination lies at a higher
+/// address, steps to the left where it lies at a lower one.
+Overlap overlapOf(const RowPair& rows, uint32 unit, uint32 rop, Walk walk) {
+  const uintptr_t ahead = walk == Walk::kToRight ? rows.ahead() : 0 - rows.ahead();
+  if (!ropReadsSource(rop) || ahead == 0 || ahead >= rows.bytes) return Overlap::kNone;
+  return ahead >= std::max(kernels().stepBytes, size_t{unit}) ? Overlap::kFar : Overlap::kNear;
 }
 
-/// The rows from the last one up.
-RopRows upwards(const RopRows& rows) {
-  const intptr_t dstStep = rows.dstStep;
-  const intptr_t srcStep = rows.srcStep;
-  return {.dst = rowAt(rows.dst, dstStep, rows.height - 1, 0, 0),
-          .dstStep = -dstStep,
-          .src = rowAt(rows.src, srcStep, rows.height - 1, 0, 0),
-          .srcStep = -srcStep,
-          .bytes = rows.bytes,
-          .height = rows.height};
-}
-
-/// Whether rows that are walked to the left may be walked from the last one up: memory is read
-/// fastest in one direction throughout. Allowed while no row meets another one.
-bool gainsFromUpwards(const RopRows& rows) {
-  const uintptr_t distance =
-      reinterpret_cast<uintptr_t>(rows.dst) - reinterpret_cast<uintptr_t>(rows.src);
-  return rows.height != 0 && rows.dstStep > 0 && distance < rows.bytes &&
-         distance + rows.bytes <= static_cast<uintptr_t>(rows.dstStep);
-}
-
-/// What ropRows does where the distance between source and destination is the same in every row.
-void evenRopRows(const RopRows& rows, uint32 unit, uint32 rop, RopWalk walk) {
-  if (!kernelEqualsWalk(rows, unit, walk)) {
-    walkRows(rows, unit, rop, walk);
-  } else if (walk == RopWalk::kToRight) {
-    kernels().toRight[rop](rows);
-  } else {
-    kernels().toLeft[rop](gainsFromUpwards(rows) ? upwards(rows) : rows);
+/// Where the distance between source and destination changes from row to row.
+HWY_NOINLINE void ropRowByRow(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk) {
+  RowPair row = {rows.dst, 0, rows.src, 0, rows.bytes, 1};
+  for (uint32 y = rows.rows; y != 0; --y) {
+    ropRows(row, bytesPerPixel, rop, walk);
+    row.dst = nextRow(row.dst, rows.dstStep);
+    row.src = nextRow(row.src, rows.srcStep);
   }
 }
 
@@ -286,19 +220,15 @@ int32 negated(int32 pitch) { return static_cast<int32>(0 - static_cast<uint32>(p
 
 }  // namespace
 
-void ropRows(const RopRows& rows, uint32 bytesPerPixel, uint32 rop, RopWalk walk) {
-  const uint32 unit = unitOf(bytesPerPixel);
-  if (rows.dstStep == rows.srcStep) {
-    evenRopRows(rows, unit, rop, walk);
-    return;
-  }
-  RopRows row = rows;
-  row.height = 1;
-  for (uint32 y = 0; y < rows.height; ++y) {
-    evenRopRows(row, unit, rop, walk);
-    row.dst = nextRow(row.dst, rows.dstStep);
-    row.src = nextRow(row.src, rows.srcStep);
-  }
+void ropRows(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk) {
+  if (rows.dstStep != rows.srcStep) return ropRowByRow(rows, bytesPerPixel, rop, walk);
+  const uint32 unit = bytesPerPixel == 3 ? 1 : bytesPerPixel;  // three bytes are three operations
+  const Overlap overlap = overlapOf(rows, unit, rop, walk);
+  if (overlap == Overlap::kNear) return walkRows(rows, unit, rop, walk);
+  const RopRowsKernel* const kernel =
+      kernels().rows[static_cast<size_t>(walk)][static_cast<size_t>(overlap)];
+  if (walk == Walk::kToLeft && rows.gainFromLast()) return kernel[rop](rows.inOrder(true));
+  kernel[rop](rows);
 }
 
 void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,
@@ -310,10 +240,11 @@ void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, u
     return;
   }
   const bool unsupported = bytesPerPixel < 1 || bytesPerPixel > 4;
-  RopWalk walk = RopWalk::kToRight;
+  // Two calls, as each walk has a line of its own in the message.
+  Walk walk = Walk::kToRight;
   if (srcY == dstY && dstX > srcX) {
     if (unsupported) unsupportedPixelSize(kSource);
-    walk = RopWalk::kToLeft;
+    walk = Walk::kToLeft;
   } else if (unsupported) {
     unsupportedPixelSize(kSource);
   }
@@ -327,7 +258,7 @@ void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, u
            .src = rowAt(src, pitchOf(srcPitch), srcY + firstRow, srcX, bytesPerPixel),
            .srcStep = rowStep(srcWalked, bytesPerPixel),
            .bytes = size_t{width} * bytesPerPixel,
-           .height = height},
+           .rows = height},
           bytesPerPixel, rop, walk);
 }
 
@@ -350,9 +281,9 @@ void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pix
     return;
   }
   const intptr_t step = rowStep(pitchOf(pitch), bytesPerPixel);
-  const RowRun run = joinRows(step, size_t{width} * bytesPerPixel, height);
-  kernels().fillRows(rowAt(fb, pitchOf(pitch), y, x, bytesPerPixel), step, run.bytes, run.rows,
-                     repeatPixel(constant.keep, bytesPerPixel),
+  const Rows rows = {rowAt(fb, pitchOf(pitch), y, x, bytesPerPixel), step,
+                     size_t{width} * bytesPerPixel, height};
+  kernels().fillRows(rows.joined(), repeatPixel(constant.keep, bytesPerPixel),
                      repeatPixel(constant.flip, bytesPerPixel));
 }
 

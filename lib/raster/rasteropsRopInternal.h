@@ -17,40 +17,33 @@ inline constexpr uint32 kRopNoop = 5;
 /// Whether an operation (0 to 15) depends on the source. A code is the operation's truth table.
 constexpr bool ropReadsSource(uint32 rop) { return (rop & 3) != rop >> 2; }
 
-/// Source rows and destination rows: the leftmost byte of the first row to be processed, the signed
-/// step to the next one, and the size of both.
-struct RopRows {
-  uint8* dst;
-  intptr_t dstStep;
-  const uint8* src;
-  intptr_t srcStep;
-  size_t bytes;
-  uint32 height;
+/// What a row that is its own source, or lies in it, meets of what it stored itself. Ahead is the
+/// direction of the walk.
+enum class Overlap {
+  kNone,  ///< nothing
+  kFar,   ///< it stores a vector or more ahead of where it reads: vectors in order give the walk
+  kNear   ///< nearer: only pixels in order do
 };
 
 /// Runs over rows of one instruction-set level, from the first row to the last one. Where there is
 /// more than one row, both steps are equal.
-using RopRowsKernel = void (*)(const RopRows& rows);
+using RopRowsKernel = void (*)(const RowPair& rows);
 
 /// What the kernels of one instruction-set level offer.
 struct RopKernels {
   /// A kernel handles at most so many bytes of a row before it stores them.
   size_t stepBytes;
   /// d = d & keep ^ flip.
-  void (*fillRows)(uint8* row, intptr_t step, size_t bytes, uint32 height, const PixelWords& keep,
-                   const PixelWords& flip);
-  /// By operation. Rows are walked to the right, or to the left.
-  const RopRowsKernel* toRight;
-  const RopRowsKernel* toLeft;
+  void (*fillRows)(const Rows& rows, const PixelWords& keep, const PixelWords& flip);
+  /// By walk, overlap (kNone, kFar) and operation.
+  const RopRowsKernel* rows[2][2];
 };
 
-/// The order of the pixels in a row.
-enum class RopWalk { kToRight, kToLeft };
-
-/// Applies operation `rop` (0 to 15) to rows of pixels of `bytesPerPixel` (1 to 4) bytes. The
-/// result is that of reading, combining and storing one pixel after the other (one byte after the
-/// other in pixels of three), wherever source and destination lie.
-void ropRows(const RopRows& rows, uint32 bytesPerPixel, uint32 rop, RopWalk walk);
+/// Applies operation `rop` (0 to 15) to rows of pixels of `bytesPerPixel` (1 to 4) bytes, given
+/// from the leftmost byte of the first row to be processed. The result is that of reading,
+/// combining and storing one pixel after the other (one byte after the other in pixels of three),
+/// wherever source and destination lie.
+void ropRows(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk);
 
 /// As Raster_RectROPcopy.
 void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,

@@ -27,7 +27,7 @@ constexpr size_t kBlockBytes = 1024;
 
 /// Combines a row with a source of the same length.
 template <class Rop, bool kFar> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
-  combineToRight<Rop>(dst, src, bytes);
+  combineInOrder<Rop, Walk::kToRight>(dst, src, bytes);
 }
 
 void copyRow(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
@@ -41,7 +41,7 @@ template <class Rop, bool kFar>
 void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                     size_t /*lastPhase*/) {
   for (size_t i = 0; i != bytes; i += std::min(bytes - i, period))
-    combineToRight<Rop>(dst + i, pattern, std::min(bytes - i, period));
+    combineInOrder<Rop, Walk::kToRight>(dst + i, pattern, std::min(bytes - i, period));
 }
 
 #else
@@ -345,8 +345,8 @@ void ropBlock(const Picture<uint8>& dst, const Picture<const uint8>& src, uint32
            .src = src.pixel(srcX, srcY, bytesPerPixel),
            .srcStep = rowStep(src.pitch, bytesPerPixel),
            .bytes = size_t{width} * bytesPerPixel,
-           .height = height},
-          bytesPerPixel, rop, RopWalk::kToRight);
+           .rows = height},
+          bytesPerPixel, rop, Walk::kToRight);
 }
 
 /// Cuts the rectangle into blocks that do not cross an edge of the pixmap. Pixmap pixel

@@ -16,6 +16,7 @@
 #include <utility>
 
 #include "baseTypes.h"
+#include "byteRows-inl.h"
 #include "hwy/highway.h"
 #include "rows-inl.h"
 
@@ -83,91 +84,25 @@ template <class Rop, class D> HWY_INLINE void combine(D d, const uint8* src, uin
   storeLanes(d, combined<Rop>(d, src, dst), dst);
 }
 
-/// Combines a row from left to right, a vector at a time.
-template <class Rop> HWY_INLINE void combineToRight(uint8* dst, const uint8* src, size_t bytes) {
+/// Combines a row in the order of a walk, a vector at a time.
+template <class Rop, Walk kWalk>
+HWY_INLINE void combineInOrder(uint8* dst, const uint8* src, size_t bytes) {
   const hn::ScalableTag<uint8> d8;
-  forLanes(d8, bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
+  const auto block = [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); };
+  if constexpr (kWalk == Walk::kToRight) {
+    forLanes(d8, bytes, block);
+  } else {
+    forLanesFromRight(d8, bytes, block);
+  }
 }
 
-/// Combines a row from right to left, a vector at a time.
-template <class Rop> HWY_INLINE void combineToLeft(uint8* dst, const uint8* src, size_t bytes) {
-  const hn::ScalableTag<uint8> d8;
-  forLanesFromRight(d8, bytes, [&](auto d, size_t i) { combine<Rop>(d, src + i, dst + i); });
-}
-
-// Where no step of a row reads what an earlier one stored, vectors may lie across each other, if
-// each is made before the one that it lies across is stored. So the two at the ends of a row lie
-// where the row does, those between them at vector boundaries, and rows of any length and place
-// take the same few branches.
-
-#if HWY_TARGET != HWY_SCALAR
-
-/// What an operation makes of the lanes at an offset of a row.
+/// What an operation makes of the lanes at an offset of a row (byteRows-inl.h).
 template <class Rop> struct CombinedAt {
   template <class D>
   HWY_INLINE hn::Vec<D> operator()(D d, const uint8* src, const uint8* dst, size_t at) const {
     return combined<Rop>(d, src + at, dst + at);
   }
 };
-
-/// Calls body(row), where row(dst, src, bytes) combines rows of `bytes`, at most two vectors: with
-/// the widest lanes that fit, from either end. combinedAt(tag, src, dst, offset) makes the lanes.
-template <class D, class CombinedAt, class Body>
-HWY_INLINE void withShortRow(D d, size_t bytes, const CombinedAt& combinedAt, const Body& body) {
-  constexpr size_t n = kLanes<D>;
-  if (bytes > n) {
-    body([&, d](uint8* dst, const uint8* src, size_t size) HWY_ATTR {
-      const auto first = combinedAt(d, src, dst, 0);
-      const auto last = combinedAt(d, src, dst, size - n);
-      storeLanes(d, first, dst);
-      storeLanes(d, last, dst + size - n);
-    });
-  } else if (bytes == n) {
-    body([&, d](uint8* dst, const uint8* src, size_t)
-             HWY_ATTR { storeLanes(d, combinedAt(d, src, dst, 0), dst); });
-  } else if constexpr (n > 1) {
-    withShortRow(hn::Half<D>(), bytes, combinedAt, body);
-  }
-}
-
-/// combineToRight where no step reads what an earlier one stored, for rows longer than a vector.
-template <class Rop>
-HWY_INLINE void combineLongToRight(uint8* dst, const uint8* src, size_t bytes) {
-  const hn::ScalableTag<uint8> d;
-  constexpr size_t n = kLanes<decltype(d)>;
-  const size_t lastAt = bytes - n;
-  auto block = combined<Rop>(d, src, dst);
-  size_t at = 0;
-  for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < lastAt; i += n) {
-    const auto next = combined<Rop>(d, src + i, dst + i);
-    storeLanes(d, block, dst + at);
-    block = next;
-    at = i;
-  }
-  const auto last = combined<Rop>(d, src + lastAt, dst + lastAt);
-  storeLanes(d, block, dst + at);
-  storeLanes(d, last, dst + lastAt);
-}
-
-/// combineToLeft where no step reads what an earlier one stored, for rows longer than a vector.
-template <class Rop> HWY_INLINE void combineLongToLeft(uint8* dst, const uint8* src, size_t bytes) {
-  const hn::ScalableTag<uint8> d;
-  constexpr size_t n = kLanes<decltype(d)>;
-  size_t at = bytes - n;
-  auto block = combined<Rop>(d, src + at, dst + at);
-  for (size_t end = bytes - 1 - (reinterpret_cast<uintptr_t>(dst) + bytes - 1) % n; end > n;
-       end -= n) {
-    const auto next = combined<Rop>(d, src + end - n, dst + end - n);
-    storeLanes(d, block, dst + at);
-    block = next;
-    at = end - n;
-  }
-  const auto first = combined<Rop>(d, src, dst);
-  storeLanes(d, block, dst + at);
-  storeLanes(d, first, dst);
-}
-
-#endif
 
 /// A table by code of what `entry` makes of each operation.
 template <class Entry> constexpr auto ropTable(Entry entry) {

@@ -25,8 +25,9 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace hn = hwy::HWY_NAMESPACE;
 
-/// The number of lanes of a tag, at compile time.
+/// The number of lanes of a tag, at compile time, and whether there are vectors of half as many.
 template <class D> inline constexpr size_t kLanes = hn::MaxLanes(D());
+template <class D> inline constexpr bool kHasHalf = kLanes<D> >= 2;
 
 /// Loads and stores lanes of any width at any alignment.
 template <class D> HWY_INLINE hn::Vec<D> loadLanes(D d, const uint8* at) {
@@ -65,6 +66,30 @@ HWY_INLINE void fetchAhead(const uint8* at) {
   __builtin_prefetch(nextRow(at, kAhead));
 }
 
+/// Runs row(dst) from the first row to the last one.
+template <class Row> HWY_INLINE void forRows(const Rows& rows, const Row& row) {
+  const intptr_t step = rows.step;  // read here, as a store to a pixel might change it
+  uint8* dst = rows.first;
+  for (uint32 y = rows.rows; y != 0; --y, dst = nextRow(dst, step)) row(dst);
+}
+
+/// Runs row(dst, src) from the first row to the last one, with the steps that are given.
+template <class Row>
+HWY_INLINE void forRows(const RowPair& rows, intptr_t dstStep, intptr_t srcStep, const Row& row) {
+  uint8* dst = rows.dst;
+  const uint8* src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y, dst = nextRow(dst, dstStep), src = nextRow(src, srcStep))
+    row(dst, src);
+}
+template <class Row> HWY_INLINE void forRows(const RowPair& rows, const Row& row) {
+  forRows(rows, rows.dstStep, rows.srcStep, row);
+}
+
+/// The same for rows whose steps are equal: one register less.
+template <class Row> HWY_INLINE void forRowsInStep(const RowPair& rows, const Row& row) {
+  forRows(rows, rows.dstStep, rows.dstStep, row);
+}
+
 /// Runs body(tag, first) for the rest of a row that is shorter than two blocks of `d`.
 template <class D, class Body>
 HWY_INLINE void forRestOfLanes(D d, size_t first, size_t count, const Body& body) {
@@ -72,7 +97,7 @@ HWY_INLINE void forRestOfLanes(D d, size_t first, size_t count, const Body& body
     body(d, first);
     first += hn::Lanes(d);
   }
-  if constexpr (kLanes < D >> 1) {
+  if constexpr (kHasHalf<D>) {
     if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
   }
 }
@@ -83,7 +108,7 @@ template <class D, class Body> HWY_INLINE void forLanes(D d, size_t count, const
   const size_t step = hn::Lanes(d);
   size_t first = 0;
   for (; count - first >= step; first += step) body(d, first);
-  if constexpr (kLanes < D >> 1) {
+  if constexpr (kHasHalf<D>) {
     if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
   }
 }
@@ -95,7 +120,7 @@ HWY_INLINE void forRestOfLanesFromRight(D d, size_t count, const Body& body) {
     count -= hn::Lanes(d);
     body(d, count);
   }
-  if constexpr (kLanes < D >> 1) {
+  if constexpr (kHasHalf<D>) {
     if (count != 0) forRestOfLanesFromRight(hn::Half<D>(), count, body);
   }
 }
@@ -105,7 +130,7 @@ template <class D, class Body>
 HWY_INLINE void forLanesFromRight(D d, size_t count, const Body& body) {
   const size_t step = hn::Lanes(d);
   for (; count >= step; count -= step) body(d, count - step);
-  if constexpr (kLanes < D >> 1) {
+  if constexpr (kHasHalf<D>) {
     if (count != 0) forRestOfLanesFromRight(hn::Half<D>(), count, body);
   }
 }
