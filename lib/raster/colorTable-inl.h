@@ -70,7 +70,7 @@ template <class To> class ColorTable {
     const uint8* const palette = palette_;
     for (size_t i = known_; i < count; ++i) {
       const uint32 color = loadPixel<4>(palette + i * sizeof(uint32));
-      const uint32 pixel = kHalves == 2 ? color : convertColor<Code32, To>(color);
+      const uint32 pixel = kSameFields<Code32, To> ? color : convertColor<Code32, To>(color);
       halves_[0][i] = static_cast<uint16>(pixel);
       if constexpr (kHalves == 2) halves_[1][i] = static_cast<uint16>(pixel >> 16);
     }

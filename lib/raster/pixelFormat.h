@@ -7,6 +7,7 @@
 #define RASTER_PIXEL_FORMAT_H
 
 #include <tuple>
+#include <type_traits>
 
 #include "baseTypes.h"
 
@@ -35,6 +36,13 @@ using Code16 = PixelFormat<16, 2, Field<11, 5>, Field<5, 6>, Field<0, 5>>;
 using Code24 = PixelFormat<24, 3, Field<16, 8>, Field<8, 8>, Field<0, 8>>;
 using Code32 = PixelFormat<32, 4, Field<16, 8>, Field<8, 8>, Field<0, 8>>;
 
+/// Whether two formats have the same channels in the same places: pixel values of codes 24 and 32
+/// are told apart in memory only.
+template <class A, class B>
+inline constexpr bool kSameFields =
+    std::is_same_v<typename A::Red, typename B::Red>&& std::is_same_v<
+        typename A::Green, typename B::Green>&& std::is_same_v<typename A::Blue, typename B::Blue>;
+
 /// `value` shifted right, or left where kRight is negative.
 template <int kRight> constexpr uint32 shiftedRight(uint32 value) {
   if constexpr (kRight < 0) {
@@ -51,7 +59,8 @@ template <class From, class To> struct ChannelMove {
   static constexpr uint32 kTopMask = shiftedRight<kRight>(From::kMask) & To::kMask;
   static constexpr int kRepeatRight = From::kBits;
   static constexpr uint32 kRepeatMask = To::kMask & ~kTopMask;
-  static_assert(To::kBits <= 2 * From::kBits);
+  static_assert(To::kBits <= 2 * From::kBits,
+                "a channel at most doubles its bits: the top ones are repeated once");
 
   static constexpr uint32 apply(uint32 pixel) {
     const uint32 top = shiftedRight<kRight>(pixel) & kTopMask;

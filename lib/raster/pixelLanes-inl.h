@@ -83,7 +83,13 @@ HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
     tops = hn::OrAnd(tops, green, setMask(d, G::kTopMask));
     tops = hn::OrAnd(tops, shiftLanes<R::kRight>(pixels), setMask(d, R::kTopMask));
   }
-  return addRepeated<Move, 6>(d, addRepeated<Move, 5>(d, tops, tops), tops);
+  // Every distance once: the mask of a distance has the bits of all channels that have it.
+  auto color = addRepeated<Move, R::kRepeatRight>(d, tops, tops);
+  if constexpr (G::kRepeatRight != R::kRepeatRight)
+    color = addRepeated<Move, G::kRepeatRight>(d, color, tops);
+  if constexpr (B::kRepeatRight != R::kRepeatRight && B::kRepeatRight != G::kRepeatRight)
+    color = addRepeated<Move, B::kRepeatRight>(d, color, tops);
+  return color;
 }
 
 // ---- Order of bytes and lanes ------------------------------------------------------------------
@@ -220,7 +226,7 @@ template <class D, size_t kVectors> constexpr Words<D> unzipParts() {
 template <size_t kVectors, class D> HWY_INLINE void storeZipped(D d, hn::Vec<D> zipped, uint8* at) {
   static constexpr BytesOfPart kUnzip = evenThenOddBytes();
   auto bytes = chooseBytes(d, zipped, kUnzip);
-  if constexpr (kLanes < D >> 8) {
+  if constexpr (kLanes<D> >= 16) {
     static constexpr Words<D> kOrder = unzipParts<D, kVectors>();
     bytes = chooseWords(d, bytes, kOrder);
   }
@@ -262,15 +268,17 @@ template <class D> HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, ui
 /// One channel of 16-bit pixels widened to 8 bits: v of b bits, repeated, is v times
 /// (2^b + 1) * 2^(8 - 2b), rounded down.
 template <class F, class D> HWY_INLINE hn::Vec<D> widenChannel(D d, hn::Vec<D> pixels) {
+  static_assert(F::kBits >= 4 && F::kBits <= 8, "channels of 4 to 8 bits are widened");
   constexpr int kLow = F::kTop - F::kBits;
-  constexpr int kAt = kLow == 0 ? 16 - F::kBits : kLow;  // so that the factor fits 16 bits
-  constexpr uint32 kFactor = ((1u << F::kBits) + 1) << (24 - 2 * F::kBits - kAt);
-  static_assert(kFactor <= 0xFFFF);
-  if constexpr (kLow == 0) {
-    return hn::MulHigh(hn::ShiftLeft<kAt>(pixels), setMask(d, kFactor));
-  } else {
-    return hn::MulHigh(hn::And(pixels, setMask(d, F::kMask)), setMask(d, kFactor));
-  }
+  constexpr auto factorAt = [](int low) {
+    return uint64{(1u << F::kBits) + 1} << (24 - 2 * F::kBits - low);
+  };
+  // Where the channel lies when it is multiplied: at the top unless its factor fits 16 bits.
+  constexpr bool kStays = kLow != 0 && factorAt(kLow) <= 0xFFFF;
+  constexpr int kUp = kStays ? 0 : 16 - F::kTop;
+  auto channel = shiftLanes<-kUp>(pixels);
+  if constexpr (kLow != 0) channel = hn::And(channel, setMask(d, F::kMask << kUp));
+  return hn::MulHigh(channel, setMask(d, static_cast<uint32>(factorAt(kLow + kUp))));
 }
 
 /// The order of quarters that makes the lower and upper halves of a vector's parts, when
@@ -317,6 +325,7 @@ template <class From, class D> HWY_INLINE Block<D> loadWidened(D d, const uint8*
 // ---- Blocks of any pixel size ------------------------------------------------------------------
 
 template <unsigned kBytes, class D> HWY_INLINE Block<D> loadBlock(D d, const uint8* at) {
+  static_assert(kBytes >= 2 && kBytes <= 4, "no source has pixels of another size");
   if constexpr (kBytes == 3) {
     return loadTripleBlock(d, at);
   } else {

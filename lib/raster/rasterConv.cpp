@@ -2,6 +2,8 @@
 //
 // Pixel formats: display modes, format codes, and the conversion of one pixel and of rectangles.
 
+#include <type_traits>
+
 #include "panicPlace.h"
 #include "raster.h"
 #include "rasterConvInternal.h"
@@ -21,29 +23,21 @@ uint8* bytesOf(void* memory) { return static_cast<uint8*>(memory); }
   unsupportedNumber("Raster convert pixels invalid depth for pseudo color %d\n", depth, at);
 }
 
-/// How far right the top bits of a channel are shifted into a one-byte pixel.
-struct LowDepthShifts {
-  int red, green, blue;
-};
-template <class From> constexpr LowDepthShifts kLowDepthShifts{21, 10, 0};
-template <> constexpr LowDepthShifts kLowDepthShifts<Code16>{13, 5, -3};
-template <> constexpr LowDepthShifts kLowDepthShifts<Code15>{12, 4, -3};
-
-/// Deliberate: the shifts are those of the channels of codes 8 and 3 whatever the destination, so
-/// code 6 takes other bits than the top ones of each channel (those of rectangles are right).
-template <class From, class To> constexpr uint32 convertOneToByte(uint32 pixel) {
-  constexpr LowDepthShifts kShifts = kLowDepthShifts<From>;
-  return (shiftedRight<kShifts.red>(pixel) & To::Red::kMask) |
-         (shiftedRight<kShifts.green>(pixel) & To::Green::kMask) |
-         (shiftedRight<kShifts.blue>(pixel) & To::Blue::kMask);
+/// Deliberate: the shifts are those to code 8, so a single pixel of code 6 takes other bits than
+/// the top ones of each channel (those of rectangles are right).
+template <class From> constexpr uint32 convertOneToCode6(uint32 pixel) {
+  using Move = ColorMove<From, Code8>;
+  return (shiftedRight<Move::Red::kRight>(pixel) & Code6::Red::kMask) |
+         (shiftedRight<Move::Green::kRight>(pixel) & Code6::Green::kMask) |
+         (shiftedRight<Move::Blue::kRight>(pixel) & Code6::Blue::kMask);
 }
 
-/// A pixel value in another format. Values of codes 24 and 32 are the same here, and a value that
-/// already has the format stays whole, unused bits included.
+/// A pixel value in another format. One whose channels lie there already stays whole, unused bits
+/// included.
 template <class From, class To> constexpr uint32 convertOne(uint32 pixel) {
-  if constexpr (To::kBytes == 1) {
-    return convertOneToByte<From, To>(pixel);
-  } else if constexpr (From::kBytes == To::kBytes && From::Green::kBits == To::Green::kBits) {
+  if constexpr (std::is_same_v<To, Code6>) {
+    return convertOneToCode6<From>(pixel);
+  } else if constexpr (kSameFields<From, To>) {
     return pixel;
   } else {
     return convertColor<From, To>(pixel);
@@ -52,44 +46,34 @@ template <class From, class To> constexpr uint32 convertOne(uint32 pixel) {
 
 /// `read` gives the value; it is called only when the destination is known to be right.
 template <class From, class Read> uint32 convertOneFrom(int32 dstDepth, Read read) {
-  switch (dstDepth) {
-    case 3:
-      return convertOne<From, Code3>(read());
-    case 6:
-      return convertOne<From, Code6>(read());
-    case 8:
-      return convertOne<From, Code8>(read());
-    case 15:
-      return convertOne<From, Code15>(read());
-    case 16:
-      return convertOne<From, Code16>(read());
-    case 24:
-    case 32:
-      return convertOne<From, Code32>(read());
-    default:
-      unsupportedNumber("Raster convert one pixel invalid depth %d\n", dstDepth, kSource);
-  }
+  uint32 result = 0;
+  const bool known = withFormat<DestinationFormats>(dstDepth, [&](auto to, size_t /*index*/) {
+    result = convertOne<From, decltype(to)>(read());
+  });
+  if (!known) unsupportedNumber("Raster convert one pixel invalid depth %d\n", dstDepth, kSource);
+  return result;
+}
+
+uint32 convertPaletteEntry(uint32 pixel, int32 srcDepth, int32 dstDepth, const uint32* palette) {
+  if (srcDepth != kMaxPseudoColorDepth) badPseudoColorDepth(srcDepth, kSource);
+  return convertOneFrom<Code32>(dstDepth,
+                                [=] { return loadPixel<4>(entryAt(bytesOf(palette), pixel)); });
+}
+
+uint32 convertColorPixel(uint32 pixel, int32 srcDepth, int32 dstDepth) {
+  uint32 result = 0;
+  const bool known = withFormat<SourceFormats>(srcDepth, [&](auto from, size_t /*index*/) {
+    result = convertOneFrom<decltype(from)>(dstDepth, [=] { return pixel; });
+  });
+  if (!known)
+    unsupportedNumber("Raster convert one pixel invalid source depth %d\n", srcDepth, kSource);
+  return result;
 }
 
 uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool pseudoColor,
                        const uint32* palette) {
-  if (pseudoColor) {
-    if (srcDepth != kMaxPseudoColorDepth) badPseudoColorDepth(srcDepth, kSource);
-    return convertOneFrom<Code32>(dstDepth,
-                                  [=] { return loadPixel<4>(entryAt(bytesOf(palette), pixel)); });
-  }
-  const auto value = [=] { return pixel; };
-  switch (srcDepth) {
-    case 15:
-      return convertOneFrom<Code15>(dstDepth, value);
-    case 16:
-      return convertOneFrom<Code16>(dstDepth, value);
-    case 24:
-    case 32:
-      return convertOneFrom<Code32>(dstDepth, value);
-    default:
-      unsupportedNumber("Raster convert one pixel invalid source depth %d\n", srcDepth, kSource);
-  }
+  return pseudoColor ? convertPaletteEntry(pixel, srcDepth, dstDepth, palette)
+                     : convertColorPixel(pixel, srcDepth, dstDepth);
 }
 
 /// A rectangle to be converted: the buffers and the positions in them.
@@ -101,9 +85,12 @@ struct Rectangle {
   uint32 srcX, srcY, dstX, dstY, width, height;
 };
 
+/// Codes that are no formats are copied too, by their eighth.
 uint32 bytesPerPixelOf(int32 depth) {
-  if (depth == 3 || depth == 6) return 1;
-  return depth == 15 ? 2 : static_cast<uint32>(depth / 8);
+  uint32 bytes = static_cast<uint32>(depth / 8);
+  withFormat<DestinationFormats>(
+      depth, [&](auto format, size_t /*index*/) { bytes = decltype(format)::kBytes; });
+  return bytes;
 }
 
 void copyPixels(const Rectangle& r, int32 depth) {

@@ -25,16 +25,16 @@ struct Palette {
   static constexpr unsigned kBytes = 1;
 };
 
-constexpr uint32 kOpaque = 0xFF000000;
+/// What converted colours have in the bits outside the channels: they are opaque.
+template <class To> inline constexpr uint32 kOpaque = To::kBytes == 4 ? 0xFF000000 : 0;
 
 template <class From, class To>
 uint32 loadConverted(const uint8* at, [[maybe_unused]] const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
     const uint32 color = loadPixel<4>(entryAt(palette, *at));
-    return std::is_same_v<To, Code32> ? color : convertColor<Code32, To>(color);
+    return kSameFields<Code32, To> ? color : convertColor<Code32, To>(color);
   } else {
-    const uint32 color = convertColor<From, To>(loadPixel<From::kBytes>(at));
-    return std::is_same_v<To, Code32> ? color | kOpaque : color;
+    return convertColor<From, To>(loadPixel<From::kBytes>(at)) | kOpaque<To>;
   }
 }
 
@@ -86,12 +86,13 @@ template <class From, class To> void convertRows(const RowPair& rows, const uint
 template <class From, class To, class D>
 HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
   if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
+    static_assert(kSameFields<To, Code32>, "16-bit pixels are widened to codes 24 and 32 only");
     return loadWidened<From>(d, src);
   } else {
     Block<D> block = loadBlock<From::kBytes>(d, src);
     for (auto& lanes : block.v) {
-      if constexpr (To::kBytes <= 2) lanes = convertLanes<From, To>(d, lanes);
-      if constexpr (To::kBytes == 4) lanes = hn::Or(lanes, hn::Set(d, kOpaque));
+      if constexpr (!kSameFields<From, To>) lanes = convertLanes<From, To>(d, lanes);
+      if constexpr (kOpaque<To> != 0) lanes = hn::Or(lanes, hn::Set(d, kOpaque<To>));
     }
     return block;
   }
