@@ -148,7 +148,7 @@ TEST_F(ImageUtil_ConstructBMPBuffer, EqualsTheModelInBothDirections) {
   };
   const Format formats[] = {{1, 1}, {4, 4}, {8, 8}, {15, 16}, {16, 16}, {24, 24}, {24, 32}};
   Random random(1);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const Format f = formats[random.below(7)];
     const uint32 width = random.below(20) == 0 ? 3000 + random.below(20000) : random.below(70);
     const uint32 height = random.below(30);

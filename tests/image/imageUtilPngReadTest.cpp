@@ -222,7 +222,7 @@ TEST_F(ImageUtil_ReadPNGBuffer, DecodesEveryFormatWithEverySettingOfLibpng) {
   const int filters[] = {PNG_FILTER_NONE, PNG_FILTER_SUB,   PNG_FILTER_UP,
                          PNG_FILTER_AVG,  PNG_FILTER_PAETH, PNG_ALL_FILTERS};
   Random random(1);
-  for (int round = 0; round < 600; ++round) {
+  for (int round = 0; round < tests::rounds(600); ++round) {
     const Kind kind = kinds[random.below(8)];
     PngPicture p =
         noise(random, 1 + random.below(40), 1 + random.below(20), kind.colorType, kind.bitDepth);
@@ -616,7 +616,7 @@ TEST_F(ImageUtil_ReadPNG, EndsWithTheBytesThatWereReadWhateverFollowsThem) {
 TEST_F(ImageUtil_ReadPNG, SurvivesRandomDamage) {
   const WithoutStandardError quiet;
   Random random(15);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const int type =
         random.oneOf<int>({PNG_COLOR_TYPE_PALETTE, PNG_COLOR_TYPE_RGB, PNG_COLOR_TYPE_RGB_ALPHA});
     PngPicture p = noise(random, 1 + random.below(20), 1 + random.below(10), type, 8);

@@ -169,7 +169,7 @@ TEST_F(ImageUtil_ConstructPNGBuffer, WritesEveryFormatInBothDirections) {
   };
   const Format formats[] = {{8, 8}, {1, 1}, {4, 4}, {15, 16}, {16, 16}, {24, 24}, {24, 32}};
   Random random(1);
-  for (int round = 0; round < 400; ++round) {
+  for (int round = 0; round < tests::rounds(400); ++round) {
     const Format f = formats[random.below(7)];
     Picture picture = noise(random, 1 + random.below(40), 1 + random.below(20), f.depth, f.bpp,
                             2 * random.below(4));

@@ -329,7 +329,7 @@ TEST_F(ImageUtil_Combine, EqualsTheModel) {
   };
   const Format formats[] = {{15, 16}, {16, 16}, {24, 24}, {24, 32}};
   Random random(3);
-  for (int round = 0; round < 500; ++round) {
+  for (int round = 0; round < tests::rounds(500); ++round) {
     const Format f = formats[random.below(4)];
     std::vector<Placed> placed;
     Grid grid;
@@ -491,7 +491,7 @@ TEST_F(ImageUtil_CropAndScaleImage, CopiesTheWholeImageIntoAFreshBuffer) {
 
 TEST_F(ImageUtil_CropAndScaleImage, CutsPixelByPixelAndZeroesThePadding) {
   Random random(11);
-  for (int round = 0; round < 400; ++round) {
+  for (int round = 0; round < tests::rounds(400); ++round) {
     const uint32 bpp = random.oneOf({8u, 16u, 24u, 32u});
     const Picture picture = noise(random, 2 + random.below(30), 1 + random.below(20),
                                   bpp == 32 ? 24 : bpp, bpp, random.below(7));
@@ -551,7 +551,7 @@ TEST_F(ImageUtil_CropAndScaleImage, CopiesAFullWidthAsOneBlock) {
 
 TEST_F(ImageUtil_CropAndScaleImage, ScalesAsTheScalerDoes) {
   Random random(13);
-  for (int round = 0; round < 100; ++round) {
+  for (int round = 0; round < tests::rounds(100); ++round) {
     const uint32 bpp = random.oneOf({8u, 16u, 24u, 32u});
     const Picture picture =
         noise(random, 2 + random.below(30), 2 + random.below(20), bpp == 32 ? 24 : bpp, bpp);

@@ -160,7 +160,7 @@ template <class Draw> void withAllFunctions(uint64 seed, const Draw& draw) {
   Random random(seed);
   for (const uint8_t depth : {uint8_t{24}, uint8_t{16}}) {
     Picture picture(random, depth, kWidth, kHeight);
-    for (int round = 0; round < 8; ++round) {
+    for (int round = 0; round < tests::rounds(8); ++round) {
       for (uint32 rop = 0; rop < 16; ++rop) {
         draw(random, picture, rop);
         picture.expectEqual();

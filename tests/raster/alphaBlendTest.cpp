@@ -172,7 +172,7 @@ void expectRow(const Bytes& before, const Bytes& source, const BlendFormat& f, c
 
 TEST(Raster_AlphaBlend, EqualsTheModelAndTouchesNothingElse) {
   Random random(1);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     const BlendFormat& f = kBlendFormats[random.below(6)];
     const Place p = somePlace(random, f);
     const Blend b = someBlend(random);
@@ -250,7 +250,7 @@ TEST(Raster_AlphaBlend, WritesByte3BackOnlyWithinRowsOfLevelsWithoutMasks) {
 
 TEST(Raster_AlphaBlend, WalksFromPixelToPixelOrChunkToChunkWhereSourceAndDestinationOverlap) {
   Random random(2);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     const BlendFormat& f = kBlendFormats[random.below(6)];
     Place p = somePlace(random, f);
     p.srcBase = random.below(300);

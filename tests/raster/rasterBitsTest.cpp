@@ -87,7 +87,7 @@ Plane somePlane(Random& random) {
 
 TEST(Raster_BitsToPixels, EqualsTheModelAndReadsNoByteTooMany) {
   Random random(1);
-  for (int round = 0; round < 10000; ++round) {
+  for (int round = 0; round < tests::rounds(10000); ++round) {
     const Plane p = somePlane(random);
     const Bytes plane = random.bytes(p.bitsRange(0).size());
     const Bytes before = random.bytes(p.dstRange(0).size());
@@ -110,7 +110,7 @@ TEST(Raster_BitsToPixels, EqualsTheModelAndReadsNoByteTooMany) {
 
 TEST(Raster_BitsToPixels, LooksAtThePlaneForEveryFourPixelsWhereItLiesInTheRectangle) {
   Random random(2);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     Plane p = somePlane(random);
     if (random.below(4) == 0) p.dstPitch = random.below(p.dstPitch + 1);
     const ByteRange alone = p.dstRange(0);

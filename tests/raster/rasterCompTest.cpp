@@ -116,7 +116,7 @@ struct Buffers {
 
 TEST(Raster_ComparePixels, FindsEqualRectanglesEqualWithinDifferentSurroundings) {
   Random random(1);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     const Case c = someCase(random);
     Buffers buffers(random, c);
     ASSERT_EQ(buffers.compare(c), 0) << "round " << round << ": " << c.describe();
@@ -125,7 +125,7 @@ TEST(Raster_ComparePixels, FindsEqualRectanglesEqualWithinDifferentSurroundings)
 
 TEST(Raster_ComparePixels, HasTheSignOfTheFirstDifference) {
   Random random(2);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     Case c = someCase(random);
     if (c.width == 0) c.width = 1;
     if (c.height == 0) c.height = 1;
@@ -299,7 +299,7 @@ Images someImages(Random& random, int32 bpp) {
 
 TEST(Raster_CompareMasked, EqualsTheModelAroundTheExactNumberOfDifferences) {
   Random random(4);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const int32 bpp = random.oneOf({8, 5, 16, 15, 24, 32, 25, 40});
     const Images images = someImages(random, bpp);
     // The least tolerance that lets the images pass.

@@ -135,7 +135,7 @@ Words someRuns(Random& random, size_t count, uint32 longest, uint32 colours) {
 
 TEST(Raster_Compress, EqualsTheModelForRunsOfAllKinds) {
   Random random(1);
-  for (int round = 0; round < 12000; ++round) {
+  for (int round = 0; round < tests::rounds(12000); ++round) {
     const size_t count = random.below(round % 50 == 0 ? 5000 : 150);
     const uint32 longest = random.oneOf({1u, 2u, 3u, 4u, 6u, 20u, 90u, 400u});
     const uint32 colours = random.oneOf({1u, 2u, 3u, 1000000000u});
@@ -275,7 +275,7 @@ TEST(Raster_Compress, PanicsForOtherDepthsAtLine114) {
 
 TEST(Raster_Decompress, ExpandsEveryCodeAsTheModelDoes) {
   Random random(4);
-  for (int round = 0; round < 8000; ++round) {
+  for (int round = 0; round < tests::rounds(8000); ++round) {
     Words code;
     const uint32 longest = random.oneOf({1u, 3u, 40u, 300u});
     for (uint32 words = 1 + random.below(60); words != 0; --words)

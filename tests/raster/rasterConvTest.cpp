@@ -323,7 +323,7 @@ void checkRandomRectangle(Random& random, const Pair& pair) {
 TEST(Raster_ConvertPixels, EqualsTheModelAndTouchesNothingElse) {
   Random random(3);
   for (const Pair& pair : allPairs()) {
-    for (int round = 0; round < 150; ++round) {
+    for (int round = 0; round < tests::rounds(150); ++round) {
       checkRandomRectangle(random, pair);
       if (HasFatalFailure()) FAIL() << "round " << round;
     }

@@ -70,7 +70,7 @@ TEST(Raster_CalculateCursorSize, IsAllOnesWhereAStepOverflows) {
 
 TEST(Raster_CalculateCursorSize, EqualsTheModelAroundItsLimits) {
   Random random(1);
-  for (int round = 0; round < 100000; ++round) {
+  for (int round = 0; round < tests::rounds(100000); ++round) {
     const auto some = [&](uint32 around) { return around + random.below(5) - 2; };
     const uint32 bits = random.oneOf({0u, 1u, 8u, 16u, 24u, 32u, random.word()});
     const uint32 width =
@@ -88,7 +88,7 @@ TEST(Raster_CalculateCursorSize, EqualsTheModelAroundItsLimits) {
 
 TEST(Raster_ExpandCursorBitPlane, EqualsTheModelAndLeavesThePaddingAlone) {
   Random random(2);
-  for (int round = 0; round < 500; ++round) {
+  for (int round = 0; round < tests::rounds(500); ++round) {
     const uint32 width = random.below(70);
     const uint32 height = random.below(9);
     const uint32 bpp = random.oneOf({8u, 16u, 24u, 32u});
@@ -115,7 +115,7 @@ TEST(Raster_ExpandCursorBitPlane, PanicsWhereThePlaneIsLargerThanItsBuffer) {
 
 TEST(Raster_ExpandPlanarCursorData, ExpandsOrCopiesEachPlaneOnItsOwn) {
   Random random(3);
-  for (int round = 0; round < 500; ++round) {
+  for (int round = 0; round < tests::rounds(500); ++round) {
     const uint32 width = random.below(40);
     const uint32 height = random.below(9);
     const uint32 bpp = random.oneOf({1u, 8u, 16u, 24u, 32u});
@@ -316,7 +316,7 @@ Bytes drawn(const Scene& s, Bytes into, uint32 pitch, uint32 x, uint32 y) {
 
 TEST(Raster_DrawCursor, DrawsBothKindsIntoTheFrameBuffer) {
   Random random(4);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const Format& format = kFormats[random.below(5)];
     Scene s = someScene(random, random.below(2), format);
     const Planes planes(s);
@@ -331,7 +331,7 @@ TEST(Raster_DrawCursor, DrawsBothKindsIntoTheFrameBuffer) {
 
 TEST(Raster_DrawCursor, DrawsIntoACopyAndLeavesTheFrameBufferUnchanged) {
   Random random(5);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const Format& format = kFormats[random.below(5)];
     Scene s = someScene(random, random.below(2), format);
     const Planes planes(s);

@@ -169,7 +169,7 @@ struct Pair {
 TEST(Raster_RectList, HoldsTheCanonicalRectanglesOfTheBitmap) {
   Random random(1);
   uint32 boxes = 0;
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     Pair pair;
     const auto largest = static_cast<uint32>(random.oneOf({3, 8, 20}));
     for (int step = 0; step < 30; ++step) {
@@ -196,7 +196,7 @@ TEST(Raster_RectList, HoldsTheCanonicalRectanglesOfTheBitmap) {
 
 TEST(Raster_RectList, IsEmptyAgainAfterAddingAndSubtractingTheSame) {
   Random random(2);
-  for (int round = 0; round < 1000; ++round) {
+  for (int round = 0; round < tests::rounds(1000); ++round) {
     RectList list = {};
     Entries added;
     for (int i = 0; i < 4; ++i) {
@@ -256,7 +256,7 @@ void checkAgainstModel(const RectList& before, const RectListEntry& r, bool subt
 
 TEST(Raster_RectList, EqualsTheModelForAnyList) {
   Random random(3);
-  for (int round = 0; round < 60000; ++round) {
+  for (int round = 0; round < tests::rounds(60000); ++round) {
     const int32 size = random.oneOf({3, 8, 30, 1000, 0x20000000});
     const RectList before = someList(random, size);
     const RectListEntry r = {random.between(-size, size), random.between(-size, size),
@@ -269,7 +269,7 @@ TEST(Raster_RectList, EqualsTheModelForAnyList) {
 
 TEST(Raster_RectList, EqualsTheModelWhereRectanglesTouchAndCoincide) {
   Random random(4);
-  for (int round = 0; round < 60000; ++round) {
+  for (int round = 0; round < tests::rounds(60000); ++round) {
     // A grid of a few lines, so that edges meet all the time.
     RectList before = {};
     const uint32 filled = 1 + random.below(16);
@@ -286,7 +286,7 @@ TEST(Raster_RectList, EqualsTheModelWhereRectanglesTouchAndCoincide) {
 
 TEST(Raster_RectList, EqualsTheModelForBandsBelowOneAnother) {
   Random random(6);
-  for (int round = 0; round < 60000; ++round) {
+  for (int round = 0; round < tests::rounds(60000); ++round) {
     // Bands of one rectangle each, some of which touch or continue, and some that spoil the order.
     RectList before = {};
     const uint32 filled = 1 + random.below(16);
@@ -307,7 +307,7 @@ TEST(Raster_RectList, EqualsTheModelForBandsBelowOneAnother) {
 
 TEST(Raster_RectList, EqualsTheModelOverLongSequences) {
   Random random(5);
-  for (int round = 0; round < 2000; ++round) {
+  for (int round = 0; round < tests::rounds(2000); ++round) {
     const int32 size = random.oneOf({5, 20, 100});
     RectList list = {};
     for (int step = 0; step < 30; ++step) {

@@ -231,7 +231,7 @@ TEST(Raster_Scale, EqualsTheModelWhereDestinationRowsOverlap) {
 /// Positions wrap at 32 bits: horizontal ones go on unsigned, vertical ones turn negative.
 TEST(Raster_Scale, EqualsTheModelWherePositionsWrap) {
   Random random(3);
-  for (int round = 0; round < 300; ++round) {
+  for (int round = 0; round < tests::rounds(300); ++round) {
     ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
     c.dstWidth = 32767 - random.below(3);
     c.dstHeight = 32767 - random.below(3);
@@ -260,7 +260,7 @@ TEST(Raster_Scale, EqualsTheModelWherePositionsWrap) {
 /// Steps of all kinds, on pixels at the ends of the range, where quotients are closest to the next.
 TEST(Raster_Scale, DividesExactlyForEveryKindOfStep) {
   Random random(4);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     ScaleCall c = withFormats(kFormats[random.below(3)]);
     const uint32 zeros = random.below(17);
     const auto step = [&] { return ((0x10000 + random.below(0x80000)) >> zeros << zeros) + 1e-3; };
@@ -345,7 +345,7 @@ TEST(Raster_Scale, DrawsAPartAsItIsInTheWhole) {
     for (const int32 smooth : {0, 1}) {
       Picture whole(static_cast<uint32>(50 * scale), static_cast<uint32>(40 * scale));
       ASSERT_TRUE(scaleAll(whole, from, scale, scale, smooth));
-      for (int round = 0; round < 20; ++round) {
+      for (int round = 0; round < tests::rounds(20); ++round) {
         const auto x1 = random.between(0, static_cast<int32>(whole.width) - 1);
         const auto y1 = random.between(0, static_cast<int32>(whole.height) - 1);
         Picture part = whole;

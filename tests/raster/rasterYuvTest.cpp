@@ -72,7 +72,7 @@ TEST(Raster_YUVtoRGB, EqualsTheModelForWideFrames) {
   Random random(2);
   for (const uint32 format : kFormats) {
     for (const int bppdepth : kDepths) {
-      for (int round = 0; round < 40; ++round) {
+      for (int round = 0; round < tests::rounds(40); ++round) {
         const uint32 width = round < 30 ? 40 + random.below(220) : 1000 + random.below(2000);
         checkSize(random, width, 2 + random.below(4), format, bppdepth);
         if (HasFatalFailure()) return;
@@ -295,7 +295,7 @@ TEST(Raster_YUVtoRGB, LogsAnUnsupportedFormatOnceAndTouchesNothing) {
 
 TEST(Raster_YUVtoRGB, LooksAtTheDepthBeforeTheFormatAndHasAFlagForEach) {
   const std::string log = tests::logOfOwnProcess([] {
-    for (int round = 0; round < 3; ++round) {
+    for (int round = 0; round < tests::rounds(3); ++round) {
       Raster_YUVtoRGB(nullptr, nullptr, 2, 2, 5, -7);
       Raster_YUVtoRGB(nullptr, nullptr, 2, 2, 5, 16);
     }
@@ -376,7 +376,8 @@ TEST(RasterRGB_MakeRGBParam, EqualsTheModelForAllWidthsAndMasks) {
       for (uint32 run = 1; low + run <= 32; ++run)
         checkParam(bits, (run == 32 ? 0xFFFFFFFF : (1u << run) - 1) << low);
     }
-    for (int round = 0; round < 200; ++round) checkParam(bits, random.word() | 1u << 31);
+    for (int round = 0; round < tests::rounds(200); ++round)
+      checkParam(bits, random.word() | 1u << 31);
   }
 }
 

@@ -70,7 +70,7 @@ Fill someFill(Random& random, uint32 rop) {
 
 TEST(Raster_RectROPfill, EqualsTheModelAndTouchesNothingElse) {
   Random random(1);
-  for (int round = 0; round < 8000; ++round) {
+  for (int round = 0; round < tests::rounds(8000); ++round) {
     Fill f = someFill(random, static_cast<uint32>(round) % 16);
     const ByteRange range = f.range();
     f.fb -= range.begin;
@@ -260,7 +260,7 @@ TEST(Raster_RectROPcopy, EqualsTheModelAtEveryByteDistanceInEveryWalk) {
 
 TEST(Raster_RectROPcopy, EqualsTheModelWithinOneFrameBuffer) {
   Random random(4);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     const uint32 bytesPerPixel = 1 + random.below(4);
     uint32 rop = random.below(16);
     if (rop == RASTER_ROP_COPY) rop = 6;
@@ -273,7 +273,7 @@ TEST(Raster_RectROPcopy, EqualsTheModelWithinOneFrameBuffer) {
 
 TEST(Raster_RectROPcopy, EqualsTheModelBetweenFrameBuffers) {
   Random random(5);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     Copy c = someCopy(random, 1 + random.below(4), random.below(16), random.below(3));
     if (c.rop == RASTER_ROP_COPY) c.dstPitch = c.srcPitch = static_cast<int32>(c.width * 4 + 4);
     c.src = -c.range(c.src, c.srcPitch, c.srcX, c.srcY).begin;
@@ -308,7 +308,7 @@ TEST(Raster_RectROPcopy, ReadsTheSourceOnlyWhereTheOperationDependsOnIt) {
 TEST(Raster_RectROPcopy, EqualsRectCopyForCopyAlsoWithAPixelSizeOfFive) {
   Random random(6);
   for (const uint32 bytesPerPixel : {1u, 2u, 3u, 4u, 5u}) {
-    for (int round = 0; round < 200; ++round) {
+    for (int round = 0; round < tests::rounds(200); ++round) {
       Copy c = someCopy(random, bytesPerPixel, RASTER_ROP_COPY, random.below(3));
       c.width = random.below(40);
       c.srcPitch = c.dstPitch = 320;

@@ -68,7 +68,7 @@ std::string describe(const Place& p) {
 
 TEST(Raster_RectFill, EqualsTheModelAndTouchesNothingElse) {
   Random random(1);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     const Place p = somePlace(random, 1 + random.below(4));
     const uint32 pixel = random.word();
     Bytes expected = random.bytes(p.end());
@@ -140,14 +140,15 @@ void checkCopy(Random& random, uint32 bytesPerPixel, int32 farthest) {
 
 TEST(Raster_RectCopy, EqualsTheModelWithinOneBuffer) {
   Random random(2);
-  for (int round = 0; round < 4000; ++round) checkCopy(random, 1 + random.below(5), round % 3);
+  for (int round = 0; round < tests::rounds(4000); ++round)
+    checkCopy(random, 1 + random.below(5), round % 3);
 }
 
 TEST(Raster_RectCopy, EqualsTheModelBetweenBuffers) {
   for (const uint32 mmx : {0u, 1u}) {
     const MmxSwitch with(mmx);
     Random random(3);
-    for (int round = 0; round < 3000; ++round) {
+    for (int round = 0; round < tests::rounds(3000); ++round) {
       const uint32 bytesPerPixel = 1 + random.below(4);
       const Place to = somePlace(random, bytesPerPixel);
       Place from = to;
@@ -236,7 +237,7 @@ TEST(Raster_RectCopy, LeavesFloatingPointUsableAfterTheCacheBypass) {
 
 TEST(Raster_RectFillAlpha, EqualsTheModelAndTouchesNothingElse) {
   Random random(6);
-  for (int round = 0; round < 2000; ++round) {
+  for (int round = 0; round < tests::rounds(2000); ++round) {
     const Place p = somePlace(random, 4);
     const auto alpha = static_cast<uint8>(random.word());
     Bytes expected = random.bytes(p.end());

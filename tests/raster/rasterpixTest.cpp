@@ -116,7 +116,7 @@ void checkTiling(Random& random, Tiling t) {
 
 TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithASeparatePixmap) {
   Random random(1);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     Tiling t = someTiling(random, static_cast<uint32>(round) % 18);
     t.pixmap = t.dstRange().end;
     checkTiling(random, t);
@@ -147,7 +147,7 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelForEveryPixmapWidthAlsoWithTallPixm
 
 TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithAPixmapInsideOrBesideTheRectangle) {
   Random random(2);
-  for (int round = 0; round < 4000; ++round) {
+  for (int round = 0; round < tests::rounds(4000); ++round) {
     Tiling t = someTiling(random, static_cast<uint32>(round) % 16);
     const ByteRange dst = t.dstRange();
     t.pixmap = random.oneOf(
@@ -188,7 +188,7 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelWherePixmapRowsHaveMoreBytesThanAnA
 
 TEST(Raster_RectPixmapROPcopy, EqualsTheModelWithRowsThatOverlapEachOther) {
   Random random(3);
-  for (int round = 0; round < 2000; ++round) {
+  for (int round = 0; round < tests::rounds(2000); ++round) {
     Tiling t = someTiling(random, static_cast<uint32>(round) % 16);
     t.dstPitch = random.below(t.dstPitch + 1);
     t.pixmapPitch = random.below(t.pixmapPitch + 1);

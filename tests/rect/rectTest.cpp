@@ -50,7 +50,7 @@ TEST(Rect_SetFromXYWH, CollapsesASideOfNegativeSize) {
 
 TEST(Rect_SetFromXYWH, EqualsTheExactSums) {
   Random random(1);
-  for (int round = 0; round < 50000; ++round) {
+  for (int round = 0; round < tests::rounds(50000); ++round) {
     const Rect in = tests::someRect(random);  // x, y, width, height
     const Sum right = in.right < 0 ? Sum{in.left, false} : saturatedSum(in.left, in.right);
     const Sum bottom = in.bottom < 0 ? Sum{in.top, false} : saturatedSum(in.top, in.bottom);
@@ -114,7 +114,7 @@ TEST(Rect_Translate, SaturatesEachSumByItself) {
 
 TEST(Rect_Translate, EqualsTheExactSumsInPlaceToo) {
   Random random(2);
-  for (int round = 0; round < 50000; ++round) {
+  for (int round = 0; round < tests::rounds(50000); ++round) {
     const Rect r = tests::someRect(random);
     const Point by = tests::somePoint(random);
     const Sum sums[] = {saturatedSum(r.left, by.x), saturatedSum(r.top, by.y),
@@ -142,7 +142,7 @@ TEST(Rect_TranslateInv, MovesTheSameWayByTheSmallestOffset) {
 
 TEST(Rect_TranslateInv, IsTheInverseOfTranslateInPlaceToo) {
   Random random(3);
-  for (int round = 0; round < 50000; ++round) {
+  for (int round = 0; round < tests::rounds(50000); ++round) {
     const Rect r = tests::someRect(random);
     Point by = tests::somePoint(random);
     if (by.x == kMin || by.y == kMin) by = {1, 1};
@@ -242,7 +242,7 @@ TEST(Rect_ContainsPoint, ExcludesRightAndBottom) {
 
 TEST(Rect_ContainsPoint, AgreesWithTheOtherFunctionsOnFullRangeValues) {
   Random random(4);
-  for (int round = 0; round < 50000; ++round) {
+  for (int round = 0; round < tests::rounds(50000); ++round) {
     const Rect r = tests::someRect(random);
     const Point p = tests::somePoint(random);
     if (p.x == kMax || p.y == kMax) continue;

@@ -4,6 +4,8 @@
 
 #include <algorithm>
 
+#include "reference/unknown.h"
+
 namespace reference {
 
 namespace {
@@ -38,8 +40,10 @@ uint32 combine(uint32 op, uint32 s, uint32 d, uint32 sa, uint32 da) {
       return clamped(scaled(d, sa) + scaled(s, 255 - da));
     case 12:
       return clamped(scaled(s, 255) + scaled(d, 255));
-    default:
+    case 13:
       return clamped(scaled(d, 255) + scaled(s, clamped((255 - da) / da)));
+    default:
+      unknown("operator", op);
   }
 }
 
@@ -62,8 +66,10 @@ Channels expand(const BlendFormat& format, uint32 p) {
       return {{widen5(p & 31), widen5(p >> 5 & 31), widen5(p >> 10 & 31)}};
     case 16:
       return {{widen5(p & 31), widen6(p >> 5 & 63), widen5(p >> 11 & 31)}};
-    default:
+    case 24:
       return {{p & 255, p >> 8 & 255, p >> 16 & 255}};
+    default:
+      unknown("format of depth", format.depth);
   }
 }
 
@@ -78,8 +84,10 @@ uint32 narrowed(const BlendFormat& format, const Channels& r, uint32 before) {
       return r0 >> 3 | r1 >> 3 << 5 | r2 >> 3 << 10;
     case 16:
       return r0 >> 3 | r1 >> 2 << 5 | r2 >> 3 << 11;
-    default:
+    case 24:
       return r0 | r1 << 8 | r2 << 16 | (format.bpp == 32 ? before & 0xFF000000 : 0);
+    default:
+      unknown("format of depth", format.depth);
   }
 }
 

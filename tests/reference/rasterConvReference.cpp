@@ -2,6 +2,8 @@
 
 #include "reference/rasterConvReference.h"
 
+#include "reference/unknown.h"
+
 namespace reference {
 namespace {
 
@@ -13,7 +15,8 @@ struct Color {
 Color lowDepthMasks(int32 depth) {
   if (depth == 3) return {0x04, 0x20, 0x80};
   if (depth == 6) return {0x30, 0x0C, 0x03};
-  return {0x07, 0x38, 0xC0};
+  if (depth == 8) return {0x07, 0x38, 0xC0};
+  unknown("destination format", static_cast<uint32>(depth));
 }
 
 uint32 widen5(uint32 v) { return (v << 3) | (v >> 2); }
@@ -38,26 +41,26 @@ uint32 from16To15(uint32 p) { return (p & 0x001F) | ((p >> 1) & 0x7FE0); }
 uint32 from15To16(uint32 p) { return ((p & 0x7FE0) << 1) | ((p & 0x0200) >> 4) | (p & 0x001F); }
 
 uint32 oneFrom32(uint32 p, int32 dstDepth) {
-  const Color masks = lowDepthMasks(dstDepth);
   if (dstDepth == 24 || dstDepth == 32) return p;
   if (dstDepth == 16) return narrowTo16(p);
   if (dstDepth == 15) return narrowTo15(p);
+  const Color masks = lowDepthMasks(dstDepth);
   return ((p >> 21) & masks.red) | ((p >> 10) & masks.green) | (p & masks.blue);
 }
 
 uint32 oneFrom16(uint32 p, int32 dstDepth) {
-  const Color masks = lowDepthMasks(dstDepth);
   if (dstDepth == 24 || dstDepth == 32) return widen16(p);
   if (dstDepth == 16) return p;
   if (dstDepth == 15) return from16To15(p);
+  const Color masks = lowDepthMasks(dstDepth);
   return ((p >> 13) & masks.red) | ((p >> 5) & masks.green) | ((p << 3) & masks.blue);
 }
 
 uint32 oneFrom15(uint32 p, int32 dstDepth) {
-  const Color masks = lowDepthMasks(dstDepth);
   if (dstDepth == 24 || dstDepth == 32) return widen15(p);
   if (dstDepth == 16) return from15To16(p);
   if (dstDepth == 15) return p;
+  const Color masks = lowDepthMasks(dstDepth);
   return ((p >> 12) & masks.red) | ((p >> 4) & masks.green) | ((p << 3) & masks.blue);
 }
 
@@ -82,7 +85,8 @@ uint32 bulkFrom32(uint32 c, int32 dstDepth) {
   if (isLowDepth(dstDepth)) return toLowDepth({c, c, c}, {24, 16, 8}, dstDepth);
   if (dstDepth == 15) return narrowTo15(c);
   if (dstDepth == 16) return narrowTo16(c);
-  return c;
+  if (dstDepth == 24 || dstDepth == 32) return c;
+  unknown("destination format", static_cast<uint32>(dstDepth));
 }
 
 uint32 bulkFrom24(uint32 p, int32 dstDepth) {
@@ -90,26 +94,30 @@ uint32 bulkFrom24(uint32 p, int32 dstDepth) {
   if (isLowDepth(dstDepth)) return toLowDepth(c, {8, 8, 8}, dstDepth);
   if (dstDepth == 15) return ((c.red << 7) & 0x7C00) | ((c.green << 2) & 0x3E0) | (c.blue >> 3);
   if (dstDepth == 16) return ((c.red << 8) & 0xF800) | ((c.green << 3) & 0x7E0) | (c.blue >> 3);
-  return 0xFF000000u | p;
+  if (dstDepth == 32) return 0xFF000000u | p;
+  unknown("destination format", static_cast<uint32>(dstDepth));
 }
 
 uint32 bulkFrom16(uint32 p, int32 dstDepth) {
   if (isLowDepth(dstDepth)) return toLowDepth({p, p, p}, {16, 11, 5}, dstDepth);
   if (dstDepth == 15) return from16To15(p);
-  return 0xFF000000u | widen16(p);
+  if (dstDepth == 24 || dstDepth == 32) return 0xFF000000u | widen16(p);
+  unknown("destination format", static_cast<uint32>(dstDepth));
 }
 
 uint32 bulkFrom15(uint32 p, int32 dstDepth) {
   if (isLowDepth(dstDepth)) return toLowDepth({p, p, p}, {15, 10, 5}, dstDepth);
   if (dstDepth == 16) return from15To16(p);
-  return 0xFF000000u | widen15(p);
+  if (dstDepth == 24 || dstDepth == 32) return 0xFF000000u | widen15(p);
+  unknown("destination format", static_cast<uint32>(dstDepth));
 }
 
 uint32 bulk(uint32 pixel, int32 srcDepth, int32 dstDepth) {
   if (srcDepth == 15) return bulkFrom15(pixel, dstDepth);
   if (srcDepth == 16) return bulkFrom16(pixel, dstDepth);
   if (srcDepth == 24) return bulkFrom24(pixel, dstDepth);
-  return bulkFrom32(pixel, dstDepth);
+  if (srcDepth == 32) return bulkFrom32(pixel, dstDepth);
+  unknown("source format", static_cast<uint32>(srcDepth));
 }
 
 uint32 bytesOf(int32 depth) {
@@ -132,7 +140,8 @@ uint32 convertOnePixel(uint32 pixel, int32 srcDepth, int32 dstDepth, bool pseudo
   if (pseudoColor) return oneFrom32(palette.at(pixel), dstDepth);
   if (srcDepth == 15) return oneFrom15(pixel, dstDepth);
   if (srcDepth == 16) return oneFrom16(pixel, dstDepth);
-  return oneFrom32(pixel, dstDepth);
+  if (srcDepth == 24 || srcDepth == 32) return oneFrom32(pixel, dstDepth);
+  unknown("source format", static_cast<uint32>(srcDepth));
 }
 
 void copyPixels(Bytes& dst, const Spot& to, const Bytes& src, const Spot& from, int32 depth,

@@ -2,6 +2,8 @@
 
 #include "reference/rasteropsRopReference.h"
 
+#include "reference/unknown.h"
+
 namespace reference {
 namespace {
 
@@ -56,8 +58,10 @@ uint32 combine(uint32 rop, uint32 s, uint32 d) {
       return ~s | d;
     case 14:
       return ~(s & d);
-    default:
+    case 15:
       return 0xFFFFFFFF;
+    default:
+      unknown("raster operation", rop);
   }
 }
 

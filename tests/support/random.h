@@ -1,10 +1,14 @@
 // SPDX-License-Identifier: MIT
 //
 // Seeded random numbers for the differential tests: the same on every machine and word size.
+//
+// RASTER_TEST_SEED=N gives every generator another sequence, RASTER_TEST_ROUNDS=N lets the random
+// tests run N rounds each in place of their own number. A failed test names both (main.cpp).
 
 #ifndef TESTS_RANDOM_H
 #define TESTS_RANDOM_H
 
+#include <cstdlib>
 #include <initializer_list>
 #include <vector>
 
@@ -12,10 +16,22 @@
 
 namespace tests {
 
+/// A number from the environment, or another one where there is none.
+inline uint64 fromEnvironment(const char* name, uint64 otherwise) {
+  const char* const text = getenv(name);
+  return text == nullptr ? otherwise : strtoull(text, nullptr, 0);
+}
+
+/// How many rounds a random test runs that asks for so many.
+inline int rounds(int count) {
+  return static_cast<int>(fromEnvironment("RASTER_TEST_ROUNDS", static_cast<uint64>(count)));
+}
+
 /// Steele and Vigna's SplitMix64.
 class Random {
  public:
-  explicit Random(uint64 seed) : state_(seed) {}
+  /// `seed` tells the generators of a program apart.
+  explicit Random(uint64 seed) : state_(seed + (fromEnvironment("RASTER_TEST_SEED", 0) << 32)) {}
 
   uint64 next() {
     uint64 z = (state_ += 0x9E3779B97F4A7C15u);
