@@ -1,0 +1,10 @@
+# Runs the program in README and looks at what it saved: a PNG file of 320 x 200 pixels.
+file(REMOVE picture.png)
+execute_process(COMMAND ${PROGRAM} RESULT_VARIABLE result)
+if(NOT result EQUAL 0)
+  message(FATAL_ERROR "the program ended with ${result}")
+endif()
+file(READ picture.png start LIMIT 24 HEX)
+if(NOT start STREQUAL "89504e470d0a1a0a0000000d4948445200000140000000c8")
+  message(FATAL_ERROR "picture.png starts with ${start}")
+endif()
