@@ -11,23 +11,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_LIBYUV
-#include <libyuv.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#endif
-#ifdef HAVE_QT6
-#include <QImage>
-#include <QPainter>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -97,11 +81,6 @@ void prepareSources() {
 }
 
 #ifdef HAVE_PIXMAN
-pixman_image_t* pixmanImage(pixman_format_code_t format, uint8* pixels, Extent e, uint32 pitch) {
-  return pixman_image_create_bits(format, static_cast<int>(e.width), static_cast<int>(e.height),
-                                  bench::words(pixels), static_cast<int>(pitch));
-}
-
 void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, uint32 pitch) {
   const bool dstAlpha = (job.flags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   const auto format = job.depth == 6    ? PIXMAN_a2r2g2b2
@@ -112,8 +91,8 @@ void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
                       : dstAlpha        ? PIXMAN_a8r8g8b8
                                         : PIXMAN_x8r8g8b8;
   if (pitch % 4 != 0) return;
-  auto* to = pixmanImage(format, dst, e, pitch);
-  auto* from = pixmanImage(PIXMAN_a8r8g8b8, src, e, e.width * 4);
+  auto* to = bench::pixmanImage(format, dst, e, pitch);
+  auto* from = bench::pixmanImage(PIXMAN_a8r8g8b8, src, e, e.width * 4);
   const pixman_color_t faded = {0, 0, 0, kAlpha * 0x101};
   auto* mask = (job.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0
                    ? pixman_image_create_solid_fill(&faded)
@@ -179,18 +158,17 @@ void addOthers(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
                         : job.depth == 16 ? SDL_PIXELFORMAT_RGB565
                         : job.bpp == 24   ? SDL_PIXELFORMAT_BGR24
                                           : SDL_PIXELFORMAT_RGB888;
-    auto* from =
-        SDL_CreateRGBSurfaceWithFormatFrom(src, w, h, 32, srcPitch, SDL_PIXELFORMAT_ARGB8888);
-    auto* to =
-        SDL_CreateRGBSurfaceWithFormatFrom(dst, w, h, static_cast<int>(job.bpp), dstPitch, format);
+    auto* from = bench::surface(SDL_PIXELFORMAT_ARGB8888, src, e, e.width * 4);
+    auto* to = bench::surface(format, dst, e, pitch);
     SDL_SetSurfaceBlendMode(from, SDL_BLENDMODE_BLEND);
     c.add("SDL2~straight", [=] { SDL_BlitSurface(from, nullptr, to, nullptr); });
   }
 #endif
 #ifdef HAVE_OPENCV
   if (job.op == RASTER_BLEND_ADD && job.bpp == 32) {
-    c.add("OpenCV~x", [from = cv::Mat(h, w, CV_8UC4, src),
-                       to = cv::Mat(h, w, CV_8UC4, dst)]() mutable { cv::add(from, to, to); });
+    c.add("OpenCV~x",
+          [from = bench::mat(CV_8UC4, src, e, e.width * 4),
+           to = bench::mat(CV_8UC4, dst, e, pitch)]() mutable { cv::add(from, to, to); });
   }
 #endif
   (void)c, (void)job, (void)dst, (void)src, (void)w, (void)h, (void)srcPitch, (void)dstPitch;

@@ -13,12 +13,10 @@
 #include "raster.h"
 #include "support/desktop.h"
 #include "support/jobs.h"
+#include "support/peers.h"
 
 #ifdef HAVE_SPNG
 #include <spng.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
 #endif
 
 namespace {
@@ -208,11 +206,8 @@ void encodeBmpJob(const std::string& name, uint32 depth, uint32 bpp) {
     });
     addLimit(c, e, bpp / 8 + 3);
 #ifdef HAVE_SDL2
-    static constexpr Uint32 kFormats[] = {0, 0, SDL_PIXELFORMAT_RGB565, SDL_PIXELFORMAT_BGR24,
-                                          SDL_PIXELFORMAT_RGB888};
-    SDL_Surface* surface = SDL_CreateRGBSurfaceWithFormatFrom(
-        image.data, static_cast<int>(e.width), static_cast<int>(e.height), static_cast<int>(bpp),
-        static_cast<int>(image.bytesPerLine), kFormats[bpp / 8]);
+    SDL_Surface* surface =
+        bench::surface(bench::kSdlFormats[bpp / 8], image.data, e, image.bytesPerLine);
     c.add("SDL2", [=] {
       SDL_RWops* file = SDL_RWFromMem(bench::buffer(0), bench::kBufferBytes);
       if (SDL_SaveBMP_RW(surface, file, 1) != 0) abort();

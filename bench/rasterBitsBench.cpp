@@ -6,13 +6,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -27,14 +21,8 @@ uint32 bitsPitch(Extent e) { return (e.width + 31) / 32 * 4; }
 
 #ifdef HAVE_SDL2
 void addSdl(Contenders& c, uint8* bits, uint8* dst, uint32 bytes, Extent e, bool stencil) {
-  static constexpr Uint32 kFormats[] = {0, SDL_PIXELFORMAT_INDEX8, SDL_PIXELFORMAT_RGB565,
-                                        SDL_PIXELFORMAT_BGR24, SDL_PIXELFORMAT_RGB888};
-  const int w = static_cast<int>(e.width);
-  const int h = static_cast<int>(e.height);
-  SDL_Surface* from = SDL_CreateRGBSurfaceWithFormatFrom(
-      bits, w, h, 1, static_cast<int>(bitsPitch(e)), SDL_PIXELFORMAT_INDEX1MSB);
-  SDL_Surface* to = SDL_CreateRGBSurfaceWithFormatFrom(
-      dst, w, h, static_cast<int>(8 * bytes), static_cast<int>(e.width * bytes), kFormats[bytes]);
+  SDL_Surface* from = bench::surface(SDL_PIXELFORMAT_INDEX1MSB, bits, e, bitsPitch(e));
+  SDL_Surface* to = bench::surface(bench::kSdlFormats[bytes], dst, e, e.width * bytes);
   const SDL_Color colors[] = {{0xC0, 0xFF, 0xEE, 255}, {0x3C, 0x21, 0xF7, 255}};
   SDL_SetPaletteColors(from->format->palette, colors, 0, 2);
   if (bytes == 1) SDL_SetPaletteColors(to->format->palette, colors, 0, 2);
@@ -46,14 +34,10 @@ void addSdl(Contenders& c, uint8* bits, uint8* dst, uint32 bytes, Extent e, bool
 #ifdef HAVE_PIXMAN
 /// pixman takes the bits of a byte from the least significant one up.
 void addPixman(Contenders& c, uint8* bits, uint8* dst, uint32 bytes, Extent e) {
-  static constexpr pixman_format_code_t kFormats[] = {PIXMAN_a8, PIXMAN_a8, PIXMAN_r5g6b5,
-                                                      PIXMAN_r8g8b8, PIXMAN_a8r8g8b8};
   const int w = static_cast<int>(e.width);
   const int h = static_cast<int>(e.height);
-  auto* mask =
-      pixman_image_create_bits(PIXMAN_a1, w, h, bench::words(bits), static_cast<int>(bitsPitch(e)));
-  auto* to = pixman_image_create_bits(kFormats[bytes], w, h, bench::words(dst),
-                                      static_cast<int>(e.width * bytes));
+  auto* mask = bench::pixmanImage(PIXMAN_a1, bits, e, bitsPitch(e));
+  auto* to = bench::pixmanImage(bench::kPixmanFormats[bytes], dst, e, e.width * bytes);
   const pixman_color_t color = {0x3C3C, 0x2121, 0xF7F7, 0xFFFF};
   auto* solid = pixman_image_create_solid_fill(&color);
   c.add("pixman~lsb",

@@ -7,10 +7,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -36,8 +33,7 @@ void preparePictures() {
 
 #ifdef HAVE_OPENCV
 cv::Mat matOf(const uint8* pixels, Extent e, int type, size_t bytes) {
-  return {static_cast<int>(e.height), static_cast<int>(e.width), type, const_cast<uint8*>(pixels),
-          e.width * bytes};
+  return bench::mat(type, const_cast<uint8*>(pixels), e, static_cast<uint32>(e.width * bytes));
 }
 #endif
 

@@ -7,26 +7,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_LIBYUV
-#include <libyuv.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
-#ifdef HAVE_SWSCALE
-extern "C" {
-#include <libavutil/log.h>
-#include <libswscale/swscale.h>
-}
-#endif
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#include <opencv2/imgproc.hpp>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -138,8 +119,8 @@ void addPixman([[maybe_unused]] Contenders& c, [[maybe_unused]] const Job& job,
 #ifdef HAVE_PIXMAN
   if (job.from.pixman == kNone || job.to.pixman == kNone) return;
   const auto image = [&](const Format& format, uint8* pixels, uint32 pitch) {
-    return pixman_image_create_bits(static_cast<pixman_format_code_t>(format.pixman), p.width(),
-                                    p.height(), bench::words(pixels), static_cast<int>(pitch));
+    return bench::pixmanImage(static_cast<pixman_format_code_t>(format.pixman), pixels, p.extent,
+                              pitch);
   };
   c.add("pixman",
         [p, src = image(job.from, p.src, p.srcPitch), dst = image(job.to, p.dst, p.dstPitch)] {
@@ -165,9 +146,7 @@ void addSdl([[maybe_unused]] Contenders& c, [[maybe_unused]] const Job& job,
 #ifdef HAVE_SDL2
   if (job.from.sdl == kNone || job.to.sdl == kNone) return;
   const auto surface = [&](const Format& format, uint8* pixels, uint32 pitch) {
-    SDL_Surface* made = SDL_CreateRGBSurfaceWithFormatFrom(pixels, p.width(), p.height(),
-                                                           static_cast<int>(8 * format.bytes),
-                                                           static_cast<int>(pitch), format.sdl);
+    SDL_Surface* made = bench::surface(format.sdl, pixels, p.extent, pitch);
     SDL_SetSurfaceBlendMode(made, SDL_BLENDMODE_NONE);
     return made;
   };
@@ -206,10 +185,11 @@ void addOpenCv([[maybe_unused]] Contenders& c, [[maybe_unused]] const Job& job,
 #ifdef HAVE_OPENCV
   if (job.openCv < 0) return;
   static constexpr int kTypes[] = {0, CV_8UC1, CV_8UC2, CV_8UC3, CV_8UC4};
-  c.add("OpenCV", [code = job.openCv,
-                   src = cv::Mat(p.height(), p.width(), kTypes[job.from.bytes], p.src, p.srcPitch),
-                   dst = cv::Mat(p.height(), p.width(), kTypes[job.to.bytes], p.dst,
-                                 p.dstPitch)]() mutable { cv::cvtColor(src, dst, code); });
+  c.add("OpenCV",
+        [code = job.openCv, src = bench::mat(kTypes[job.from.bytes], p.src, p.extent, p.srcPitch),
+         dst = bench::mat(kTypes[job.to.bytes], p.dst, p.extent, p.dstPitch)]() mutable {
+          cv::cvtColor(src, dst, code);
+        });
 #endif
 }
 

@@ -6,10 +6,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -49,13 +46,9 @@ void cursorJob(const std::string& name, uint32 size, uint32 type, uint32 depth, 
   c.add("limit", [=] { memcpy(screen, planes, copied); });
 #ifdef HAVE_PIXMAN
   if (type != RASTER_CURSOR_ALPHA) return;
-  const auto image = [](pixman_format_code_t format, uint8* at, uint32 w, uint32 h, uint32 pitch) {
-    return pixman_image_create_bits(format, static_cast<int>(w), static_cast<int>(h),
-                                    bench::words(at), static_cast<int>(pitch));
-  };
-  auto* to = image(bpp == 16 ? PIXMAN_r5g6b5 : PIXMAN_x8r8g8b8, screen, kScreenWidth, kScreenHeight,
-                   fb.pitch);
-  auto* from = image(PIXMAN_a8r8g8b8, planes, size, size, size * 4);
+  auto* to = bench::pixmanImage(bpp == 16 ? PIXMAN_r5g6b5 : PIXMAN_x8r8g8b8, screen,
+                                {kScreenWidth, kScreenHeight}, fb.pitch);
+  auto* from = bench::pixmanImage(PIXMAN_a8r8g8b8, planes, {size, size}, size * 4);
   c.add("pixman", [=] {
     const int side = static_cast<int>(size);
     pixman_image_composite32(PIXMAN_OP_OVER, from, nullptr, to, 0, 0, 0, 0, kAt, kAt, side, side);

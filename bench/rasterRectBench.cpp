@@ -7,13 +7,7 @@
 #include "raster.h"
 #include "rect.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
+#include "support/peers.h"
 
 namespace {
 

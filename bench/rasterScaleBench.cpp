@@ -14,27 +14,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_LIBYUV
-#include <libyuv.h>
-#include <libyuv/scale_rgb.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#include <opencv2/imgproc.hpp>
-#endif
-#ifdef HAVE_SWSCALE
-extern "C" {
-#include <libavutil/pixfmt.h>
-#include <libswscale/swscale.h>
-}
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -166,15 +146,12 @@ void addLibyuv(Contenders& c, const Work& w) {
 #ifdef HAVE_OPENCV
 void addOpencv(Contenders& c, const Work& w) {
   if (w.job.srcBytes != w.job.dstBytes) return;
-  static constexpr int kTypes[] = {0, CV_8UC1, CV_16UC1, CV_8UC3, CV_8UC4};
   const int filter = w.job.way == Way::kNearest    ? cv::INTER_NEAREST
                      : w.job.way == Way::kBilinear ? cv::INTER_LINEAR
                                                    : cv::INTER_AREA;
-  const int type = kTypes[w.job.srcBytes];
-  const cv::Mat from(static_cast<int>(w.from.height), static_cast<int>(w.from.width), type, w.src,
-                     w.srcPitch());
-  const cv::Mat to(static_cast<int>(w.to.height), static_cast<int>(w.to.width), type, w.dst,
-                   w.dstPitch());
+  const int type = bench::kMatTypes[w.job.srcBytes];
+  const cv::Mat from = bench::mat(type, w.src, w.from, w.srcPitch());
+  const cv::Mat to = bench::mat(type, w.dst, w.to, w.dstPitch());
   c.add("OpenCV", [from, to, filter]() mutable { cv::resize(from, to, to.size(), 0, 0, filter); });
 }
 #endif
@@ -185,9 +162,8 @@ void addPixman(Contenders& c, const Work& w) {
   if (w.job.way == Way::kBox && w.job.scale == 0.25) return;
   const auto image = [](uint32 bytes, Extent e, uint8* pixels, uint32 pitch) {
     // Pitches are multiples of 4 there.
-    return pixman_image_create_bits(bytes == 4 ? PIXMAN_x8r8g8b8 : PIXMAN_r5g6b5,
-                                    static_cast<int>(e.width), static_cast<int>(e.height),
-                                    bench::words(pixels), static_cast<int>((pitch + 3) / 4 * 4));
+    return bench::pixmanImage(bytes == 4 ? PIXMAN_x8r8g8b8 : PIXMAN_r5g6b5, pixels, e,
+                              (pitch + 3) / 4 * 4);
   };
   auto* from = image(w.job.srcBytes, w.from, w.src, w.srcPitch());
   auto* to = image(w.job.dstBytes, w.to, w.dst, w.dstPitch());
@@ -217,13 +193,8 @@ void addPixman(Contenders& c, const Work& w) {
 #ifdef HAVE_SDL2
 void addSdl(Contenders& c, const Work& w) {
   if (w.job.way != Way::kNearest || w.job.srcBytes != w.job.dstBytes) return;
-  const auto surface = [](uint32 bytes, Extent e, uint8* pixels, uint32 pitch) {
-    return SDL_CreateRGBSurfaceWithFormatFrom(
-        pixels, static_cast<int>(e.width), static_cast<int>(e.height), static_cast<int>(8 * bytes),
-        static_cast<int>(pitch), bytes == 4 ? SDL_PIXELFORMAT_RGB888 : SDL_PIXELFORMAT_RGB565);
-  };
-  auto* from = surface(w.job.srcBytes, w.from, w.src, w.srcPitch());
-  auto* to = surface(w.job.dstBytes, w.to, w.dst, w.dstPitch());
+  auto* from = bench::surface(bench::kSdlFormats[w.job.srcBytes], w.src, w.from, w.srcPitch());
+  auto* to = bench::surface(bench::kSdlFormats[w.job.dstBytes], w.dst, w.to, w.dstPitch());
   c.add("SDL2", [=] { SDL_SoftStretch(from, nullptr, to, nullptr); });
 }
 #endif

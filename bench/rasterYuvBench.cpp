@@ -8,21 +8,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_LIBYUV
-#include <libyuv.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
-#ifdef HAVE_SWSCALE
-extern "C" {
-#include <libswscale/swscale.h>
-}
-#endif
-#ifdef HAVE_OPENCV
-#include <opencv2/imgproc.hpp>
-#endif
+#include "support/peers.h"
 
 namespace {
 

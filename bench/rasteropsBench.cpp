@@ -6,19 +6,7 @@
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_LIBYUV
-#include <libyuv.h>
-#endif
-#ifdef HAVE_SDL2
-#include <SDL.h>
-#endif
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -29,11 +17,8 @@ constexpr uint32 kPixel = 0x5A3C21F7;
 
 #ifdef HAVE_SDL2
 SDL_Surface* surface(uint8* pixels, Extent e, uint32 bytes) {
-  static constexpr Uint32 kFormats[] = {0, SDL_PIXELFORMAT_INDEX8, SDL_PIXELFORMAT_RGB565,
-                                        SDL_PIXELFORMAT_BGR24, SDL_PIXELFORMAT_ARGB8888};
-  return SDL_CreateRGBSurfaceWithFormatFrom(pixels, static_cast<int>(e.width),
-                                            static_cast<int>(e.height), static_cast<int>(8 * bytes),
-                                            static_cast<int>(e.width * bytes), kFormats[bytes]);
+  const Uint32 format = bytes == 4 ? Uint32{SDL_PIXELFORMAT_ARGB8888} : bench::kSdlFormats[bytes];
+  return bench::surface(format, pixels, e, e.width * bytes);
 }
 #endif
 
@@ -63,8 +48,7 @@ void fillJob(uint32 bytes) {
     c.add("SDL2", [s = surface(dst, e, bytes)] { SDL_FillRect(s, nullptr, kPixel); });
 #endif
 #ifdef HAVE_OPENCV
-    static constexpr int kTypes[] = {0, CV_8UC1, CV_16UC1, CV_8UC3, CV_8UC4};
-    c.add("OpenCV", [mat = cv::Mat(h, w, kTypes[bytes], dst, pitch)]() mutable {
+    c.add("OpenCV", [mat = bench::mat(bench::kMatTypes[bytes], dst, e, pitch)]() mutable {
       mat.setTo(cv::Scalar(0xF7, 0x21, 0x3C, 0x5A));
     });
 #endif
@@ -125,8 +109,7 @@ void fillAlphaJob() {
 #ifdef HAVE_PIXMAN
     const int w = static_cast<int>(e.width);
     const int h = static_cast<int>(e.height);
-    auto* image =
-        pixman_image_create_bits(PIXMAN_a8r8g8b8, w, h, bench::words(dst), static_cast<int>(pitch));
+    auto* image = bench::pixmanImage(PIXMAN_a8r8g8b8, dst, e, pitch);
     const pixman_color_t opaque = {0, 0, 0, 0xFFFF};
     auto* source = pixman_image_create_solid_fill(&opaque);
     c.add("pixman ADD", [=] {

@@ -3,18 +3,11 @@
 // ROP fill and ROP copy against memset, memcpy and the public libraries with bitwise operations.
 
 #include <cstring>
+#include <memory>
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#endif
-#ifdef HAVE_QT6
-#include <QImage>
-#include <QPainter>
-#include <memory>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -39,8 +32,6 @@ void addOpenCv(Contenders& c, uint32 rop, const cv::Scalar& pixel, const cv::Mat
   if (rop == RASTER_ROP_AND) c.add("OpenCV", [=] { cv::bitwise_and(dst, pixel, dst); });
   if (rop == RASTER_ROP_INVERT) c.add("OpenCV", [=] { cv::bitwise_not(dst, dst); });
 }
-
-constexpr int kTypes[] = {0, CV_8UC1, CV_16UC1, CV_8UC3, CV_8UC4};
 #endif
 
 #ifdef HAVE_QT6
@@ -66,8 +57,7 @@ QPainter::CompositionMode qtMode(uint32 rop) {
 }
 
 QImage image(uint8* pixels, Extent e) {
-  return {pixels, static_cast<int>(e.width), static_cast<int>(e.height),
-          static_cast<qsizetype>(e.width) * 4, QImage::Format_RGB32};
+  return bench::qImage(QImage::Format_RGB32, pixels, e, e.width * 4);
 }
 
 /// A picture with an open painter: the engine sets the top byte of a pixel, hence "~x".
@@ -89,7 +79,7 @@ void fillJob(const std::string& name, uint32 bytes, uint32 rop) {
     c.add("limit", [=] { memset(dst, 0x5A, size_t{pitch} * e.height); });
 #ifdef HAVE_OPENCV
     addOpenCv(c, rop, cv::Scalar(0xF7, 0x21, 0x3C, 0x5A),
-              cv::Mat(static_cast<int>(e.height), static_cast<int>(e.width), kTypes[bytes], dst));
+              bench::mat(bench::kMatTypes[bytes], dst, e, pitch));
 #endif
 #ifdef HAVE_QT6
     if (bytes != 4) return;
@@ -111,8 +101,8 @@ void copyJob(const std::string& name, uint32 bytes, uint32 rop) {
     });
     c.add("limit", [=] { memcpy(dst, src, size_t{pitch} * e.height); });
 #ifdef HAVE_OPENCV
-    const cv::Size size(static_cast<int>(e.width), static_cast<int>(e.height));
-    addOpenCv(c, rop, cv::Mat(size, kTypes[bytes], src), cv::Mat(size, kTypes[bytes], dst));
+    const int type = bench::kMatTypes[bytes];
+    addOpenCv(c, rop, bench::mat(type, src, e, pitch), bench::mat(type, dst, e, pitch));
 #endif
 #ifdef HAVE_QT6
     if (bytes != 4) return;

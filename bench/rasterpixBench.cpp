@@ -3,19 +3,11 @@
 // Tiling against memset and the public libraries that repeat a picture.
 
 #include <cstring>
+#include <memory>
 
 #include "raster.h"
 #include "support/jobs.h"
-
-#ifdef HAVE_PIXMAN
-#include <pixman.h>
-#endif
-#ifdef HAVE_QT6
-#include <QBrush>
-#include <QImage>
-#include <QPainter>
-#include <memory>
-#endif
+#include "support/peers.h"
 
 namespace {
 
@@ -30,15 +22,11 @@ uint32 tilePitch(uint32 size, uint32 bytes) { return (size * bytes + 3) / 4 * 4;
 
 #ifdef HAVE_PIXMAN
 void addPixman(Contenders& c, uint8* dst, uint8* tile, uint32 bytes, uint32 size, Extent e) {
-  static constexpr pixman_format_code_t kFormats[] = {PIXMAN_a8, PIXMAN_a8, PIXMAN_r5g6b5,
-                                                      PIXMAN_r8g8b8, PIXMAN_a8r8g8b8};
   const int w = static_cast<int>(e.width);
   const int h = static_cast<int>(e.height);
-  const int side = static_cast<int>(size);
-  auto* to = pixman_image_create_bits(kFormats[bytes], w, h, bench::words(dst),
-                                      static_cast<int>(e.width * bytes));
-  auto* from = pixman_image_create_bits(kFormats[bytes], side, side, bench::words(tile),
-                                        static_cast<int>(tilePitch(size, bytes)));
+  const auto format = bench::kPixmanFormats[bytes];
+  auto* to = bench::pixmanImage(format, dst, e, e.width * bytes);
+  auto* from = bench::pixmanImage(format, tile, {size, size}, tilePitch(size, bytes));
   pixman_image_set_repeat(from, PIXMAN_REPEAT_NORMAL);
   c.add("pixman", [=] {
     pixman_image_composite32(PIXMAN_OP_SRC, from, nullptr, to, kTileX, kTileY, 0, 0, 0, 0, w, h);
@@ -60,11 +48,9 @@ struct Canvas {
 void addQt(Contenders& c, uint8* dst, uint8* tile, uint32 bytes, uint32 size, uint32 rop,
            Extent e) {
   const auto format = bytes == 4 ? QImage::Format_RGB32 : QImage::Format_RGB16;
-  const int side = static_cast<int>(size);
-  const auto canvas = std::make_shared<Canvas>(
-      QImage(dst, static_cast<int>(e.width), static_cast<int>(e.height),
-             static_cast<qsizetype>(e.width * bytes), format),
-      QImage(tile, side, side, static_cast<qsizetype>(tilePitch(size, bytes)), format));
+  const auto canvas =
+      std::make_shared<Canvas>(bench::qImage(format, dst, e, e.width * bytes),
+                               bench::qImage(format, tile, {size, size}, tilePitch(size, bytes)));
   canvas->painter.setCompositionMode(rop == RASTER_ROP_XOR ? QPainter::RasterOp_SourceXorDestination
                                                            : QPainter::CompositionMode_Source);
   c.add("Qt6~x", [=] { canvas->painter.fillRect(canvas->picture.rect(), canvas->brush); });

@@ -10,9 +10,7 @@
 #include <map>
 #include <vector>
 
-#ifdef HAVE_OPENCV
-#include <opencv2/core.hpp>
-#endif
+#include "support/peers.h"
 
 namespace bench {
 namespace {
@@ -137,9 +135,7 @@ int run(int argc, char** argv) {
   int count = static_cast<int>(arguments.size());
   benchmark::Initialize(&count, arguments.data());
   if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) return 2;
-#ifdef HAVE_OPENCV
-  cv::setNumThreads(1);  // as all the others
-#endif
+  useOneThread();
   BestTimes best;
   benchmark::RunSpecifiedBenchmarks(&best);
   printTable();
