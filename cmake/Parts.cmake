@@ -32,7 +32,9 @@ function(raster_part part description)
 endfunction()
 
 raster_part(TOOLS "rastertool"
-  CLI/CLI.hpp libcli11-dev xcb/xcb.h libxcb1-dev xcb/shm.h libxcb-shm0-dev xcb/xfixes.h libxcb-xfixes0-dev)
+  CLI/CLI.hpp libcli11-dev zlib.h zlib1g-dev xcb/xcb.h libxcb1-dev xcb/shm.h libxcb-shm0-dev
+  xcb/xfixes.h libxcb-xfixes0-dev xcb/damage.h libxcb-damage0-dev xcb/xinput.h libxcb-xinput-dev
+  xcb/xtest.h libxcb-xtest0-dev xcb/xcb_keysyms.h libxcb-keysyms1-dev)
 raster_part(TESTS "the tests and the examples" gtest/gtest.h libgtest-dev)
 
 # Shared unless the builder asks for static libraries in CMake's usual way.

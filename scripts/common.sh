@@ -56,6 +56,8 @@ needI386Libraries() {
   local packages=(libpng16-16 libpng-dev libgtest-dev libbenchmark-dev libbenchmark1debian
     libxcb1 libxcb1-dev libxau6 libxdmcp6 libbsd0 libmd0
     libxcb-shm0 libxcb-shm0-dev libxcb-xfixes0 libxcb-xfixes0-dev
+    libxcb-damage0 libxcb-damage0-dev libxcb-xinput0 libxcb-xinput-dev
+    libxcb-xtest0 libxcb-xtest0-dev libxcb-keysyms1 libxcb-keysyms1-dev
     libxcb-render0 libxcb-render0-dev libxcb-shape0 libxcb-shape0-dev)
   [ "$(cat "$i386Root/complete" 2>/dev/null)" = "${packages[*]}" ] && return
   local work=$root/.deps/i386-packages
@@ -74,7 +76,8 @@ needI386Libraries() {
 
 needBuildTools() {
   needPackages g++ cmake ninja-build pkg-config libpng-dev libhwy-dev libgtest-dev libbenchmark-dev \
-    libcli11-dev libxcb1-dev libxcb-shm0-dev libxcb-xfixes0-dev libxcb-render0-dev
+    libcli11-dev libxcb1-dev libxcb-shm0-dev libxcb-xfixes0-dev libxcb-render0-dev \
+    libxcb-damage0-dev libxcb-xinput-dev libxcb-xtest0-dev libxcb-keysyms1-dev zlib1g-dev
   case $1 in
     i386*)
       needPackages g++-multilib lib32z1-dev

@@ -6,6 +6,7 @@
 
 #include "geometry.h"
 #include "raster.h"
+#include "rectLists.h"
 
 namespace tool {
 namespace {
@@ -16,15 +17,6 @@ bool differ(const Picture& a, const Picture& b, const Rect& rect) {
   return Raster_ComparePixels(a.data(), a.pitch(), static_cast<int32>(a.record.bpp), b.data(),
                               b.pitch(), static_cast<int32>(b.record.bpp), x, y, x, y,
                               widthOf(rect), heightOf(rect)) != 0;
-}
-
-std::vector<Rect> entriesOf(const RectList& list) {
-  std::vector<Rect> rects;
-  for (const RectListEntry& entry : list.rects) {
-    if (entry.width <= 0) break;
-    rects.push_back({entry.x, entry.y, entry.x + entry.width, entry.y + entry.height});
-  }
-  return rects;
 }
 
 }  // namespace
@@ -41,7 +33,7 @@ std::vector<Rect> changedRects(const Picture& before, const Picture& after, uint
         Raster_AddRect(&list, x, y, tile.right - tile.left, tile.bottom - tile.top);
     }
   }
-  return entriesOf(list);
+  return rectsOf(list);
 }
 
 Rect boundingRect(const Picture& before, const Picture& after, const std::vector<Rect>& rects) {

@@ -58,6 +58,8 @@ void addCompareCommand(Commands& commands);
 void addScreenCommands(Commands& commands);
 void addYuvCommand(Commands& commands);
 void addPackCommands(Commands& commands);
+void addServeCommand(Commands& commands);
+void addPlayCommand(Commands& commands);
 
 }  // namespace tool
 

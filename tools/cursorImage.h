@@ -28,6 +28,10 @@ class CursorImage {
                                  const std::vector<uint8>& andBits,
                                  const std::vector<uint8>& xorBits);
 
+  const RasterCursor& shape() const { return geometry; }
+  /// The pixels of a cursor of pixels.
+  const std::vector<uint32>& pixels() const { return first; }
+
   /// Enlarges or reduces it about its hot spot.
   void scaleBy(double scale);
 

@@ -2,8 +2,6 @@
 
 #include "display.h"
 
-#include <sys/ipc.h>
-#include <sys/shm.h>
 #include <xcb/shm.h>
 #include <xcb/xfixes.h>
 
@@ -15,30 +13,10 @@
 #include "geometry.h"
 #include "progress.h"
 #include "raster.h"
+#include "xReply.h"
 
 namespace tool {
 namespace {
-
-template <class Reply> using ReplyPointer = std::unique_ptr<Reply, decltype(&free)>;
-
-/// The reply to a request, or null where the server answered with an error.
-template <class Reply, class Cookie>
-ReplyPointer<Reply> replyTo(xcb_connection_t* connection, Cookie cookie,
-                            Reply* (*wait)(xcb_connection_t*, Cookie, xcb_generic_error_t**)) {
-  xcb_generic_error_t* error = nullptr;
-  Reply* reply = wait(connection, cookie, &error);
-  free(error);
-  return {reply, free};
-}
-
-template <class Reply, class Cookie>
-ReplyPointer<Reply> needReply(xcb_connection_t* connection, Cookie cookie,
-                              Reply* (*wait)(xcb_connection_t*, Cookie, xcb_generic_error_t**),
-                              const char* what) {
-  auto reply = replyTo(connection, cookie, wait);
-  if (!reply) throw Failure(std::string("the display does not answer a request for ") + what);
-  return reply;
-}
 
 /// Whether a reply, whose length is told in words, is long enough for what it says to carry.
 bool carries(uint32 replyLength, uint64 bytes) { return uint64{replyLength} * 4 >= bytes; }
@@ -74,54 +52,6 @@ void copyRows(Picture& picture, uint32 top, const uint8* rows, uint32 rowPitch, 
 
 }  // namespace
 
-/// A segment that this program and the server on the same machine both see.
-class Display::SharedMemory {
- public:
-  SharedMemory(xcb_connection_t* to, size_t size) : connection(to) {
-    constexpr int kOwnerOnly = 0600;
-    const int id = shmget(IPC_PRIVATE, size, IPC_CREAT | kOwnerOnly);
-    if (id == -1) return;
-    void* memory = shmat(id, nullptr, 0);
-    if (memory != reinterpret_cast<void*>(-1)) {
-      bytes = static_cast<uint8*>(memory);
-      attach(static_cast<uint32>(id));
-    }
-    shmctl(id, IPC_RMID, nullptr);  // it goes when both have let go
-  }
-  ~SharedMemory() {
-    if (segment != XCB_NONE) {
-      xcb_shm_detach(connection, segment);
-      xcb_flush(connection);
-    }
-    if (bytes != nullptr) shmdt(bytes);
-  }
-  SharedMemory(const SharedMemory&) = delete;
-  SharedMemory& operator=(const SharedMemory&) = delete;
-
-  static bool isOffered(xcb_connection_t* connection) {
-    const xcb_query_extension_reply_t* extension = xcb_get_extension_data(connection, &xcb_shm_id);
-    return extension != nullptr && extension->present != 0;
-  }
-
-  bool isAttached() const { return segment != XCB_NONE; }
-  const uint8* data() const { return bytes; }
-  xcb_shm_seg_t id() const { return segment; }
-
- private:
-  /// A server on another machine, or in another container, refuses.
-  void attach(uint32 systemId) {
-    const xcb_shm_seg_t wanted = xcb_generate_id(connection);
-    xcb_generic_error_t* error =
-        xcb_request_check(connection, xcb_shm_attach_checked(connection, wanted, systemId, 0));
-    if (error == nullptr) segment = wanted;
-    free(error);
-  }
-
-  xcb_connection_t* connection;
-  uint8* bytes = nullptr;
-  xcb_shm_seg_t segment = XCB_NONE;
-};
-
 Display::Display(const std::string& name) : connection(nullptr, xcb_disconnect) {
   int number = 0;
   connection.reset(xcb_connect(name.empty() ? nullptr : name.c_str(), &number));
@@ -132,12 +62,16 @@ Display::Display(const std::string& name) : connection(nullptr, xcb_disconnect) 
                                 : "cannot connect to the display '" + shown + "'");
   }
   format = readSetup(xcb_get_setup(connection.get()), number);
+  measure();
+  checkFormat();
+}
+
+void Display::measure() {
   const auto geometry =
       needReply(connection.get(), xcb_get_geometry(connection.get(), format.screen->root),
                 xcb_get_geometry_reply, "the size of the screen");
   if (geometry->width == 0 || geometry->height == 0) throw Failure("the screen has no pixels");
   area = {0, 0, geometry->width, geometry->height};
-  checkFormat();
 }
 
 Display::~Display() { sharedMemory.reset(); }
@@ -157,9 +91,9 @@ void Display::checkFormat() {
 }
 
 /// The bytes from one row of the server's pixels to the next.
-uint32 Display::rowPitchOf(const Picture& picture) const {
+uint32 Display::rowBytes(uint32 width) const {
   const uint32 padBits = format.scanlinePad - 1;
-  return ((picture.width() * format.bitsPerPixel + padBits) & ~padBits) / 8;
+  return ((width * format.bitsPerPixel + padBits) & ~padBits) / 8;
 }
 
 std::string Display::description() const {
@@ -187,7 +121,7 @@ void Display::readPalette() {
 }
 
 bool Display::captureShared(Picture& picture, const Rect& region) {
-  const uint32 rowPitch = rowPitchOf(picture);
+  const uint32 rowPitch = rowBytes(picture.width());
   if (!SharedMemory::isOffered(connection.get())) return false;
   sharedMemory.reset();  // one segment at a time, of the size of this region
   sharedMemory =
@@ -207,7 +141,7 @@ bool Display::captureShared(Picture& picture, const Rect& region) {
 
 void Display::captureInBands(Picture& picture, const Rect& region) {
   constexpr uint32 kBandBytes = 1 << 20;
-  const uint32 rowPitch = rowPitchOf(picture);
+  const uint32 rowPitch = rowBytes(picture.width());
   const uint32 bandRows = std::max(1u, kBandBytes / rowPitch);
   Progress progress("rows", picture.height());
   for (uint32 top = 0; top < picture.height(); top += bandRows) {
@@ -226,19 +160,19 @@ void Display::captureInBands(Picture& picture, const Rect& region) {
   }
 }
 
+uint32 Display::code() const {
+  return Raster_GetBPPDepth(format.screen->root_depth, format.bitsPerPixel);
+}
+
 Picture Display::capture(const Rect& region) {
-  const uint32 code = Raster_GetBPPDepth(format.screen->root_depth, format.bitsPerPixel);
-  Picture picture(widthOf(region), heightOf(region), code);
-  if (format.screen->root_depth == 8)
-    std::copy(std::begin(palette), std::end(palette), picture.record.palette);
+  Picture picture(widthOf(region), heightOf(region), code());
+  if (isIndexed()) std::copy(std::begin(palette), std::end(palette), picture.record.palette);
   if (!captureShared(picture, region)) captureInBands(picture, region);
   return picture;
 }
 
 LiveCursor Display::cursor() {
-  const xcb_query_extension_reply_t* extension =
-      xcb_get_extension_data(connection.get(), &xcb_xfixes_id);
-  if (extension == nullptr || extension->present == 0)
+  if (!hasExtension(connection.get(), xcb_xfixes_id))
     throw Failure("the display does not tell its cursor: it has no XFIXES extension");
   needReply(connection.get(),
             xcb_xfixes_query_version(connection.get(), XCB_XFIXES_MAJOR_VERSION,

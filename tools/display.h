@@ -12,18 +12,11 @@
 #include <vector>
 
 #include "displaySetup.h"
+#include "liveCursor.h"
 #include "picture.h"
+#include "sharedMemory.h"
 
 namespace tool {
-
-/// A cursor as XFIXES tells it: premultiplied pixels of 32 bits.
-struct LiveCursor {
-  Point hotSpotOnScreen;
-  Point hotSpot;
-  uint32 width;
-  uint32 height;
-  std::vector<uint32> pixels;
-};
 
 class Display {
  public:
@@ -40,11 +33,21 @@ class Display {
   Picture capture(const Rect& region);
   LiveCursor cursor();
 
- private:
-  class SharedMemory;
+  // For those who watch the screen over a longer time.
+  xcb_connection_t* handle() const { return connection.get(); }
+  xcb_window_t root() const { return format.screen->root; }
+  /// Asks for the size of the screen again.
+  void measure();
+  /// The library's code of the screen's format; with 8, pixels are indices into colours().
+  uint32 code() const;
+  bool isIndexed() const { return format.screen->root_depth == 8; }
+  const ImageUtilColor* colours() const { return palette; }
+  uint32 bytesPerPixel() const { return format.bitsPerPixel / 8; }
+  /// The bytes from one row of the server's pixels to the next.
+  uint32 rowBytes(uint32 width) const;
 
+ private:
   void checkFormat();
-  uint32 rowPitchOf(const Picture& picture) const;
   void readPalette();
   bool captureShared(Picture& picture, const Rect& region);
   void captureInBands(Picture& picture, const Rect& region);

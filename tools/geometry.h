@@ -10,6 +10,7 @@
 #include <string>
 
 #include "rect.h"
+#include "rectSize.h"
 
 namespace tool {
 
@@ -48,9 +49,6 @@ CLI::Option* addParsed(CLI::App* command, const char* name, Target& target,
           name, [&target, parse](const std::string& text) { target = parse(text); }, description)
       ->type_name(form);
 }
-
-inline uint32 widthOf(const Rect& rect) { return static_cast<uint32>(rect.right - rect.left); }
-inline uint32 heightOf(const Rect& rect) { return static_cast<uint32>(rect.bottom - rect.top); }
 
 }  // namespace tool
 

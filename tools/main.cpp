@@ -80,9 +80,10 @@ int runCommandLine(int argc, char** argv) {
                "rastertool");
   app.require_subcommand(1);
   Commands commands(app);
-  for (const auto addFamily : {addScreenCommands, addInfoCommand, addImageCommands, addRopCommand,
-                               addBlendCommand, addCursorCommand, addScaleCommands,
-                               addCompareCommand, addYuvCommand, addPackCommands, addHelpCommand})
+  for (const auto addFamily :
+       {addScreenCommands, addServeCommand, addPlayCommand, addInfoCommand, addImageCommands,
+        addRopCommand, addBlendCommand, addCursorCommand, addScaleCommands, addCompareCommand,
+        addYuvCommand, addPackCommands, addHelpCommand})
     addFamily(commands);
   addHelp(app);
   try {

@@ -9,22 +9,10 @@
 #include <vector>
 
 #include "inputStream.h"
+#include "packedBlock.h"
 #include "picture.h"
 
 namespace tool {
-
-/// The five words that a block begins with.
-struct BlockHeader {
-  uint32 width;
-  uint32 height;
-  uint32 pitch;
-  uint32 bpp;
-  uint32 codeWords;  ///< 0: the pixels follow as they are
-
-  bool isCoded() const { return codeWords != 0; }
-  /// Bytes that follow the header.
-  uint64 payload() const;
-};
 
 /// A picture's block, in 8, 16, 24 or 32 bits per pixel as the picture is.
 std::vector<uint8> packBlock(const Picture& picture);

@@ -1,0 +1,170 @@
+// SPDX-License-Identifier: MIT
+//
+// Lists of changes against a model that knows every pixel.
+
+#include "changeList.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <vector>
+
+#include "support/random.h"
+
+namespace {
+
+using tests::Random;
+using tool::live::ChangeList;
+
+constexpr int32 kWidth = 150;
+constexpr int32 kHeight = 140;  // two strips and a piece of one
+
+/// How many of the rectangles hold each pixel.
+class Cover {
+ public:
+  void add(const Rect& rect) {
+    for (int32 y = std::max(0, rect.top); y < std::min(kHeight, rect.bottom); ++y)
+      for (int32 x = std::max(0, rect.left); x < std::min(kWidth, rect.right); ++x) ++at(x, y);
+  }
+  void remove(const Rect& rect) {
+    for (int32 y = std::max(0, rect.top); y < std::min(kHeight, rect.bottom); ++y)
+      for (int32 x = std::max(0, rect.left); x < std::min(kWidth, rect.right); ++x) at(x, y) = 0;
+  }
+  int& at(int32 x, int32 y) { return counts[static_cast<size_t>(y * kWidth + x)]; }
+  const std::vector<int>& all() const { return counts; }
+
+ private:
+  std::vector<int> counts = std::vector<int>(size_t{kWidth} * kHeight);
+};
+
+Cover coverOf(const std::vector<Rect>& rects) {
+  Cover cover;
+  for (const Rect& rect : rects) cover.add(rect);
+  return cover;
+}
+
+Rect randomRect(Random& random, int32 largest) {
+  const int32 x = random.between(-20, kWidth + 10);
+  const int32 y = random.between(-20, kHeight + 10);
+  return {x, y, x + random.between(1, largest), y + random.between(1, largest)};
+}
+
+void expectDisjointAndCovering(const std::vector<Rect>& rects, const Cover& wanted) {
+  const Cover cover = coverOf(rects);
+  for (size_t i = 0; i < cover.all().size(); ++i) {
+    ASSERT_LE(cover.all()[i], 1);
+    if (wanted.all()[i] != 0) {
+      ASSERT_EQ(cover.all()[i], 1);
+    }
+  }
+}
+
+TEST(ChangeList, IsExactWhileThereIsRoom) {
+  Random random(1);
+  for (int round = 0; round < 300; ++round) {
+    ChangeList list(kWidth, kHeight);
+    Cover model;
+    for (int i = 0; i < 3; ++i) {
+      const Rect rect = randomRect(random, 100);
+      list.add(rect);
+      model.add(rect);
+    }
+    const Cover cover = coverOf(list.all());
+    for (size_t i = 0; i < cover.all().size(); ++i)
+      ASSERT_EQ(cover.all()[i], model.all()[i] != 0 ? 1 : 0);
+  }
+}
+
+TEST(ChangeList, HoldsEverythingWhenItOverflows) {
+  Random random(2);
+  for (int round = 0; round < 100; ++round) {
+    ChangeList list(kWidth, kHeight);
+    Cover model;
+    for (int i = 0; i < 60; ++i) {
+      const Rect rect = randomRect(random, 12);
+      list.add(rect);
+      model.add(rect);
+    }
+    expectDisjointAndCovering(list.all(), model);
+  }
+}
+
+TEST(ChangeList, OverflowsInOneStripOnly) {
+  ChangeList list(kWidth, kHeight);
+  for (int32 i = 0; i < 40; ++i) list.add({3 * i, i, 3 * i + 1, i + 1});
+  list.add({10, 100, 12, 101});
+  Cover cover = coverOf(list.all());
+  EXPECT_EQ(cover.at(10, 100), 1);
+  EXPECT_EQ(cover.at(9, 100), 0);
+  EXPECT_EQ(cover.at(50, 80), 0);
+}
+
+TEST(ChangeList, JoinsWhatGoesOnInTheNextStrip) {
+  ChangeList list(kWidth, kHeight);
+  list.add({10, 5, 20, 139});
+  ASSERT_EQ(list.all().size(), 1u);
+  EXPECT_EQ(list.all()[0].top, 5);
+  EXPECT_EQ(list.all()[0].bottom, 139);
+}
+
+TEST(ChangeList, TakesOutNothingElse) {
+  Random random(3);
+  for (int round = 0; round < 500; ++round) {
+    ChangeList list(kWidth, kHeight);
+    Cover model;
+    for (int i = 0; i < 12; ++i) {
+      const Rect rect = randomRect(random, 40);
+      list.add(rect);
+      model.add(rect);
+      if (i % 3 != 2) continue;
+      const Rect hole = randomRect(random, 60);
+      list.subtract(hole);
+      model.remove(hole);
+      for (const Rect& left : list.all()) ASSERT_FALSE(Rect_Intersect(nullptr, &left, &hole));
+    }
+    expectDisjointAndCovering(list.all(), model);
+  }
+}
+
+TEST(ChangeList, TakesOutExactlyWhatItHasRoomFor) {
+  ChangeList list(kWidth, kHeight);
+  list.addAll();
+  list.subtract({20, 30, 100, 110});
+  Cover cover = coverOf(list.all());
+  EXPECT_EQ(cover.at(20, 30), 0);
+  EXPECT_EQ(cover.at(99, 109), 0);
+  EXPECT_EQ(cover.at(19, 30), 1);
+  EXPECT_EQ(cover.at(100, 109), 1);
+  EXPECT_EQ(cover.at(50, 110), 1);
+}
+
+TEST(ChangeList, IsEmptyOnceEverythingIsTakenOut) {
+  Random random(4);
+  ChangeList list(kWidth, kHeight);
+  EXPECT_TRUE(list.isEmpty());
+  for (int i = 0; i < 200; ++i) list.add(randomRect(random, 9));
+  EXPECT_FALSE(list.isEmpty());
+  list.subtract(list.bounds());
+  EXPECT_TRUE(list.isEmpty());
+}
+
+TEST(ChangeList, TellsAPartOfThePicture) {
+  ChangeList list(kWidth, kHeight);
+  list.add({10, 10, 100, 100});
+  const std::vector<Rect> rects = list.within({0, 0, 20, 70});
+  Cover cover = coverOf(rects);
+  EXPECT_EQ(cover.at(19, 69), 1);
+  EXPECT_EQ(cover.at(20, 69), 0);
+  EXPECT_EQ(cover.at(19, 70), 0);
+  EXPECT_TRUE(list.within({110, 0, 150, 140}).empty());
+}
+
+TEST(ChangeList, IgnoresWhatLiesOutside) {
+  ChangeList list(kWidth, kHeight);
+  list.add({-50, -50, 0, 140});
+  list.add({0, 140, 150, 300});
+  list.add({20, 20, 20, 40});
+  EXPECT_TRUE(list.isEmpty());
+}
+
+}  // namespace

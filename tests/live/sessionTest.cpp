@@ -1,0 +1,345 @@
+// SPDX-License-Identifier: MIT
+//
+// A viewer's side of a session: what it has drawn after an update is what there was to be seen.
+
+#include "session.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "support/random.h"
+
+namespace {
+
+using tests::Random;
+using tool::LiveCursor;
+using tool::live::bigEndian16;
+using tool::live::bigEndian32;
+using tool::live::Bytes;
+using tool::live::ChangeList;
+using tool::live::PixelFormat;
+using tool::live::PixelView;
+using tool::live::Scene;
+using tool::live::Session;
+using tool::live::ViewerFormat;
+
+constexpr uint32 kWidth = 100;
+constexpr uint32 kHeight = 90;
+
+constexpr PixelFormat kStandard = {32, 24, false, true, 255, 255, 255, 16, 8, 0};
+constexpr PixelFormat kSixteen = {16, 16, true, true, 31, 63, 31, 11, 5, 0};
+constexpr PixelFormat kEight = {8, 8, false, true, 7, 7, 3, 0, 3, 6};
+
+class Messages {
+ public:
+  Messages& start() {
+    bytes.append("RFB 003.008\n", 12);
+    bytes.put8(1);
+    bytes.put8(1);
+    return *this;
+  }
+  Messages& format(const PixelFormat& wanted) {
+    bytes.put32(0);
+    tool::live::putPixelFormat(bytes, wanted);
+    return *this;
+  }
+  Messages& encodings(const std::vector<int32>& list) {
+    bytes.put16(0x0200);
+    bytes.put16(static_cast<uint32>(list.size()));
+    for (const int32 encoding : list) bytes.put32(static_cast<uint32>(encoding));
+    return *this;
+  }
+  Messages& request(bool incremental, const Rect& area) {
+    bytes.put8(3);
+    bytes.put8(incremental);
+    for (const int32 number : {area.left, area.top, area.right - area.left, area.bottom - area.top})
+      bytes.put16(static_cast<uint32>(number));
+    return *this;
+  }
+
+  Bytes bytes;
+};
+
+/// A viewer that understands Raw, and what it was sent besides.
+class Viewer {
+ public:
+  Viewer() : session(kWidth, kHeight, "a name", nullptr), picture(kWidth * kHeight * 4) {
+    EXPECT_TRUE(say(Messages().start()));
+    // The offer, the result, and 24 bytes and the name.
+    EXPECT_EQ(answers.size(), 2 + 4 + 24 + 6u);
+    EXPECT_EQ(bigEndian16(answers.data() + 6), kWidth);
+    EXPECT_EQ(bigEndian16(answers.data() + 8), kHeight);
+    EXPECT_EQ(memcmp(answers.data() + 30, "a name", 6), 0);
+    answers.clear();
+  }
+
+  bool say(const Messages& messages) {
+    return session.receive(messages.bytes.data(), messages.bytes.size(), answers);
+  }
+  bool say(const Messages& messages, const PixelFormat& wanted) {
+    format = wanted;
+    picture.assign(picture.size(), 0);
+    return say(messages);
+  }
+
+  /// Takes an update, if there is one.
+  bool update(const Scene& scene) {
+    Bytes out;
+    if (!session.putUpdate(scene, out)) {
+      EXPECT_EQ(out.size(), 0u);
+      return false;
+    }
+    take(out);
+    return true;
+  }
+
+  Session session;
+  PixelFormat format = kStandard;
+  std::vector<uint8> picture;
+  std::vector<Rect> drawn;
+  std::vector<int32> others;
+  bool gotColourMap = false;
+
+ private:
+  void take(const Bytes& out) {
+    const uint8* at = out.data();
+    if (*at == 1) {
+      gotColourMap = true;
+      at += 6 + 256 * 6;
+    }
+    ASSERT_EQ(*at, 0);
+    const uint32 count = bigEndian16(at + 2);
+    ASSERT_GT(count, 0u);
+    at += 4;
+    drawn.clear();
+    others.clear();
+    for (uint32 i = 0; i < count; ++i) at = takeRect(at);
+    EXPECT_EQ(at, out.data() + out.size());
+  }
+
+  const uint8* takeRect(const uint8* at) {
+    const uint32 x = bigEndian16(at);
+    const uint32 y = bigEndian16(at + 2);
+    const uint32 width = bigEndian16(at + 4);
+    const uint32 height = bigEndian16(at + 6);
+    const auto encoding = static_cast<int32>(bigEndian32(at + 8));
+    const uint32 bytes = format.bitsPerPixel / 8;
+    at += 12;
+    if (encoding != 0) others.push_back(encoding);
+    if (encoding == -239) return at + size_t{width} * height * bytes + (width + 7) / 8 * height;
+    if (encoding == -314) return at + 4 + size_t{width} * height * 4;
+    if (encoding != 0) return at;
+    drawn.push_back({static_cast<int32>(x), static_cast<int32>(y), static_cast<int32>(x + width),
+                     static_cast<int32>(y + height)});
+    for (uint32 row = 0; row < height; ++row, at += size_t{width} * bytes)
+      memcpy(picture.data() + (size_t{y + row} * kWidth + x) * bytes, at, size_t{width} * bytes);
+    return at;
+  }
+
+  Bytes answers;
+};
+
+/// A screen that changes.
+class Screen {
+ public:
+  explicit Screen(uint64 seed) : random(seed), pixels(random.bytes(kWidth * kHeight * 4)) {}
+
+  PixelView view() const { return {pixels.data(), 4 * kWidth, kWidth, kHeight}; }
+  Scene scene() const { return {view(), nullptr, 0, {}, {-1, -1}}; }
+
+  ChangeList change() {
+    ChangeList changed(kWidth, kHeight);
+    for (uint32 i = random.below(5); i != 0; --i) {
+      const int32 x = random.between(0, kWidth - 1);
+      const int32 y = random.between(0, kHeight - 1);
+      const Rect rect = {x, y, random.between(x + 1, kWidth), random.between(y + 1, kHeight)};
+      for (int32 row = rect.top; row < rect.bottom; ++row)
+        for (int32 column = rect.left; column < rect.right; ++column)
+          pixels[static_cast<size_t>((row * static_cast<int32>(kWidth) + column) * 4)] ^= 0x5A;
+      changed.add(rect);
+    }
+    return changed;
+  }
+
+  Random random;
+  std::vector<uint8> pixels;
+};
+
+std::vector<uint8> expectedPicture(const Screen& screen, const PixelFormat& wanted) {
+  const ViewerFormat format(wanted);
+  std::vector<uint8> rows(size_t{kWidth} * kHeight * format.bytesPerPixel());
+  const PixelView view = screen.view();
+  format.convert(rows.data(), kWidth * format.bytesPerPixel(), view, view.bounds());
+  return rows;
+}
+
+void expectSeesScreen(const Viewer& viewer, const Screen& screen) {
+  const std::vector<uint8> expected = expectedPicture(screen, viewer.format);
+  ASSERT_EQ(memcmp(viewer.picture.data(), expected.data(), expected.size()), 0);
+}
+
+constexpr Rect kWhole = {0, 0, kWidth, kHeight};
+
+TEST(Session, SaysNothingUnasked) {
+  Screen screen(1);
+  Viewer viewer;
+  EXPECT_FALSE(viewer.session.isWaiting());
+  EXPECT_FALSE(viewer.update(screen.scene()));
+  ASSERT_TRUE(viewer.say(Messages().request(false, kWhole)));
+  EXPECT_TRUE(viewer.session.isWaiting());
+  EXPECT_TRUE(viewer.update(screen.scene()));
+  expectSeesScreen(viewer, screen);
+  EXPECT_FALSE(viewer.session.isWaiting());
+  EXPECT_FALSE(viewer.update(screen.scene()));
+  ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+  EXPECT_FALSE(viewer.update(screen.scene()));  // nothing has changed
+  EXPECT_TRUE(viewer.session.isWaiting());
+}
+
+TEST(Session, KeepsUpWithChangesAndFormats) {
+  Screen screen(2);
+  Viewer viewer;
+  for (int round = 0; round < 400; ++round) {
+    viewer.session.addChanges(screen.change());
+    if (screen.random.below(3) == 0) viewer.session.addChanges(screen.change());
+    bool incremental = round != 0;
+    if (screen.random.below(10) == 0) {
+      const auto wanted = screen.random.oneOf({kStandard, kSixteen, kEight});
+      ASSERT_TRUE(viewer.say(Messages().format(wanted), wanted));
+      incremental = false;
+    }
+    ASSERT_TRUE(viewer.say(Messages().request(incremental, kWhole)));
+    viewer.update(screen.scene());
+    expectSeesScreen(viewer, screen);
+    if (HasFatalFailure()) return;
+  }
+}
+
+TEST(Session, SendsWhatWasAskedForAndKeepsTheRest) {
+  Screen screen(3);
+  Viewer viewer;
+  const Rect left = {0, 0, 40, kHeight};
+  const Rect right = {40, 0, kWidth, kHeight};
+  ASSERT_TRUE(viewer.say(Messages().request(true, left)));
+  ASSERT_TRUE(viewer.update(screen.scene()));
+  for (const Rect& rect : viewer.drawn) EXPECT_TRUE(Rect_ContainsRect(&left, &rect));
+  ASSERT_TRUE(viewer.say(Messages().request(true, right)));
+  ASSERT_TRUE(viewer.update(screen.scene()));
+  for (const Rect& rect : viewer.drawn) EXPECT_TRUE(Rect_ContainsRect(&right, &rect));
+  expectSeesScreen(viewer, screen);
+}
+
+TEST(Session, DropsThoseWhoAskForNothingOrForTooMuch) {
+  for (const Rect& area : {Rect{0, 0, 0, 0}, Rect{5, 5, 5, 10}, Rect{0, 0, kWidth + 1, kHeight},
+                           Rect{90, 80, 101, 90}, Rect{200, 200, 210, 210}}) {
+    Viewer viewer;
+    EXPECT_FALSE(viewer.say(Messages().request(true, area)));
+    EXPECT_EQ(viewer.session.fault(), "a request for pixels that do not exist");
+  }
+}
+
+TEST(Session, AnswersManyRequestsWithOneUpdate) {
+  Screen screen(4);
+  Viewer viewer;
+  Messages many;
+  for (int i = 0; i < 1000; ++i) many.request(false, kWhole);
+  ASSERT_TRUE(viewer.say(many));
+  EXPECT_TRUE(viewer.update(screen.scene()));
+  EXPECT_FALSE(viewer.update(screen.scene()));
+}
+
+TEST(Session, TellsANewSizeBeforeAnythingElse) {
+  Screen screen(5);
+  Viewer viewer;
+  ASSERT_TRUE(viewer.say(Messages().encodings({0, -223}).request(false, kWhole)));
+  EXPECT_TRUE(viewer.session.resize(50, 60));
+  ASSERT_TRUE(viewer.update(screen.scene()));
+  EXPECT_EQ(viewer.others, std::vector<int32>{-223});
+  EXPECT_TRUE(viewer.drawn.empty());
+  // A request from before it knew is no mistake.
+  ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+  ASSERT_TRUE(viewer.update(screen.scene()));
+  const Rect now = {0, 0, 50, 60};
+  for (const Rect& rect : viewer.drawn) EXPECT_TRUE(Rect_ContainsRect(&now, &rect));
+}
+
+TEST(Session, CannotTellANewSizeToEveryViewer) {
+  Viewer viewer;
+  ASSERT_TRUE(viewer.say(Messages().encodings({0})));
+  EXPECT_FALSE(viewer.session.resize(50, 60));
+}
+
+LiveCursor someCursor() { return {{0, 0}, {1, 2}, 9, 5, std::vector<uint32>(45, 0xFF00FF00)}; }
+
+TEST(Session, SendsACursorWheneverItIsAnotherOne) {
+  Screen screen(6);
+  const LiveCursor cursor = someCursor();
+  for (const int32 encoding : {-239, -314}) {
+    Viewer viewer;
+    Scene scene = screen.scene();
+    scene.cursor = &cursor;
+    scene.cursorSerial = 1;
+    ASSERT_TRUE(viewer.say(Messages().encodings({0, encoding}).request(false, kWhole)));
+    EXPECT_FALSE(viewer.session.needsDrawnCursor());
+    ASSERT_TRUE(viewer.update(scene));
+    EXPECT_EQ(viewer.others, std::vector<int32>{encoding});
+    expectSeesScreen(viewer, screen);
+    ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+    EXPECT_FALSE(viewer.update(scene));
+    scene.cursorSerial = 2;
+    ASSERT_TRUE(viewer.update(scene));
+    EXPECT_TRUE(viewer.drawn.empty());
+  }
+}
+
+TEST(Session, RenewsWhatTheDrawnCursorCovered) {
+  Screen screen(7);
+  const LiveCursor cursor = someCursor();
+  Viewer viewer;
+  EXPECT_TRUE(viewer.session.needsDrawnCursor());
+  Scene scene = screen.scene();
+  scene.cursor = &cursor;
+  scene.cursorSerial = 1;
+  scene.cursorBox = {10, 10, 19, 15};
+  ASSERT_TRUE(viewer.say(Messages().request(false, kWhole)));
+  ASSERT_TRUE(viewer.update(scene));
+  ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+  EXPECT_FALSE(viewer.update(scene));
+  scene.cursorBox = {60, 70, 69, 75};
+  ASSERT_TRUE(viewer.update(scene));
+  ASSERT_EQ(viewer.drawn.size(), 2u);
+  EXPECT_TRUE(Rect_IsEqual(&viewer.drawn[1], &scene.cursorBox));
+}
+
+TEST(Session, TellsWhereThePointerIs) {
+  Screen screen(8);
+  Viewer viewer;
+  Scene scene = screen.scene();
+  scene.pointer = {20, 30};
+  ASSERT_TRUE(viewer.say(Messages().encodings({0, -232, -239}).request(false, kWhole)));
+  ASSERT_TRUE(viewer.update(scene));
+  EXPECT_EQ(viewer.others, std::vector<int32>{-232});
+  ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+  EXPECT_FALSE(viewer.update(scene));
+  scene.pointer = {-5, 30};  // on another part of the screen
+  EXPECT_FALSE(viewer.update(scene));
+  scene.pointer = {21, 30};
+  EXPECT_TRUE(viewer.update(scene));
+}
+
+TEST(Session, SendsAColourMapBeforeIndices) {
+  Screen screen(9);
+  Viewer viewer;
+  PixelFormat indexed = kEight;
+  indexed.trueColour = false;
+  ASSERT_TRUE(viewer.say(Messages().format(indexed).request(false, kWhole), kEight));
+  ASSERT_TRUE(viewer.update(screen.scene()));
+  EXPECT_TRUE(viewer.gotColourMap);
+  expectSeesScreen(viewer, screen);
+}
+
+}  // namespace

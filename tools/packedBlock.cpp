@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: MIT
+
+#include "packedBlock.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <memory>
+
+#include "raster.h"
+
+namespace tool {
+namespace {
+
+/// Pixel units of the image, row padding included.
+uint64 unitsOf(const BlockHeader& header) {
+  return uint64{header.pitch} * header.height / (header.bpp / 8);
+}
+
+/// Walks the code and tells how many pixels it makes: two equal pixels in a row are followed by a
+/// count of further ones. False when it ends where a count should be.
+bool countPixels(const uint8* code, uint32 codeWords, uint64& pixels) {
+  enum { kFirst, kNext, kCount } state = kFirst;
+  uint32 previous = 0;
+  for (uint32 i = 0; i < codeWords; ++i) {
+    uint32 word;
+    memcpy(&word, code + sizeof word * i, sizeof word);
+    pixels += state == kCount ? word : 1;
+    if (state == kCount) {
+      state = kFirst;
+    } else {
+      state = state == kNext && word == previous ? kCount : kNext;
+      previous = word;
+    }
+  }
+  return state != kCount;
+}
+
+std::string codeFault(const uint8* code, size_t size, const BlockHeader& header) {
+  if (header.bpp != 32) return "only pixels of 32 bits can be coded";
+  if (header.payload() != size) return "its code is not as long as its header says";
+  uint64 pixels = 0;
+  if (!countPixels(code, header.codeWords, pixels)) return "its code ends where a count should be";
+  if (pixels != unitsOf(header))
+    return "its code does not make the pixels that its header promises";
+  return {};
+}
+
+std::string storedFault(size_t size, const BlockHeader& header) {
+  const uint64 stored = header.payload();
+  if (size != stored) return "its pixels are not as many as its header says";
+  const uint64 needed = uint64{header.pitch} * (header.height - 1) + header.width * header.bpp / 8;
+  if (stored < needed) return "its last pixel is cut off";
+  return {};
+}
+
+}  // namespace
+
+uint64 BlockHeader::payload() const {
+  return isCoded() ? uint64{codeWords} * 4 : unitsOf(*this) * (bpp / 8);
+}
+
+std::string headerFault(const BlockHeader& header) {
+  constexpr uint64 kLargestPicture = uint64{1} << 30;
+  constexpr uint32 kLargestSide = 1000000;
+  const uint32 bpp = header.bpp;
+  if (bpp != 8 && bpp != 16 && bpp != 24 && bpp != 32)
+    return "it has " + std::to_string(bpp) + " bits per pixel";
+  if (header.width == 0 || header.height == 0 || header.width > kLargestSide ||
+      header.height > kLargestSide)
+    return "it is of " + std::to_string(header.width) + "x" + std::to_string(header.height) +
+           " pixels";
+  if (header.pitch < header.width * (bpp / 8)) return "its rows are longer than its pitch";
+  if (uint64{header.pitch} * header.height > kLargestPicture) return "it is too large";
+  return {};
+}
+
+std::string blockFault(const uint8* block, size_t size, BlockHeader& header) {
+  if (size < sizeof header) return "it is shorter than its header";
+  memcpy(&header, block, sizeof header);
+  const std::string fault = headerFault(header);
+  if (!fault.empty()) return fault;
+  const uint8* payload = block + sizeof header;
+  const size_t payloadSize = size - sizeof header;
+  return header.isCoded() ? codeFault(payload, payloadSize, header)
+                          : storedFault(payloadSize, header);
+}
+
+void drawBlock(const uint8* block, const BlockHeader& header, uint8* to, uint32 toPitch) {
+  const auto copy = [&](const uint8* rows) {
+    Raster_RectCopy(to, toPitch, rows, header.pitch, header.bpp / 8, 0, 0, 0, 0, header.width,
+                    header.height);
+  };
+  // The library copies the pixels of a stored block over its caller's pointer, so they are taken
+  // from the block here.
+  if (!header.isCoded()) {
+    copy(block + sizeof header);
+    return;
+  }
+  uint8* pixels = nullptr;
+  uint32 pitch, bpp, width, height;
+  Raster_Decompress(block, &pixels, &pitch, &bpp, &width, &height);
+  const std::unique_ptr<uint8, decltype(&free)> owner(pixels, free);
+  copy(pixels);
+}
+
+}  // namespace tool
