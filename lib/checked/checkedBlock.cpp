@@ -56,22 +56,29 @@ RasterStatus checkLimits(const RasterBlockInfo& info, uint64 size, const RasterL
   return keeps ? RASTER_STATUS_OK : RASTER_STATUS_LIMIT;
 }
 
+/// The place of the second word of the next pair of equal words, or `words` when there is none.
+size_t findPair(const uint8* code, size_t at, size_t words) {
+  uint32 previous = wordAt(code, at);
+  for (++at; at < words; ++at) {
+    const uint32 word = wordAt(code, at);
+    if (word == previous) return at;
+    previous = word;
+  }
+  return words;
+}
+
 /// Whether a code makes exactly `total` pixels: literals up to a pair, then a count.
 bool makesPixels(const uint8* code, size_t words, uint64 total) {
   uint64 made = 0;
-  for (size_t i = 0; i < words;) {
-    const uint32 first = wordAt(code, i++);
-    uint32 previous = first;
-    bool paired = false;
-    ++made;
-    while (i < words && !paired) {
-      const uint32 word = wordAt(code, i++);
-      paired = word == previous;
-      previous = word;
-      ++made;
+  for (size_t at = 0; at < words;) {
+    const size_t pair = findPair(code, at, words);
+    if (pair + 1 >= words) {  // no pair, or one without a count
+      made += words - at;
+      break;
     }
-    if (paired && i < words) made += wordAt(code, i++);
+    made += pair + 1 - at + uint64{wordAt(code, pair + 1)};
     if (made > total) return false;
+    at = pair + 2;
   }
   return made == total;
 }

@@ -55,10 +55,10 @@ inline uint64 rowsBytes(uint32 width, uint32 height, uint32 pitch, uint32 bpp) {
 inline RasterStatus checkView(const RasterView* view) {
   if (view == nullptr) return RASTER_STATUS_NULL;
   if (!isFormat(view->depth, view->bpp)) return RASTER_STATUS_BAD_FORMAT;
-  const bool wholeWords = view->bpp == 16 || view->bpp == 32;
+  // Of pixels of 2 and 4 bytes there are only whole ones in a row.
+  const uint32 part = view->bpp == 16 || view->bpp == 32 ? view->bpp / 8 - 1 : 0;
   if (view->width > INT32_MAX || view->height > INT32_MAX || view->pitch > INT32_MAX ||
-      view->pitch < rowBytes(view->width, view->bpp) ||
-      (wholeWords && view->pitch % (view->bpp / 8) != 0))
+      view->pitch < rowBytes(view->width, view->bpp) || (view->pitch & part) != 0)
     return RASTER_STATUS_BAD_VIEW;
   const uint64 needed = rowsBytes(view->width, view->height, view->pitch, view->bpp);
   if (needed > view->bytes) return RASTER_STATUS_BAD_VIEW;
@@ -120,11 +120,11 @@ struct Side {
 
   /// Cuts off what lies outside; false when there was something.
   bool cut(int64 toSize, int64 fromSize) {
+    if (to >= 0 && from >= 0 && to + size <= toSize && from + size <= fromSize) return true;
     const int64 low = std::max<int64>(0, std::max(-to, -from));
     const int64 high = std::min(size, std::min(toSize - to, fromSize - from));
-    const bool whole = low == 0 && high == size;
     *this = {to + low, from + low, std::max<int64>(0, high - low)};
-    return whole;
+    return false;
   }
 };
 
@@ -141,9 +141,9 @@ inline RasterStatus place(const RasterView& dst, const Rect* rect, const Source&
   }
   *area = {};
   if (column.size <= 0 || row.size <= 0) return RASTER_STATUS_OK;
-  const bool wholeRows = column.cut(dst.width, src.width);
-  const bool wholeColumns = row.cut(dst.height, src.height);
-  if (!(wholeRows && wholeColumns) && flags == 0) return RASTER_STATUS_OUTSIDE;
+  const bool inColumns = column.cut(dst.width, src.width);
+  const bool inRows = row.cut(dst.height, src.height);
+  if (!(inColumns && inRows) && flags == 0) return RASTER_STATUS_OUTSIDE;
   if (column.size == 0 || row.size == 0) return RASTER_STATUS_OK;
   *area = {static_cast<uint32>(column.to),   static_cast<uint32>(row.to),
            static_cast<uint32>(column.from), static_cast<uint32>(row.from),
