@@ -117,9 +117,10 @@ RasterStatus scalePlane(const RasterView& plane, const RasterScaledCursor& size,
   const RasterView around = packedView(padded, size.paddedWidth, size.paddedHeight);
   const RasterView to = packedView(dst, size.width, size.height);
   memset(padded, fill, around.bytes);
-  Raster_RectCopy(padded, around.pitch, plane.data, plane.pitch, 4, 0, 0,
-                  (size.paddedWidth - plane.width) / 2, (size.paddedHeight - plane.height) / 2,
-                  plane.width, plane.height);
+  if (plane.width != 0 && plane.height != 0)  // else there may be no data
+    Raster_RectCopy(padded, around.pitch, plane.data, plane.pitch, 4, 0, 0,
+                    (size.paddedWidth - plane.width) / 2, (size.paddedHeight - plane.height) / 2,
+                    plane.width, plane.height);
   return drawScaled(to, {0, 0, 0, 0, to.width, to.height}, around, factors, smooth);
 }
 

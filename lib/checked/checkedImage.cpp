@@ -55,7 +55,7 @@ void copyRows(const RasterView& to, const RasterView& from) {
 /// Whether rows can be copied up to a multiple of four bytes.
 bool hasPaddedRows(const RasterView& view) {
   const uint64 row = paddedRow(view.width, view.bpp);
-  if (view.height == 0 || view.bpp == 16 || view.bpp == 32) return true;
+  if (view.bpp == 16 || view.bpp == 32) return true;
   return view.pitch >= row && uint64{view.height - 1} * view.pitch + row <= view.bytes;
 }
 
@@ -203,6 +203,7 @@ RasterStatus RasterChecked_EncodeBmp(const ImageUtilImage* image, size_t bytes, 
   RasterView view;
   const RasterStatus status = RasterChecked_ImageView(image, bytes, &view);
   if (status != RASTER_STATUS_OK) return status;
+  if (view.width == 0 || view.height == 0) return RASTER_STATUS_BAD_ARGUMENT;
   if (view.bpp == 8 && image->numColors > kMaxColors) return RASTER_STATUS_BAD_ARGUMENT;
   if (bitmapBytes(*image) > UINT32_MAX) return RASTER_STATUS_TOO_BIG;
   return hasPaddedRows(view) ? encodeBitmap(*image, file, fileBytes)

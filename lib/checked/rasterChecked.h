@@ -397,9 +397,9 @@ RASTER_EXPORT RasterStatus RasterChecked_EncodePng(const ImageUtilImage* image, 
 // ---- Images ------------------------------------------------------------------------------------
 
 /// ImageUtil_ConstructBMPBuffer: encodes an image as a bitmap file into a new block that the caller
-/// releases with free. Images as for RasterChecked_EncodePng, but pictures without pixels and
-/// palettes without colours are written as well. Files of 4 GiB and more are TOO_BIG. The padding
-/// of rows is zero where `bytes` or `bytesPerLine` do not reach that far.
+/// releases with free. Images as for RasterChecked_EncodePng, but of any size and also with no
+/// colours. Files of 4 GiB and more are TOO_BIG. The padding of rows is zero where `bytes` or
+/// `bytesPerLine` do not reach that far.
 RASTER_EXPORT RasterStatus RasterChecked_EncodeBmp(const ImageUtilImage* image, size_t bytes,
                                                    uint8** file, size_t* fileBytes);
 

@@ -51,7 +51,8 @@ struct PaddedCopy {
 TEST(RasterChecked_EncodeBmp, MakesTheFileOfTheExactEncoder) {
   Random random(101);
   for (int round = 0; round < 2000; ++round) {
-    const GuardedView view(random, tests::someFormat(random), random.below(40), random.below(40));
+    const GuardedView view(random, tests::someFormat(random), 1 + random.below(40),
+                           1 + random.below(40));
     const ImageUtilImage image = imageOf(random, view.view());
     uint8* file = nullptr;
     size_t size = 0;
@@ -86,6 +87,11 @@ TEST(RasterChecked_EncodeBmp, RefusesWhatNoFileCanHold) {
   image.numColors = 256;
   EXPECT_EQ(RasterChecked_EncodeBmp(&image, view.view().bytes - 1, &file, &size),
             RASTER_STATUS_BAD_VIEW);
+  image.width = 0;
+  image.height = 0x7FFFFFFF;  // rows of nothing take time as well
+  EXPECT_EQ(RasterChecked_EncodeBmp(&image, view.view().bytes, &file, &size),
+            RASTER_STATUS_BAD_ARGUMENT);
+  image.width = image.height = 10;
   EXPECT_EQ(RasterChecked_EncodeBmp(&image, view.view().bytes, nullptr, &size), RASTER_STATUS_NULL);
   EXPECT_EQ(RasterChecked_EncodeBmp(&image, view.view().bytes, &file, nullptr), RASTER_STATUS_NULL);
   EXPECT_EQ(RasterChecked_EncodeBmp(nullptr, 0, &file, &size), RASTER_STATUS_NULL);
