@@ -23,7 +23,11 @@ if(RASTER_SANITIZE)
   target_link_options(raster_settings INTERFACE -fsanitize=address,undefined)
 endif()
 
-# The two shared libraries.
+if(RASTER_BUILD_FUZZ)
+  target_compile_options(raster_settings INTERFACE -fsanitize=fuzzer-no-link)
+endif()
+
+# The shared libraries.
 add_library(raster_library_settings INTERFACE)
 target_link_libraries(raster_library_settings INTERFACE raster_settings)
 target_compile_options(raster_library_settings INTERFACE
