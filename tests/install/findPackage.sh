@@ -5,3 +5,4 @@ installHere
 buildProject "$here/package" -Draster_DIR="$libraries/cmake/raster"
 run "$work/build/consumerC"
 run "$work/build/consumerCpp"
+run "$work/build/consumerChecked"

@@ -3,16 +3,19 @@
 . "$(dirname "$0")/common.sh"
 command -v pkg-config >/dev/null || { echo "skipped: no pkg-config here"; exit 77; }
 installHere
-flags() { PKG_CONFIG_PATH=$packages pkg-config "$1" raster; }
+flags() { PKG_CONFIG_PATH=$packages pkg-config "$1" "${2:-raster}"; }
 
 # Only what pkg-config says, the word size, and where libpng of that word size is.
 $CC -std=c11 "$here/consumer.c" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerC"
 $CXX -std=c++17 "$here/consumer.cpp" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumerCpp"
+$CC -std=c11 "$here/consumerChecked.c" $(flags --cflags raster-checked) $(flags --libs raster-checked) \
+  $LDFLAGS -o "$work/consumerChecked"
+LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$work/consumerChecked"
 LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$work/consumerC"
 LD_LIBRARY_PATH="$libraries:$PNG_FOLDER" "$work/consumerCpp"
 
 [ "$(flags --modversion)" = "$(PKG_CONFIG_PATH=$packages pkg-config --modversion tarnlibs)" ]
-PKG_CONFIG_PATH=$packages pkg-config --validate raster tarnlibs
+PKG_CONFIG_PATH=$packages pkg-config --validate raster raster-checked tarnlibs
 
 # Installed in /usr, the package says nothing that the compiler knows already.
 "$CMAKE" -G Ninja -S "$SOURCE" -B "$work/usr" ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} \
