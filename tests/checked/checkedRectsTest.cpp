@@ -21,29 +21,8 @@ using tests::naiveArea;
 using tests::NaiveArea;
 using tests::PixelFormat;
 using tests::Random;
-
-uint32 someSize(Random& random) { return random.below(8) == 0 ? 0 : 1 + random.below(40); }
-
-/// Views of a destination and a source, a rectangle, and a place in the source.
-struct Scene {
-  Scene(Random& random, PixelFormat dstFormat, PixelFormat srcFormat)
-      : dst(random, dstFormat, someSize(random), someSize(random)),
-        src(random, srcFormat, someSize(random), someSize(random)),
-        rect(tests::someRectFor(random, dst.view())),
-        srcX(random.below(6) == 0 ? tests::someCoordinate(random) : random.between(-2, 20)),
-        srcY(random.below(6) == 0 ? tests::someCoordinate(random) : random.between(-2, 20)),
-        flags(random.below(2)) {}
-
-  NaiveArea area() const {
-    return naiveArea(rect, dst.view(), srcX, srcY, src.view().width, src.view().height);
-  }
-
-  GuardedView dst;
-  GuardedView src;
-  Rect rect;
-  int32 srcX, srcY;
-  uint32 flags;
-};
+using tests::Scene;
+using tests::someSize;
 
 /// Runs the checked call and the exact one on the same memory. `exact` draws what the naive clip
 /// has left. The source must stay as it is.

@@ -126,6 +126,29 @@ inline RasterStatus statusFor(const NaiveArea& area, uint32 flags) {
   return area.isClipped() && flags == 0 ? RASTER_STATUS_OUTSIDE : RASTER_STATUS_OK;
 }
 
+inline uint32 someSize(Random& random) { return random.below(8) == 0 ? 0 : 1 + random.below(40); }
+
+/// Views of a destination and a source, a rectangle, and a place in the source.
+struct Scene {
+  Scene(Random& random, PixelFormat dstFormat, PixelFormat srcFormat)
+      : dst(random, dstFormat, someSize(random), someSize(random)),
+        src(random, srcFormat, someSize(random), someSize(random)),
+        rect(someRectFor(random, dst.view())),
+        srcX(random.below(6) == 0 ? someCoordinate(random) : random.between(-2, 20)),
+        srcY(random.below(6) == 0 ? someCoordinate(random) : random.between(-2, 20)),
+        flags(random.below(2)) {}
+
+  NaiveArea area() const {
+    return naiveArea(rect, dst.view(), srcX, srcY, src.view().width, src.view().height);
+  }
+
+  GuardedView dst;
+  GuardedView src;
+  Rect rect;
+  int32 srcX, srcY;
+  uint32 flags;
+};
+
 inline std::string describe(const RasterView& v) {
   return std::to_string(v.width) + "x" + std::to_string(v.height) + " " + std::to_string(v.depth) +
          "/" + std::to_string(v.bpp) + " pitch " + std::to_string(v.pitch);

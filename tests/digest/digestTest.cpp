@@ -21,8 +21,7 @@ using tests::Choices;
 using tests::Sha256;
 
 constexpr int kCases = 200000;
-constexpr char kDigest[] = 
-    "7418b4258beb5a56658c1ba5d7cc2ad155f535e3a8ee32b6724d3b0de4d06435";
+constexpr char kDigest[] = "7418b4258beb5a56658c1ba5d7cc2ad155f535e3a8ee32b6724d3b0de4d06435";
 
 class HashSink : public tests::Sink {
  public:
