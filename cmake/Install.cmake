@@ -4,11 +4,12 @@ include(CMakePackageConfigHelpers)
 install(TARGETS raster raster-checked tarnlibs EXPORT rasterTargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
-install(FILES
+set(RASTER_PUBLIC_HEADERS
   lib/raster/raster.h lib/raster/rasterExport.h ${RASTER_GENERATED_HEADERS}/rasterVersion.h
   lib/rect/rect.h lib/image/imageUtil.h lib/checked/rasterChecked.h
   lib/tarnlibs/baseTypes.h lib/tarnlibs/message.h lib/tarnlibs/utilAlloc.h
-  lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h
+  lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h)
+install(FILES ${RASTER_PUBLIC_HEADERS}
   DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/raster)
 
 install(EXPORT rasterTargets NAMESPACE raster::
@@ -41,3 +42,5 @@ foreach(package raster raster-checked tarnlibs)
   install(FILES ${PROJECT_BINARY_DIR}/${package}.pc
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()
+
+include(cmake/Docs.cmake)

@@ -1,20 +1,21 @@
 // SPDX-License-Identifier: MIT
-//
-// Images in memory: read from PNG, written as PNG and BMP, combined, cropped and scaled.
-//
-// Conventions that hold for every function unless it says otherwise:
-// - An image is an ImageUtilImage record of the caller. Its pixels are one block of `height` rows
-//   of `bytesPerLine` bytes. Colours lie in memory as blue, green, red.
-// - A function that fails returns false and says nothing. libpng's own messages about a stream that
-//   it cannot read or write go to standard error, as libpng has them.
-// - Pixels that a function hands out come from malloc and belong to the record; release them with
-//   ImageUtil_FreeImageData.
-// - Memory: decoding and cropping allocate with UtilSafeMalloc0 and UtilSafeCalloc0, which end the
-//   process when there is none (for decoding that may be height x bytesPerLine bytes, whatever the
-//   stream really holds: look at its header first). Every other function returns false.
-// - No pointer may be null unless the function says what happens then. Records, pixels, streams and
-//   buffers must not overlap one another.
-// - No function keeps state or takes a lock; calls on different records may run on several threads.
+/// \file
+/// Images in memory: read from PNG, written as PNG and BMP, combined, cropped and scaled.
+///
+/// Conventions that hold for every function unless it says otherwise:
+/// - An image is an ImageUtilImage record of the caller. Its pixels are one block of `height` rows
+///   of `bytesPerLine` bytes. Colours lie in memory as blue, green, red.
+/// - A function that fails returns false and says nothing. libpng's own messages about a stream
+///   that it cannot read or write go to standard error, as libpng has them.
+/// - Pixels that a function hands out come from malloc and belong to the record; release them with
+///   ImageUtil_FreeImageData.
+/// - Memory: decoding and cropping allocate with UtilSafeMalloc0 and UtilSafeCalloc0, which end the
+///   process when there is none (for decoding that may be height x bytesPerLine bytes, whatever the
+///   stream really holds: look at its header first). Every other function returns false.
+/// - No pointer may be null unless the function says what happens then. Records, pixels, streams
+///   and buffers must not overlap one another.
+/// - No function keeps state or takes a lock; calls on different records may run on several
+///   threads.
 
 #ifndef RASTER_IMAGE_UTIL_H
 #define RASTER_IMAGE_UTIL_H
@@ -27,13 +28,16 @@
 extern "C" {
 #endif
 
+/// \defgroup image_records Images and choices
+/// @{
+
 struct png_struct_def;  // libpng's structure; png_structp is a pointer to it
 
 /// One palette entry, in the order of memory of a 32-bit pixel.
 typedef struct ImageUtilColor {
-  uint8 blue;
-  uint8 green;
-  uint8 red;
+  uint8 blue;      ///< 0 to 255
+  uint8 green;     ///< 0 to 255
+  uint8 red;       ///< 0 to 255
   uint8 reserved;  ///< written as 0, never read
 } ImageUtilColor;
 
@@ -51,7 +55,7 @@ typedef struct ImageUtilImage {
   uint32 bytesPerLine;  ///< from one row to the next
   uint32 flags;         ///< IMAGE_FLAG_...
   uint32 numColors;     ///< valid palette entries, at most 256
-  ImageUtilColor palette[256];
+  ImageUtilColor palette[256];  ///< what the indices of 8 bpp stand for
   uint8* data;  ///< the rows; 24 bpp are blue, green, red; 32 bpp have alpha or a filler after them
 } ImageUtilImage;
 
@@ -71,7 +75,7 @@ typedef struct ImageUtilPNGWriteParams {
 
 /// A host's memory. Each operation is given `context` first.
 typedef struct ImageUtilMemOps {
-  void* context;
+  void* context;                                                 ///< whatever the host likes
   void* (*alloc)(void* context, size_t size);                    ///< null when there is no memory
   void (*free)(void* context, void* block);                      ///< must accept null
   void* (*realloc)(void* context, void* block, size_t newSize);  ///< null: `block` is as it was
@@ -90,6 +94,8 @@ typedef struct ImageUtilBufferWriteCtx {
   uint32 capacity;                ///< bytes allocated; begins at 0
   const ImageUtilMemOps* memops;  ///< where the buffer comes from
 } ImageUtilBufferWriteCtx;
+
+/// @}
 
 // ---- Reading -----------------------------------------------------------------------------------
 

@@ -1,24 +1,24 @@
 // SPDX-License-Identifier: MIT
-//
-// Raster graphics on frame buffers that the caller owns: fill, copy, raster operations, tiling, bit
-// planes, format conversion, comparison, blending, scaling, cursors, video and compression.
-//
-// Conventions that hold for every function unless it says otherwise:
-// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next),
-//   and a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel. Base
-//   and pitch may have any alignment. Nothing outside the named rectangle is read or written.
-// - No pointer may be null unless its function says so, not even where nothing is drawn.
-// - Memory that is read and memory that is written must not overlap unless the function says what
-//   happens then.
-// - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
-// - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
-//   the lowest address.
-// - Fatal errors go through Warning and Panic (message.h); Panic does not return.
-// - Memory: only scaling (Raster_Scale, Raster_ScaleAlphaCursor, Raster_ScaleColorCursor),
-//   Raster_Compress and Raster_Decompress allocate, with UtilSafeMalloc0, which ends the process
-//   when there is none.
-// - No function keeps state (but for flags of messages that are logged once) or takes a lock; calls
-//   on disjoint memory may run on several threads.
+/// \file
+/// Raster graphics on frame buffers that the caller owns: fill, copy, raster operations, tiling,
+/// bit planes, format conversion, comparison, blending, scaling, cursors, video and compression.
+///
+/// Conventions that hold for every function unless it says otherwise:
+/// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next),
+///   and a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel.
+///   Base and pitch may have any alignment. Nothing outside the named rectangle is read or written.
+/// - No pointer may be null unless its function says so, not even where nothing is drawn.
+/// - Memory that is read and memory that is written must not overlap unless the function says what
+///   happens then.
+/// - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
+/// - A pixel value is an unsigned 32-bit word stored as its low 1, 2, 3 or 4 bytes, lowest byte at
+///   the lowest address.
+/// - Fatal errors go through Warning and Panic (message.h); Panic does not return.
+/// - Memory: only scaling (Raster_Scale, Raster_ScaleAlphaCursor, Raster_ScaleColorCursor),
+///   Raster_Compress and Raster_Decompress allocate, with UtilSafeMalloc0, which ends the process
+///   when there is none.
+/// - No function keeps state (but for flags of messages that are logged once) or takes a lock;
+///   calls on disjoint memory may run on several threads.
 
 #ifndef RASTER_RASTER_H
 #define RASTER_RASTER_H
@@ -187,11 +187,11 @@ RASTER_EXPORT void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const u
                                             uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
                                             uint32 height);
 
+/// @{
 /// The blocks of Raster_RectPixmapROPcopy by pixel size (8, 16, 24, 32 bits): combine the rectangle
-/// at (srcX, srcY) of `src` into the one at (dstX, dstY) of `dst`, without wrapping, always top
-/// down and from left to right. Nothing looks for overlap: where `src` lies in what has been
-/// written already, the new pixels are the source. Operation 3 is such a walk too, not
-/// Raster_RectCopy. Rows step as \ref raster_tiling says.
+/// at (srcX, srcY) of `src` into that at (dstX, dstY) of `dst`, without wrapping, top down and from
+/// left to right (\ref raster_tiling has the steps). Nothing looks for overlap: where `src` lies in
+/// what is written already, the new pixels count. Operation 3 is such a walk, not Raster_RectCopy.
 RASTER_EXPORT void RasterRectPixmapROPcopy8(uint8* dst, uint32 dstPitch, const uint8* src,
                                             uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
                                             uint32 dstX, uint32 dstY, uint32 width, uint32 height);
@@ -204,7 +204,7 @@ RASTER_EXPORT void RasterRectPixmapROPcopy24(uint8* dst, uint32 dstPitch, const 
 RASTER_EXPORT void RasterRectPixmapROPcopy32(uint8* dst, uint32 dstPitch, const uint8* src,
                                              uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 rop,
                                              uint32 dstX, uint32 dstY, uint32 width, uint32 height);
-
+/// @}
 /// @}
 
 // ---- Bit planes --------------------------------------------------------------------------------
@@ -255,13 +255,13 @@ RASTER_EXPORT void RasterBitsToPixels8(const uint8* bits, uint32 bitsPitch, uint
                                        uint32 foreground, uint32 background);
 RASTER_EXPORT void RasterBitsToPixels16(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                         uint32 dstPitch, int32 width, int32 height,
-                                        uint32 foreground, uint32 background);
+                                        uint32 foreground, uint32 background);  ///< for 16 bits
 RASTER_EXPORT void RasterBitsToPixels24(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                         uint32 dstPitch, int32 width, int32 height,
-                                        uint32 foreground, uint32 background);
+                                        uint32 foreground, uint32 background);  ///< for 24 bits
 RASTER_EXPORT void RasterBitsToPixels32(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                         uint32 dstPitch, int32 width, int32 height,
-                                        uint32 foreground, uint32 background);
+                                        uint32 foreground, uint32 background);  ///< for 32 bits
 
 /// Raster_BitsToPixelsStencil for one pixel size (8, 16, 24, 32 bits).
 RASTER_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitch, uint8* dst,
@@ -269,13 +269,13 @@ RASTER_EXPORT void RasterBitsToPixelsStencil8(const uint8* bits, uint32 bitsPitc
                                               uint32 foreground);
 RASTER_EXPORT void RasterBitsToPixelsStencil16(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                                uint32 dstPitch, int32 width, int32 height,
-                                               uint32 foreground);
+                                               uint32 foreground);  ///< for 16 bits
 RASTER_EXPORT void RasterBitsToPixelsStencil24(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                                uint32 dstPitch, int32 width, int32 height,
-                                               uint32 foreground);
+                                               uint32 foreground);  ///< for 24 bits
 RASTER_EXPORT void RasterBitsToPixelsStencil32(const uint8* bits, uint32 bitsPitch, uint8* dst,
                                                uint32 dstPitch, int32 width, int32 height,
-                                               uint32 foreground);
+                                               uint32 foreground);  ///< for 32 bits
 
 /// @}
 
@@ -405,17 +405,17 @@ RASTER_EXPORT void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src
 
 /// One rectangle of a list, by origin and size.
 typedef struct RectListEntry {
-  int32 x;
-  int32 y;
-  int32 width;
-  int32 height;
+  int32 x;       ///< the left edge, in pixels
+  int32 y;       ///< the top edge
+  int32 width;   ///< in pixels; not positive ends the list
+  int32 height;  ///< in pixels
 } RectListEntry;
 
 enum { RASTER_RECT_LIST_SIZE = 16 };
 
 /// A region as disjoint rectangles; it ends at the first entry whose width is not positive.
 typedef struct RectList {
-  RectListEntry rects[RASTER_RECT_LIST_SIZE];
+  RectListEntry rects[RASTER_RECT_LIST_SIZE];  ///< by top, then by x
 } RectList;
 
 /// Sets all 16 entries to zero.
@@ -650,23 +650,23 @@ RASTER_EXPORT void Raster_ScaleExit(void);
 /// Returns true when the rectangle was drawn or there was nothing to draw (an empty rectangle, a
 /// size of 0). Returns false, and draws nothing, in this order:
 /// - when x1 or y1 is negative, or x2 or y2 beyond the destination;
-
+///
 /// - when dstBpp < dstDepth, with
 ///   Log("%s: Dest color format (depth %d, BPP %d) is not supported.\n");
-
+///
 /// - when the formats are no pair from above, with
 ///   Log("%s: Color depth conversion from D%dB%d to D%dB%d is not supported.\n");
-
+///
 /// - when dstBpp is no multiple of 8;
-
+///
 /// - when dstDepth is no multiple of 8 (so depth 15 is refused), with
 ///   Log("Raster_Scale: Dest depth %d is not supported.\n");
-
+///
 /// - when a size is 32768 or more;
-
 /// - when a factor is not greater than 1/32767.
-/// %s is "Raster_Scale". Each message is logged at most once per process (a race of threads cannot
-/// repeat it); that is all the state there is. Working memory comes from UtilSafeMalloc0.
+///
+/// The name in these messages is "Raster_Scale". Each is logged at most once per process (a race of
+/// threads cannot repeat it); that is all the state. Working memory comes from UtilSafeMalloc0.
 RASTER_EXPORT bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth,
                                 uint32 dstWidth, uint32 dstHeight, uint32 dstIgnored, int32 x1,
                                 int32 y1, int32 x2, int32 y2, const void* srcBits, int32 srcPitch,
@@ -701,11 +701,11 @@ enum { RASTER_CURSOR_MASK = 0, RASTER_CURSOR_ALPHA = 1 };
 /// A mask cursor's planes have `height` rows of `width` x (bpp / 8) bytes each, without gaps.
 /// Screen pixels survive where the AND plane is all ones, and are inverted where the XOR plane is.
 typedef struct RasterCursor {
-  uint32 type;
-  int32 hotX;  ///< the hot spot within the image, in pixels
-  int32 hotY;
-  uint32 width;  ///< in pixels
-  uint32 height;
+  uint32 type;    ///< RASTER_CURSOR_...
+  int32 hotX;     ///< the hot spot within the image, in pixels
+  int32 hotY;     ///< its row
+  uint32 width;   ///< in pixels
+  uint32 height;  ///< in rows
   __extension__ union {
     uint8* pixels;  ///< RASTER_CURSOR_ALPHA: rows of 4-byte pixels as for Raster_AlphaBlend
     __extension__ struct {
@@ -719,22 +719,22 @@ typedef struct RasterCursor {
 
 /// A frame buffer's size in pixels, format and pitch in bytes.
 typedef struct RasterFrameBufferDesc {
-  uint32 width;
-  uint32 height;
-  uint32 depth;
-  uint32 bpp;
-  uint32 pitch;
+  uint32 width;   ///< in pixels
+  uint32 height;  ///< in rows
+  uint32 depth;   ///< colour depth in bits
+  uint32 bpp;     ///< bits per pixel in memory
+  uint32 pitch;   ///< bytes from one row to the next
 } RasterFrameBufferDesc;
 
 /// The visible part of a cursor: its place and size in the frame buffer, and its first column and
 /// row in the cursor's image.
 typedef struct RasterCursorBox {
-  int32 x;
-  int32 y;
-  int32 width;
-  int32 height;
-  int32 srcX;
-  int32 srcY;
+  int32 x;       ///< the left edge in the frame buffer, in pixels
+  int32 y;       ///< the top edge there
+  int32 width;   ///< of the visible part, in pixels
+  int32 height;  ///< in rows
+  int32 srcX;    ///< the first visible column of the cursor
+  int32 srcY;    ///< the first visible row
 } RasterCursorBox;
 
 /// The bytes of a cursor plane whose rows are padded to a multiple of 32 bits:
@@ -821,9 +821,9 @@ RASTER_EXPORT void Raster_ScaleColorCursor(uint8* andDst, uint8* xorDst, const R
 
 /// How a component is put into a channel: ((component * multiplier) >> shift) & mask.
 typedef struct RasterRGBParam {
-  uint32 multiplier;
-  uint32 shift;
-  uint32 mask;
+  uint32 multiplier;  ///< applied first, modulo 2^32
+  uint32 shift;       ///< then to the right, in bits
+  uint32 mask;        ///< the bits of the channel
 } RasterRGBParam;
 
 /// The frame layouts of Raster_YUVtoRGB: four characters, the first one in the low byte.

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-//
-// The mark of the names that libraster exports. A program that uses them sees plain declarations.
+/// \file
+/// The mark of the names that libraster exports. A program that uses them sees plain declarations.
 
 #ifndef RASTER_RASTER_EXPORT_H
 #define RASTER_RASTER_EXPORT_H

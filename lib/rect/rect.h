@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: MIT
-//
-// Rectangles and points: building, comparison, translation, intersection, union, containment, and
-// the transforms that carry them from one frame of reference into another.
-//
-// Coordinates are signed 32-bit; `right` and `bottom` are exclusive. Every function accepts any
-// 32-bit values: results that would overflow saturate, and the functions with a result say so.
-// No function keeps state; any thread may call any of them.
+/// \file
+/// Rectangles and points: building, comparison, translation, intersection, union, containment, and
+/// the transforms that carry them from one frame of reference into another.
+///
+/// Coordinates are signed 32-bit; `right` and `bottom` are exclusive. Any values are accepted: what
+/// would overflow saturates, and functions with a result say so. Any thread may call any of them.
 
 #ifndef RASTER_RECT_H
 #define RASTER_RECT_H
@@ -20,15 +19,16 @@ extern "C" {
 /// The points (x, y) with left <= x < right and top <= y < bottom. Empty when right <= left or
 /// bottom <= top; an empty rectangle keeps whatever coordinates it has.
 typedef struct Rect {
-  int32 left;
-  int32 top;
-  int32 right;
-  int32 bottom;
+  int32 left;    ///< the first column
+  int32 top;     ///< the first row
+  int32 right;   ///< the column after the last one
+  int32 bottom;  ///< the row after the last one
 } Rect;
 
+/// A pixel, by its place.
 typedef struct Point {
-  int32 x;
-  int32 y;
+  int32 x;  ///< the column
+  int32 y;  ///< the row
 } Point;
 
 // ---- Rectangles --------------------------------------------------------------------------------

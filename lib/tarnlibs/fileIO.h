@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-//
-// Whole-call file access: every read and write goes on until all bytes are moved, the file ends or
-// an error comes, whatever interruptions and short counts the system gives. Files may be over
-// 2 GiB, in 32-bit programs too.
-//
-// Results are FileIOResult codes: FILEIO_SUCCESS (0) or a positive number that
-// FileIO_ErrorEnglish turns into a plain English text.
+/// \file
+/// Whole-call file access: every read and write goes on until all bytes are moved, the file ends or
+/// an error comes, whatever interruptions and short counts the system gives. Files may be over
+/// 2 GiB, in 32-bit programs too.
+///
+/// Results are FileIOResult codes: FILEIO_SUCCESS (0) or a positive number that
+/// FileIO_ErrorEnglish turns into a plain English text.
 
 #ifndef TARNLIBS_FILE_IO_H
 #define TARNLIBS_FILE_IO_H
@@ -16,11 +16,15 @@
 extern "C" {
 #endif
 
+/// \defgroup tarnlibs_files File access
+/// @{
+
 /// An open file, or none. The record is the caller's.
 typedef struct FileIODescriptor {
   int posix;  ///< the file descriptor, -1 when none is open
 } FileIODescriptor;
 
+/// What a call came to.
 typedef enum FileIOResult {
   FILEIO_SUCCESS = 0,
   FILEIO_ERROR = 1,           ///< an error that none of the others names
@@ -47,14 +51,15 @@ enum {
   FILEIO_OPEN_CREATE_SAFE = 3,   ///< it is created and must not exist
   FILEIO_OPEN_CREATE_EMPTY = 4,  ///< it is created, or truncated when it exists
 };
+
 /// Marks `file` as not open, without looking at what it held.
 TARNLIBS_EXPORT void FileIO_Invalidate(FileIODescriptor* file);
 
 /// Opens `path` (a system path, relative to the working folder unless it begins with '/') into
 /// `file`. New files get mode 0666 less the umask. A directory gives FILEIO_IS_DIRECTORY, in
-/// reading too. For reading alone only regular files are opened, so that neither this call nor a read
-/// waits for anybody: a pipe, a socket or a device gives FILEIO_NOT_A_FILE. On failure `file` is left
-/// not open.
+/// reading too. For reading alone only regular files are opened, so that neither this call nor a
+/// read waits for anybody: a pipe, a socket or a device gives FILEIO_NOT_A_FILE. On failure `file`
+/// is left not open.
 TARNLIBS_EXPORT FileIOResult FileIO_Open(FileIODescriptor* file, const char* path, int access,
                                          int action);
 
@@ -75,6 +80,8 @@ TARNLIBS_EXPORT int64 FileIO_GetSize(const FileIODescriptor* file);
 
 /// Returns a short English text for a result ("Success" for 0). The text is constant.
 TARNLIBS_EXPORT const char* FileIO_ErrorEnglish(FileIOResult result);
+
+/// @}
 
 #ifdef __cplusplus
 }

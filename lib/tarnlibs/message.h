@@ -1,19 +1,19 @@
 // SPDX-License-Identifier: MIT
-//
-// Messages of the libraries: Log for information, Warning for a fault about to be fatal, Panic for
-// the fatal fault itself.
-//
-// All three take a printf format and its arguments; a text brings its own line end. By default a
-// message goes to standard error. A host replaces that in one of two ways: it installs a sink per
-// kind with the setters below, or it defines a function of the same name (Log, Warning, Panic) in
-// the program, which the dynamic linker then prefers to the one here.
-//
-// That happens to a program that has functions of these names for purposes of its own, too: they
-// receive the libraries' messages, and where their parameters are other ones the program crashes at
-// the first. Make such functions static, or compile them with hidden visibility.
-//
-// Threads: any function may be called from any thread. A setter takes effect for messages that
-// begin after it returns.
+/// \file
+/// Messages of the libraries: Log for information, Warning for a fault about to be fatal, Panic for
+/// the fatal fault itself.
+///
+/// All three take a printf format and its arguments; a text brings its own line end. By default a
+/// message goes to standard error. A host replaces that in one of two ways: it installs a sink per
+/// kind with the setters below, or it defines a function of the same name (Log, Warning, Panic) in
+/// the program, which the dynamic linker then prefers to the one here.
+///
+/// That happens to a program that has functions of these names for purposes of its own, too: they
+/// receive the libraries' messages, and where their parameters are other ones the program crashes
+/// at the first. Make such functions static, or compile them with hidden visibility.
+///
+/// Threads: any function may be called from any thread. A setter takes effect for messages that
+/// begin after it returns.
 
 #ifndef TARNLIBS_MESSAGE_H
 #define TARNLIBS_MESSAGE_H
@@ -23,6 +23,9 @@
 #ifdef __cplusplus
 extern "C" {
 #endif
+
+/// \defgroup tarnlibs_messages Messages
+/// @{
 
 /// Receives one formatted message, line end included. The text is valid during the call only.
 typedef void (*MessageSink)(const char* message);
@@ -48,6 +51,8 @@ TARNLIBS_EXPORT MessageSink Warning_SetSink(MessageSink sink);
 /// sink may leave by longjmp (no lock is held and nothing in the libraries is left half done that
 /// a later call would meet, but memory of the interrupted call is not released).
 TARNLIBS_EXPORT MessageSink Panic_SetSink(MessageSink sink);
+
+/// @}
 
 #ifdef __cplusplus
 }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-//
-// Allocation that never returns null. Memory comes from malloc and calloc; release it with free.
+/// \file
+/// Allocation that never returns null. Memory comes from malloc and calloc; release it with free.
 
 #ifndef TARNLIBS_UTIL_ALLOC_H
 #define TARNLIBS_UTIL_ALLOC_H
@@ -10,6 +10,9 @@
 #ifdef __cplusplus
 extern "C" {
 #endif
+
+/// \defgroup tarnlibs_allocation Allocation
+/// @{
 
 /// Returns `size` bytes, not initialised. A size of 0 gives a pointer that can be freed. When
 /// memory is exhausted the call ends in Panic("Out of memory: %zu bytes\n").
@@ -28,6 +31,8 @@ TARNLIBS_EXPORT void* UtilSafeCalloc0(size_t count, size_t size);
 /// other way than by returning. Attempts may be nested; other threads are not concerned. A host's
 /// own UtilSafeMalloc0 or UtilSafeCalloc0 knows of no attempt.
 TARNLIBS_EXPORT bool UtilSafeAttempt(void (*body)(void* context), void* context);
+
+/// @}
 
 #ifdef __cplusplus
 }
