@@ -5,8 +5,9 @@ install(TARGETS raster raster-checked tarnlibs EXPORT rasterTargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
 set(RASTER_PUBLIC_HEADERS
-  lib/raster/raster.h lib/raster/rasterExport.h ${RASTER_GENERATED_HEADERS}/rasterVersion.h
-  lib/rect/rect.h lib/image/imageUtil.h lib/checked/rasterChecked.h
+  lib/raster/raster.h lib/raster/raster.hpp lib/raster/rasterExport.h
+  ${RASTER_GENERATED_HEADERS}/rasterVersion.h lib/rect/rect.h lib/image/imageUtil.h
+  lib/checked/rasterChecked.h
   lib/tarnlibs/baseTypes.h lib/tarnlibs/message.h lib/tarnlibs/utilAlloc.h
   lib/tarnlibs/dynBuf.h lib/tarnlibs/fileIO.h)
 install(FILES ${RASTER_PUBLIC_HEADERS}
@@ -43,4 +44,6 @@ foreach(package raster raster-checked tarnlibs)
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()
 
+install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR} PATTERN CMakeLists.txt EXCLUDE
+  PATTERN readme.cmake EXCLUDE)
 include(cmake/Docs.cmake)
