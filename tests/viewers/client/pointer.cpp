@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: MIT
+
+#include <xcb/xcb.h>
+#include <xcb/xfixes.h>
+
+#include <cstdlib>
+#include <memory>
+
+#include "link.h"
+#include "screen.h"
+
+namespace viewers {
+namespace {
+
+using Connection = std::unique_ptr<xcb_connection_t, decltype(&xcb_disconnect)>;
+template <class Reply> using Owned = std::unique_ptr<Reply, decltype(&free)>;
+
+}  // namespace
+
+Pointer pointerOf(const std::string& display) {
+  const Connection x(xcb_connect(display.c_str(), nullptr), xcb_disconnect);
+  if (xcb_connection_has_error(x.get()) != 0) throw Broken("no connection to display " + display);
+  // The extension has to hear which version is spoken.
+  const auto version = xcb_xfixes_query_version(x.get(), 4, 0);
+  const Owned<xcb_xfixes_query_version_reply_t> known(
+      xcb_xfixes_query_version_reply(x.get(), version, nullptr), free);
+  const auto request = xcb_xfixes_get_cursor_image(x.get());
+  const Owned<xcb_xfixes_get_cursor_image_reply_t> reply(
+      xcb_xfixes_get_cursor_image_reply(x.get(), request, nullptr), free);
+  if (known == nullptr || reply == nullptr) throw Broken("the X server tells no cursor");
+  const uint32_t* words = xcb_xfixes_get_cursor_image_cursor_image(reply.get());
+  const int count = xcb_xfixes_get_cursor_image_cursor_image_length(reply.get());
+  return {{reply->width, reply->height, reply->xhot, reply->yhot, {words, words + count}},
+          reply->x - reply->xhot,
+          reply->y - reply->yhot};
+}
+
+}  // namespace viewers

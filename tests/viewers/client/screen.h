@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: MIT
+//
+// What an X server itself says is on its screen: xwd's dump, and the cursor's image over it.
+
+#ifndef VIEWERS_SCREEN_H
+#define VIEWERS_SCREEN_H
+
+#include <string>
+#include <vector>
+
+#include "picture.h"
+#include "pixelFormat.h"
+#include "session.h"
+
+namespace viewers {
+
+struct Screen {
+  int width = 0, height = 0;
+  std::vector<Colour> colours;  // row by row
+
+  Colour& at(int x, int y) { return colours[static_cast<size_t>(y * width + x)]; }
+};
+
+/// Runs xwd on the display's root window. Throws Broken.
+Screen dumpOf(const std::string& display);
+
+/// The cursor's image and the position of its left upper corner on the screen.
+struct Pointer {
+  CursorImage image;
+  int left = 0, top = 0;
+};
+Pointer pointerOf(const std::string& display);
+/// Draws the pointer where it is, each channel as source + destination * (255 - alpha) / 255.
+void drawPointer(const Pointer& pointer, Screen& screen);
+
+/// How many pixels of the picture are not the screen's, cut to the format; all of them where the
+/// sizes differ.
+size_t differences(const Screen& screen, const Picture& picture, const PixelFormat& format);
+/// The same for a cursor that a viewer got, its hot spot included.
+size_t differences(const CursorImage& wanted, const CursorImage& got, const PixelFormat& format);
+
+}  // namespace viewers
+
+#endif
