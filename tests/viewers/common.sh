@@ -19,12 +19,16 @@ start() {
   background="$started $background"
 }
 
-# stop PROCESS...: ends and waits; what it ended with in $status.
+# stop PROCESS...: ends and waits; what it ended with in $status. Who does not hear is killed.
 stop() {
   for process in "$@"; do
     kill "$process" 2>/dev/null
+    { sleep 10; kill -9 "$process"; } >/dev/null 2>&1 &
+    guard=$!
     wait "$process" 2>/dev/null
     status=$?
+    kill "$guard"
+    wait "$guard" 2>/dev/null
     background=$(echo " $background " | sed "s/ $process / /")
   done
 }
@@ -55,7 +59,7 @@ startScreen() {
 # startServing OPTION...: the live screen of $DISPLAY; $address is where, $serving its process.
 startServing() {
   rm -f serve.out serve.err
-  "$TOOL" serve --display "$DISPLAY" --stats "$@" >serve.out 2>serve.err &
+  "$TOOL" serve --display "$DISPLAY" --stats "$@" >serve.out 2>>serve.err &
   serving=$!
   background="$serving $background"
   for _ in $(seq 300); do

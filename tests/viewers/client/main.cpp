@@ -108,6 +108,8 @@ class Viewer {
     Screen screen = dumpOf(options_.display);
     total_ = screen.colours.size();
     const Pointer pointer = pointerOf(options_.display);
+    if (options_.besidePointer)
+      return differences(screen, session_.picture(), session_.format(), pointer.box());
     if (options_.cursor == 0) {
       drawPointer(pointer, screen);
       return differences(screen, session_.picture(), session_.format());

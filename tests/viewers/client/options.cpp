@@ -22,6 +22,7 @@ const char kHelp[] =
     "  --cursor mask|alpha     takes the cursor apart from the picture\n"
     "  --no-resize             does not know that screens change their size\n"
     "  --compare DISPLAY       compares with this display once the screen stands still\n"
+    "  --beside-pointer        leaves out what lies under the pointer\n"
     "  --until-end-of-input    before that follows the screen until standard input ends\n"
     "  --save FILE             writes the picture as a portable pixmap\n"
     "  --pointer X,Y           moves the pointer there\n"
@@ -71,6 +72,7 @@ enum Choice {
   kCursorKind,
   kNoResize,
   kCompare,
+  kBesidePointer,
   kUntilEnd,
   kSave,
   kPointer,
@@ -86,6 +88,7 @@ const option kOptions[] = {{"help", no_argument, nullptr, kHelpWanted},
                            {"cursor", required_argument, nullptr, kCursorKind},
                            {"no-resize", no_argument, nullptr, kNoResize},
                            {"compare", required_argument, nullptr, kCompare},
+                           {"beside-pointer", no_argument, nullptr, kBesidePointer},
                            {"until-end-of-input", no_argument, nullptr, kUntilEnd},
                            {"save", required_argument, nullptr, kSave},
                            {"pointer", required_argument, nullptr, kPointer},
@@ -118,6 +121,9 @@ void apply(Options& options, int choice, const std::string& value) {
       break;
     case kCompare:
       options.display = value;
+      break;
+    case kBesidePointer:
+      options.besidePointer = true;
       break;
     case kUntilEnd:
       options.untilEndOfInput = true;

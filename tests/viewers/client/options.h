@@ -26,6 +26,8 @@ struct Options {
   bool untilEndOfInput = false;
   /// The encoding in which the cursor comes; 0: it is part of the picture.
   int32_t cursor = 0;
+  /// What lies under the pointer is not compared.
+  bool besidePointer = false;
   bool resizes = true;
   int patienceSeconds = 30;
   std::string saveTo;

@@ -30,7 +30,7 @@ Pointer pointerOf(const std::string& display) {
   if (known == nullptr || reply == nullptr) throw Broken("the X server tells no cursor");
   const uint32_t* words = xcb_xfixes_get_cursor_image_cursor_image(reply.get());
   const int count = xcb_xfixes_get_cursor_image_cursor_image_length(reply.get());
-  return {{reply->width, reply->height, reply->xhot, reply->yhot, {words, words + count}},
+  return {{reply->width, reply->height, reply->xhot, reply->yhot, {words, words + count}, false},
           reply->x - reply->xhot,
           reply->y - reply->yhot};
 }

@@ -113,7 +113,7 @@ int longCutText(const std::string& address) {
 int endlessCutText(const std::string& address) {
   Link link(address, kPatience);
   const Session session(link, "3.8");
-  sendCutText(link, 0xFFFFFFFF, 1 << 20);
+  sendCutText(link, 0x7FFFFFFF, 1 << 20);
   printf("stalled\n");
   fflush(stdout);
   pause();

@@ -28,15 +28,19 @@ Screen dumpOf(const std::string& display);
 struct Pointer {
   CursorImage image;
   int left = 0, top = 0;
+
+  Box box() const { return {left, top, image.width, image.height}; }
 };
 Pointer pointerOf(const std::string& display);
 /// Draws the pointer where it is, each channel as source + destination * (255 - alpha) / 255.
 void drawPointer(const Pointer& pointer, Screen& screen);
 
-/// How many pixels of the picture are not the screen's, cut to the format; all of them where the
-/// sizes differ.
-size_t differences(const Screen& screen, const Picture& picture, const PixelFormat& format);
-/// The same for a cursor that a viewer got, its hot spot included.
+/// How many pixels of the picture, outside the box, are not the screen's, cut to the format; all of
+/// them where the sizes differ.
+size_t differences(const Screen& screen, const Picture& picture, const PixelFormat& format,
+                   Box without = {});
+/// The same for a cursor that a viewer got, its hot spot included. A mask of one bit a pixel shows
+/// of half transparent pixels what it likes.
 size_t differences(const CursorImage& wanted, const CursorImage& got, const PixelFormat& format);
 
 }  // namespace viewers

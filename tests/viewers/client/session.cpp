@@ -176,7 +176,7 @@ void Session::readCursor(Box box) {
   readRaw(link_, format_, image, {0, 0, box.width, box.height});
   const size_t rowBytes = (static_cast<size_t>(box.width) + 7) / 8;
   const std::vector<uint8_t> mask = link_.read(rowBytes * static_cast<size_t>(box.height));
-  CursorImage cursor = {box.width, box.height, box.x, box.y, {}};
+  CursorImage cursor = {box.width, box.height, box.x, box.y, {}, true};
   for (int y = 0; y < box.height; ++y)
     for (int x = 0; x < box.width; ++x) {
       const int byte = mask[static_cast<size_t>(y) * rowBytes + static_cast<size_t>(x) / 8];
@@ -192,7 +192,7 @@ void Session::readCursor(Box box) {
 
 void Session::readCursorWithAlpha(Box box) {
   if (link_.read32() != kRaw) throw Broken("a cursor with alpha that is not raw");
-  CursorImage cursor = {box.width, box.height, box.x, box.y, {}};
+  CursorImage cursor = {box.width, box.height, box.x, box.y, {}, false};
   for (int i = 0; i < box.width * box.height; ++i) {
     const uint32_t rgba = link_.read32();
     cursor.pixels.push_back(rgba << 24 | rgba >> 8);

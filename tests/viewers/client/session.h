@@ -22,6 +22,8 @@ struct CursorImage {
   int width = 0, height = 0, hotX = 0, hotY = 0;
   /// One word a pixel: alpha, red, green, blue, premultiplied. A pixel outside the mask is 0.
   std::vector<uint32_t> pixels;
+  /// It came with a mask and without alpha.
+  bool isMasked = false;
 };
 
 struct Counters {
