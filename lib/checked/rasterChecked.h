@@ -1,25 +1,26 @@
 // SPDX-License-Identifier: MIT
-//
-// Raster graphics for bytes of others: the functions of raster.h and imageUtil.h behind checks.
-//
-// For servers, viewers and tools whose frame buffers, pictures, sizes or coordinates come from
-// outside. Every function says in a RasterStatus what it did; once nothing is left to object to, it
-// calls the function of raster.h or imageUtil.h that its comment names, so the pixels are the same.
-//
-// What holds for every function here:
-// - Nothing is written to any output unless the result is RASTER_STATUS_OK.
-// - Any argument may have any value: no Panic, no signal, no message on standard error. Pointers
-//   that are not null must point to what the function says, and memory that a view describes must
-//   be there; everything else is checked.
-// - Every allocation may fail (RASTER_STATUS_NO_MEMORY). Memory that is handed out comes from
-//   malloc; the caller releases it with free (ImageUtil_FreeImageData does the same for images).
-// - No function keeps state or takes a lock; calls on disjoint memory may run on several threads.
-//
-// Rectangles are given as a Rect (right and bottom exclusive) of the destination; a null pointer
-// stands for the whole view. One that is empty draws nothing and is RASTER_STATUS_OK. One that
-// reaches out of the view is refused, or clipped where `flags` has RASTER_CHECKED_CLIP: the parts
-// outside are then left out, on both sides of a copy, and a call of which nothing is left does
-// nothing. Other bits of `flags` are refused.
+/// \file
+/// Raster graphics for bytes of others: the functions of raster.h and imageUtil.h behind checks.
+///
+/// For servers, viewers and tools whose frame buffers, pictures, sizes or coordinates come from
+/// outside. Every function says in a RasterStatus what it did; once nothing is left to object to,
+/// it calls the function of raster.h or imageUtil.h that its comment names, so the pixels are the
+/// same.
+///
+/// What holds for every function here:
+/// - Nothing is written to any output unless the result is RASTER_STATUS_OK.
+/// - Any argument may have any value: no Panic, no signal, no message on standard error. Pointers
+///   that are not null must point to what the function says, and memory that a view describes must
+///   be there; everything else is checked.
+/// - Every allocation may fail (RASTER_STATUS_NO_MEMORY). Memory that is handed out comes from
+///   malloc; the caller releases it with free (ImageUtil_FreeImageData does the same for images).
+/// - No function keeps state or takes a lock; calls on disjoint memory may run on several threads.
+///
+/// Rectangles are given as a Rect (right and bottom exclusive) of the destination; a null pointer
+/// stands for the whole view. One that is empty draws nothing and is RASTER_STATUS_OK. One that
+/// reaches out of the view is refused, or clipped where `flags` has RASTER_CHECKED_CLIP: the parts
+/// outside are then left out, on both sides of a copy, and a call of which nothing is left does
+/// nothing. Other bits of `flags` are refused.
 
 #ifndef RASTER_CHECKED_H
 #define RASTER_CHECKED_H
@@ -35,6 +36,9 @@ extern "C" {
 #endif
 
 // NOLINTBEGIN(modernize-use-using): this header is C as well
+
+/// \defgroup raster_checked Checked calls
+/// @{
 
 // ---- Results -----------------------------------------------------------------------------------
 
@@ -93,13 +97,13 @@ RASTER_EXPORT void RasterChecked_DefaultLimits(RasterLimits* limits);
 /// `width` pixels, for pixels of 2 and 4 bytes also a multiple of that size, and all rows, the last
 /// one without the gap behind it, lie in `bytes`. A view of no pixels may have null data.
 typedef struct RasterView {
-  uint8* data;   ///< the first byte of the top row, at any alignment
-  size_t bytes;  ///< from there on
-  uint32 pitch;  ///< bytes from one row to the next
-  uint32 width;  ///< in pixels
-  uint32 height;
-  uint32 depth;
-  uint32 bpp;  ///< bits per pixel
+  uint8* data;    ///< the first byte of the top row, at any alignment
+  size_t bytes;   ///< from there on
+  uint32 pitch;   ///< bytes from one row to the next
+  uint32 width;   ///< in pixels
+  uint32 height;  ///< in rows
+  uint32 depth;   ///< colour depth in bits
+  uint32 bpp;     ///< bits per pixel
 } RasterView;
 
 /// Whether a view is valid: OK, NULL, BAD_FORMAT or BAD_VIEW. Every function that takes a view
@@ -265,13 +269,13 @@ RASTER_EXPORT RasterStatus RasterChecked_DrawCursor(const RasterView* fb, const 
 
 /// The sizes of a scaled cursor, as Raster_GetScaledCursorSize gives them.
 typedef struct RasterScaledCursor {
-  uint32 paddedWidth;
-  uint32 paddedHeight;
-  uint32 width;  ///< of the scaled planes, margins included
-  uint32 height;
-  int32 hotX;
-  int32 hotY;
-  uint32 planeBytes;  ///< of one scaled plane: width x 4 x height
+  uint32 paddedWidth;   ///< with the margins, in pixels
+  uint32 paddedHeight;  ///< with the margins, in rows
+  uint32 width;         ///< of the scaled planes, margins included
+  uint32 height;        ///< in rows
+  int32 hotX;           ///< of the hot spot, in pixels
+  int32 hotY;           ///< its row
+  uint32 planeBytes;    ///< of one scaled plane: width x 4 x height
 } RasterScaledCursor;
 
 /// Raster_GetScaledCursorSize for a cursor of `width` x `height` pixels with hot spot (hotX, hotY).
@@ -310,8 +314,8 @@ RASTER_EXPORT RasterStatus RasterChecked_YuvToRgb(const RasterView* dst, const u
 
 /// What the header of a block says.
 typedef struct RasterBlockInfo {
-  uint32 width;
-  uint32 height;
+  uint32 width;      ///< in pixels
+  uint32 height;     ///< in rows
   uint32 pitch;      ///< bytes from one row to the next
   uint32 bpp;        ///< 8, 16, 24 or 32
   uint32 codeWords;  ///< 0 for a block that holds the pixels as they are
@@ -341,8 +345,8 @@ RASTER_EXPORT RasterStatus RasterChecked_Compress(const RasterView* view, uint8*
 
 /// What the first chunk of a PNG picture says.
 typedef struct RasterPngInfo {
-  uint32 width;
-  uint32 height;
+  uint32 width;     ///< in pixels
+  uint32 height;    ///< in rows
   uint8 bitDepth;   ///< bits per sample: 1, 2, 4, 8 or 16
   uint8 colorType;  ///< as in the file: 0 grey, 2 RGB, 3 palette, 4 grey and alpha, 6 RGB and alpha
   uint8 interlaced;  ///< 1 or 0
@@ -452,6 +456,8 @@ RASTER_EXPORT RasterStatus RasterChecked_WriteImage(const ImageUtilImage* image,
                                                     const char* path, uint32 imageType,
                                                     const ImageUtilPNGWriteParams* params,
                                                     uint32 flags);
+
+/// @}
 
 // NOLINTEND(modernize-use-using)
 

@@ -6,7 +6,8 @@ installHere
 manual=$work/prefix/share/man
 [ -s "$manual/man7/raster.7" ]
 
-names=$(grep -ohE '\<[A-Za-z]\w+\>;' "$SOURCE/lib/raster/raster.map" "$SOURCE/lib/tarnlibs/tarnlibs.map" |
+names=$(grep -ohE '\<[A-Za-z]\w+\>;' "$SOURCE/lib/raster/raster.map" "$SOURCE/lib/tarnlibs/tarnlibs.map" \
+  "$SOURCE/lib/checked/rasterChecked.map" |
   tr -d ';')
 [ "$(echo "$names" | wc -l)" -gt 90 ]
 for name in $names; do
