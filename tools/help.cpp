@@ -211,8 +211,9 @@ void addHelp(CLI::App& app) {
         command->get_name() == "compare"
             ? "Exit status: 0 equal, 1 different, 2 failed or not understood."
             : "Exit status: 0 done, 1 failed, 2 not understood.";
-    const std::string footer = command->get_footer();
-    command->footer(footer.empty() ? status : footer + ".\n" + status);
+    std::string footer = command->get_footer();
+    if (!footer.empty()) footer += ".\n";
+    command->footer(footer += status);
   }
 }
 

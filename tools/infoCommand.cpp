@@ -80,7 +80,7 @@ void describeBlock(File& file) {
          header.height, header.bpp);
   if (header.isCoded()) {
     printf("%u words of code for %llu bytes of pixels\n", header.codeWords,
-           static_cast<unsigned long long>(uint64{header.pitch} * header.height));
+           static_cast<unsigned long long>(header.pitch) * header.height);
   } else {
     printf("not compressed\n");
   }

@@ -24,7 +24,7 @@ gives() {
   [ "$got" = "$wanted " ] || fail "after rastertool $*: $got, not $wanted"
 }
 cd / || exit 1
-gives 'scale screenshot' s
+gives 'scale screenshot serve' s
 cd "$work" || exit 1
 gives 'combine compare convert' co
 gives 'pack' pa

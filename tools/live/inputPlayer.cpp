@@ -83,7 +83,7 @@ xcb_keycode_t InputPlayer::shiftCode() { return codeOf(kShiftLeft); }
 
 bool InputPlayer::holdsShift() {
   constexpr uint32 kShiftRight = 0xFFE2;
-  return held.count(shiftCode()) != 0 || held.count(codeOf(kShiftRight)) != 0;
+  return held.contains(shiftCode()) || held.contains(codeOf(kShiftRight));
 }
 
 void InputPlayer::press(xcb_keycode_t code) {

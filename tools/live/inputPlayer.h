@@ -14,7 +14,7 @@
 
 namespace tool::live {
 
-class InputPlayer : public InputSink {
+class InputPlayer final : public InputSink {
  public:
   /// Fails when the display takes no input from programs.
   explicit InputPlayer(LiveScreen& onto);
