@@ -77,7 +77,7 @@ std::string headerFault(const BlockHeader& header) {
 std::string blockFault(const uint8* block, size_t size, BlockHeader& header) {
   if (size < sizeof header) return "it is shorter than its header";
   memcpy(&header, block, sizeof header);
-  const std::string fault = headerFault(header);
+  std::string fault = headerFault(header);
   if (!fault.empty()) return fault;
   const uint8* payload = block + sizeof header;
   const size_t payloadSize = size - sizeof header;

@@ -22,7 +22,7 @@ class LiveScreen {
  public:
   using Clock = std::chrono::steady_clock;
 
-  explicit LiveScreen(const ServeOptions& options);
+  explicit LiveScreen(const ServeOptions& chosen);
 
   int descriptor() const { return watch.descriptor(); }
   uint32 width() const { return shownPicture().width; }

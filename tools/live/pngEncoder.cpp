@@ -24,7 +24,8 @@ void putCompactLength(size_t length, Bytes& out) {
 
 /// Fills `indices` and the palette, or returns false when there are too many colours.
 bool PngEncoder::findPalette(const PixelView& pixels, const Rect& rect) {
-  ColourTable<256> table;
+  using Table = ColourTable<256>;
+  Table table;
   indices.resize(size_t{image.width} * image.height);
   uint8* to = indices.data();
   uint32 previous = ~0u;
@@ -36,7 +37,7 @@ bool PngEncoder::findPalette(const PixelView& pixels, const Rect& rect) {
       memcpy(&colour, row, sizeof colour);
       colour &= 0xFFFFFF;
       if (colour != previous) index = table.indexOf(previous = colour);
-      if (index == table.kNone) return false;
+      if (index == Table::kNone) return false;
       *to++ = static_cast<uint8>(index);
     }
   }

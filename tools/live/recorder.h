@@ -18,7 +18,7 @@ class Recorder {
  public:
   using Clock = std::chrono::steady_clock;
 
-  Recorder(const std::string& file, uint32 width, uint32 height);
+  Recorder(const std::string& name, uint32 width, uint32 height);
 
   void record(Clock::time_point now, const PixelView& pixels, const ChangeList& changed);
   void resize(Clock::time_point now, uint32 width, uint32 height);
