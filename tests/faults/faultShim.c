@@ -5,6 +5,7 @@
 // the error WHAT (a number), does half of its work (short), or comes after the signal -WHAT. Then
 // the file FAULT_SEEN is made, from which a test learns that there was such a call.
 
+#undef _FILE_OFFSET_BITS  // which would give two of the calls below one name
 #define _GNU_SOURCE
 #include <dlfcn.h>
 #include <errno.h>
