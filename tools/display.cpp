@@ -171,25 +171,27 @@ Picture Display::capture(const Rect& region) {
   return picture;
 }
 
-LiveCursor Display::cursor() {
+std::optional<LiveCursor> Display::cursor() {
   if (!hasExtension(connection.get(), xcb_xfixes_id))
     throw Failure("the display does not tell its cursor: it has no XFIXES extension");
   needReply(connection.get(),
             xcb_xfixes_query_version(connection.get(), XCB_XFIXES_MAJOR_VERSION,
                                      XCB_XFIXES_MINOR_VERSION),
             xcb_xfixes_query_version_reply, "the version of XFIXES");
-  const auto reply = needReply(connection.get(), xcb_xfixes_get_cursor_image(connection.get()),
-                               xcb_xfixes_get_cursor_image_reply, "the cursor");
+  const auto reply = replyTo(connection.get(), xcb_xfixes_get_cursor_image(connection.get()),
+                             xcb_xfixes_get_cursor_image_reply);
+  if (!reply && xcb_connection_has_error(connection.get()) == 0) return std::nullopt;
+  if (!reply) throw Failure("the display went away");
   const uint32* pixels = xcb_xfixes_get_cursor_image_cursor_image(reply.get());
   const size_t length = size_t{reply->width} * reply->height;
   if (!isCursorSize(reply->width, reply->height)) throw Failure("the cursor is too large");
   if (!carries(reply->length, length * sizeof *pixels))
     throw Failure("the display sent fewer pixels of the cursor than it has");
-  return {{reply->x, reply->y},
-          {reply->xhot, reply->yhot},
-          reply->width,
-          reply->height,
-          {pixels, pixels + length}};
+  return LiveCursor{{reply->x, reply->y},
+                    {reply->xhot, reply->yhot},
+                    reply->width,
+                    reply->height,
+                    {pixels, pixels + length}};
 }
 
 }  // namespace tool

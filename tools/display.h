@@ -8,6 +8,7 @@
 #include <xcb/xcb.h>
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -31,7 +32,8 @@ class Display {
   std::string description() const;
   /// The screen's pixels within a region of it, in the screen's own format.
   Picture capture(const Rect& region);
-  LiveCursor cursor();
+  /// Nothing when the server shows none at the moment.
+  std::optional<LiveCursor> cursor();
 
   // For those who watch the screen over a longer time.
   xcb_connection_t* handle() const { return connection.get(); }

@@ -65,7 +65,8 @@ int screenshot(const ScreenshotOptions& options) {
   Picture picture = display.capture(region);
   if (options.withCursor) {
     if (picture.record.bpp == 8) picture = picture.convertedTo(32);  // no index for a mixed colour
-    drawCursor(picture, region, display.cursor(), options.cursorScale);
+    const std::optional<LiveCursor> cursor = display.cursor();
+    if (cursor) drawCursor(picture, region, *cursor, options.cursorScale);
   }
   save(picture, options.output.path, saving);
   fprintf(textBeside(options.output.path), "%s: %s of a screen with %s\n",

@@ -90,7 +90,9 @@ void LiveScreen::followPointer(bool wanted) {
 }
 
 void LiveScreen::fetchCursor() {
-  cursor = watch.cursor();
+  std::optional<LiveCursor> shape = watch.cursor();
+  if (!shape) return;  // between two shapes there may be none: the old one stays
+  cursor = std::move(*shape);
   if (scaled) cursor = scaledCursor(std::move(cursor), options.scale);
   ++cursorSerial;
 }
@@ -177,7 +179,7 @@ void LiveScreen::expire(Clock::time_point now, ChangeList& changed) {
 
 Scene LiveScreen::scene() const {
   const PixelView picture = shownPicture();
-  if (!watch.tellsCursor()) return {picture, nullptr, 0, {}, pointer};
+  if (!watch.tellsCursor() || cursor.width == 0) return {picture, nullptr, 0, {}, pointer};
   const Rect box =
       followsPointer ? cursorBox(cursor, pointer, picture.width, picture.height) : Rect{};
   return {picture, &cursor, cursorSerial, box, pointer};

@@ -55,7 +55,7 @@ class ScreenWatch {
   /// Whether the server is to say that the pointer moves.
   void followPointer(bool wanted);
   Point pointer();
-  LiveCursor cursor() { return screen.cursor(); }
+  std::optional<LiveCursor> cursor() { return screen.cursor(); }
 
   /// Listens to the server without waiting, and adds the damage that it tells.
   ScreenNews listen(ChangeList& damage);
