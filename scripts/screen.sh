@@ -3,9 +3,13 @@
 
 started=()
 
+# A number that the system has given to somebody else since then is nobody's child here.
+isChild() { grep -qx "PPid:[[:space:]]*$$" "/proc/$1/status" 2>/dev/null; }
+
 stopStarted() {
   local process
   for ((process = ${#started[@]} - 1; process >= 0; --process)); do
+    isChild "${started[process]}" || continue
     kill "${started[process]}" 2>/dev/null || continue
     wait "${started[process]}" 2>/dev/null || true
   done
@@ -15,7 +19,7 @@ trap 'exit 1' HUP INT TERM
 
 # startClient PROGRAM [ARGUMENT...]
 startClient() {
-  "$@" >/dev/null 2>&1 &
+  "$@" >/dev/null 2>&1 9>&- &
   started+=($!)
 }
 
