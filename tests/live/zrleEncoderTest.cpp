@@ -36,8 +36,7 @@ class Inflater {
     stream.avail_out = static_cast<uInt>(plain.size());
     EXPECT_EQ(inflate(&stream, Z_SYNC_FLUSH), Z_OK);
     EXPECT_EQ(stream.avail_in, 0u);
-    plain.resize(plain.size() - stream.avail_out);
-    return plain;
+    return {plain.data(), stream.next_out};
   }
 
  private:
