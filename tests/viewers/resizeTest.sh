@@ -2,6 +2,7 @@
 # The X screen changes its size: viewers that know of such things follow, and the others see what there
 # is left of it.
 . "$(dirname "$0")/common.sh"
+[ -n "${RASTER_TEST_FULL:-}" ] || { note 'skipped: only with RASTER_TEST_FULL'; exit 77; }
 have xrandr || { note 'skipped: no xrandr here'; exit 77; }
 
 startScreen

@@ -1,6 +1,7 @@
 #!/bin/sh
 # Viewers with bad manners are dropped with one line, delay nobody and cost little memory.
 . "$(dirname "$0")/common.sh"
+[ -n "${RASTER_TEST_FULL:-}" ] || { note 'skipped: only with RASTER_TEST_FULL'; exit 77; }
 
 # memory: what the server has in memory, in KiB.
 memory() { sed -n 's/^VmRSS:[[:space:]]*\([0-9]*\) kB/\1/p' "/proc/$serving/status"; }
