@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 
 #include "commands.h"
 #include "cursorImage.h"
@@ -102,6 +103,13 @@ std::string Display::description() const {
          std::to_string(format.bitsPerPixel) + " bits per pixel";
 }
 
+bool Display::refreshColours() {
+  ImageUtilColor before[256];
+  std::copy(std::begin(palette), std::end(palette), before);
+  readPalette();
+  return memcmp(before, palette, sizeof palette) != 0;
+}
+
 void Display::readPalette() {
   uint32 pixels[256];
   for (uint32 i = 0; i < 256; ++i) pixels[i] = i;
@@ -166,8 +174,11 @@ uint32 Display::code() const {
 
 Picture Display::capture(const Rect& region) {
   Picture picture(widthOf(region), heightOf(region), code());
-  if (isIndexed()) std::copy(std::begin(palette), std::end(palette), picture.record.palette);
   if (!captureShared(picture, region)) captureInBands(picture, region);
+  if (isIndexed()) {
+    readPalette();  // after the pixels, so that it has their colours
+    std::copy(std::begin(palette), std::end(palette), picture.record.palette);
+  }
   return picture;
 }
 

@@ -19,16 +19,21 @@ start() {
   background="$started $background"
 }
 
-# stop PROCESS...: ends and waits; what it ended with in $status. Who does not hear is killed.
+# isRunning PROCESS: one that has ended and was not waited for yet does not run.
+isRunning() { kill -0 "$1" 2>/dev/null && ! grep -qs '^State:.Z' "/proc/$1/status"; }
+
+# stop PROCESS...: ends and waits; what it ended with in $status. Who does not hear is killed after ten
+# seconds.
 stop() {
   for process in "$@"; do
     kill "$process" 2>/dev/null
-    { sleep 10; kill -9 "$process"; } >/dev/null 2>&1 &
-    guard=$!
+    for _ in $(seq 200); do
+      isRunning "$process" || break
+      sleep 0.05
+    done
+    kill -9 "$process" 2>/dev/null
     wait "$process" 2>/dev/null
     status=$?
-    kill "$guard"
-    wait "$guard" 2>/dev/null
     background=$(echo " $background " | sed "s/ $process / /")
   done
 }

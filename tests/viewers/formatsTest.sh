@@ -21,6 +21,8 @@ for depth in 8 15 16; do
     for encoding in raw zrle; do equal --encoding $encoding --format "$format"; done
   done
   equal
+  xsetroot -solid '#2a7f62'  # with 8 bits, a colour that the palette has not had
+  equal
   stopServing
 done
 

@@ -17,7 +17,7 @@ using std::chrono::duration_cast;
 using std::chrono::milliseconds;
 
 constexpr milliseconds kGathering(2);        // from the first damage on, so that drawing ends
-constexpr milliseconds kBlindInterval(250);  // without DAMAGE
+constexpr milliseconds kBlindInterval(250);  // for what no display, or not this one, tells
 
 LiveCursor scaledCursor(LiveCursor cursor, double scale) {
   CursorImage image =
@@ -34,10 +34,8 @@ LiveScreen::LiveScreen(const ServeOptions& chosen)
     : options(chosen),
       watch(chosen.display, chosen.region, chosen.hidden),
       interval(duration_cast<Clock::duration>(duration<double>(1 / chosen.maxRate))) {
-  if (!watch.tellsDamage()) {
-    interval = std::max<Clock::duration>(interval, kBlindInterval);
+  if (!watch.tellsDamage())
     fputs("the display does not tell what changes: comparing four times a second\n", stderr);
-  }
   changeSize();
 }
 
@@ -134,11 +132,12 @@ bool LiveScreen::listen(Clock::time_point now) {
 }
 
 LiveScreen::Clock::time_point LiveScreen::captureTime() const {
-  return std::max(lastCapture + interval, damagedSince + kGathering);
+  if (isDamaged()) return std::max(lastCapture + interval, damagedSince + kGathering);
+  return lastCapture + std::max<Clock::duration>(interval, kBlindInterval);
 }
 
 void LiveScreen::capture(Clock::time_point now, ChangeList& changed) {
-  if (!watch.tellsDamage()) damage.addAll();
+  if (!watch.tellsDamage() || watch.refreshPalette()) damage.addAll();
   lastCapture = now;
   const std::optional<PixelView> captured = watch.capture(damage);
   if (!captured) return;

@@ -41,8 +41,9 @@ class LiveScreen {
   /// Whether it may have said more since, so that it is to be listened to again soon.
   bool mayHaveMore() const { return hasMore; }
 
-  /// Whether there is damage to be captured, and from when on.
-  bool needsCapture() const { return !damage.isEmpty() || !watch.tellsDamage(); }
+  /// Whether there is damage to be captured, or may be some that is not told; and from when on.
+  bool needsCapture() const { return isDamaged() || !watch.tellsDamage() || watch.hasPalette(); }
+  bool isDamaged() const { return !damage.isEmpty(); }
   Clock::time_point captureTime() const;
   /// Brings the picture up to date and adds to `changed` what of it is another one.
   void capture(Clock::time_point now, ChangeList& changed);

@@ -47,6 +47,9 @@ class ScreenWatch {
   /// Whether the server says what changes.
   bool tellsDamage() const { return hasDamage; }
   bool tellsCursor() const { return hasCursor; }
+  /// Whether pixels are indices into a palette, whose changes the server never tells.
+  bool hasPalette() const { return screen.isIndexed(); }
+  bool refreshPalette() { return hasPalette() && screen.refreshColours(); }
 
   /// From here on the server says what changes; before, and after end(), it says nothing.
   void begin();

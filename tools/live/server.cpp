@@ -64,7 +64,7 @@ void Server::printStatistics() const {
 /// Waits for something and does what it asks for; false at the end.
 bool Server::turn() {
   const Clock::time_point before = Clock::now();
-  const bool listens = !isCapturePending() && before >= nextListening;
+  const bool listens = !(isCapturePending() && screen.isDamaged()) && before >= nextListening;
   const bool admits = viewers.size() < kMostViewers && !(options.once && viewerCount != 0);
   std::vector<pollfd> polled = {{signals.descriptor(), POLLIN, 0},
                                 {admits ? listener.descriptor() : -1, POLLIN, 0},
