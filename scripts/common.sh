@@ -31,9 +31,16 @@ treeFiles() {
 # Of the lines that match a pattern, lets one through every 15 seconds, so that a long job shows that it
 # lives; of the others, those that do not match the second pattern.
 heartbeat() {
-  awk -v often="$1" -v never="${2:-^$}" '
-    $0 ~ often { if (systime() - last >= 15) { print; fflush(); last = systime() }; next }
-    $0 !~ never { print; fflush() }'
+  local often=$1 never=${2:-^$} last=-15 line
+  while IFS= read -r line; do
+    if [[ $line =~ $often ]]; then
+      ((SECONDS - last >= 15)) || continue
+      last=$SECONDS
+    elif [[ $line =~ $never ]]; then
+      continue
+    fi
+    printf '%s\n' "$line"
+  done
 }
 
 # Installs those of the named Debian packages that are missing, and waits for another package manager
