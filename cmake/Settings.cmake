@@ -45,8 +45,8 @@ endif()
 
 # Sources with vector code: all of SSSE3, SSE4, AVX2 and AVX3 on both word sizes, and one-lane
 # SCALAR as the fallback and reference. Highway keeps some of these back on 32-bit x86; they pass
-# every test here (lib/raster/hwySetup.h has the one function that is missing). F16C is not needed, and
-# not every compiler can ask for it.
+# every test here (lib/raster/vector/hwySetup.h has the one function that is missing). F16C is not
+# needed, and not every compiler can ask for it.
 add_library(raster_highway INTERFACE)
 target_compile_definitions(raster_highway INTERFACE
   HWY_BROKEN_TARGETS=HWY_EMU128 HWY_BROKEN_EMU128=1 HWY_DISABLE_F16C)

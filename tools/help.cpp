@@ -8,7 +8,7 @@
 #include <sstream>
 #include <vector>
 
-#include "cpuLevel.h"
+#include "vector/cpuLevel.h"
 #include "names.h"
 #include "rasterVersion.h"
 

@@ -7,7 +7,7 @@
 #include "fileIO.h"
 #include "imageUtilPriv.h"
 #include "message.h"
-#include "panicPlace.h"
+#include "host/panicPlace.h"
 
 namespace raster {
 namespace {

@@ -12,7 +12,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "frameBuffer.h"
+#include "frame/frameBuffer.h"
 #include "imageUtilPriv.h"
 #include "raster.h"
 

@@ -8,7 +8,7 @@
 #include "imageUtil.h"
 #include "imageUtilPriv.h"
 #include "raster.h"
-#include "rasteropsInternal.h"
+#include "ops/rasteropsInternal.h"
 #include "rect.h"
 
 namespace raster {

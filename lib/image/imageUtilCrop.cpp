@@ -4,7 +4,7 @@
 
 #include <cstring>
 
-#include "frameBuffer.h"
+#include "frame/frameBuffer.h"
 #include "imageUtil.h"
 #include "imageUtilPriv.h"
 #include "raster.h"

@@ -2,14 +2,14 @@
 //
 // Alpha blending: fourteen operators onto six destination formats, in place and staged.
 
-#include "alphaBlendInternal.h"
+#include "blend/alphaBlendInternal.h"
 
 #include <algorithm>
 #include <array>
 #include <utility>
 
 #include "divisionByZero.h"
-#include "panicPlace.h"
+#include "host/panicPlace.h"
 #include "raster.h"
 
 namespace raster {

@@ -4,13 +4,13 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterBits.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "pixelPattern-inl.h"
-#include "rasterBitsInternal.h"
-#include "rows-inl.h"
+#include "vector/pixelPattern-inl.h"
+#include "plane/rasterBitsInternal.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -226,7 +226,7 @@ HWY_AFTER_NAMESPACE();
 
 #include <algorithm>
 
-#include "kernelChoice.h"
+#include "vector/kernelChoice.h"
 #include "raster.h"
 
 namespace raster {

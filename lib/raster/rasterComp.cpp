@@ -7,12 +7,12 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterComp.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "rasterCompInternal.h"
-#include "rows-inl.h"
+#include "compare/rasterCompInternal.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -188,8 +188,8 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "kernelChoice.h"
-#include "panicPlace.h"
+#include "vector/kernelChoice.h"
+#include "host/panicPlace.h"
 #include "raster.h"
 
 namespace raster {

@@ -8,16 +8,16 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterCompress.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
 #include <algorithm>
 #include <bit>
 
-#include "frameBuffer.h"
-#include "rasterCompressInternal.h"
-#include "rows-inl.h"
+#include "frame/frameBuffer.h"
+#include "compress/rasterCompressInternal.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -260,8 +260,8 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "kernelChoice.h"
-#include "panicPlace.h"
+#include "vector/kernelChoice.h"
+#include "host/panicPlace.h"
 #include "raster.h"
 #include "utilAlloc.h"
 

@@ -4,10 +4,10 @@
 
 #include <type_traits>
 
-#include "panicPlace.h"
+#include "host/panicPlace.h"
 #include "raster.h"
-#include "rasterConvInternal.h"
-#include "rasteropsInternal.h"
+#include "convert/rasterConvInternal.h"
+#include "ops/rasteropsInternal.h"
 
 namespace raster {
 namespace {

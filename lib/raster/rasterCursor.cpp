@@ -5,12 +5,12 @@
 #include <algorithm>
 #include <cstddef>
 
-#include "alphaBlendInternal.h"
-#include "panicPlace.h"
+#include "blend/alphaBlendInternal.h"
+#include "host/panicPlace.h"
 #include "raster.h"
-#include "rasterBitsInternal.h"
-#include "rasteropsInternal.h"
-#include "rasteropsRopInternal.h"
+#include "plane/rasterBitsInternal.h"
+#include "ops/rasteropsInternal.h"
+#include "ops/rasteropsRopInternal.h"
 
 namespace raster {
 namespace {

@@ -11,7 +11,7 @@
 #include <cstring>
 
 #include "raster.h"
-#include "rasteropsInternal.h"
+#include "ops/rasteropsInternal.h"
 #include "rect.h"
 #include "utilAlloc.h"
 

@@ -13,7 +13,7 @@
 #include <bit>
 #include <cstdint>
 
-#include "panicPlace.h"
+#include "host/panicPlace.h"
 #include "raster.h"
 
 namespace raster {

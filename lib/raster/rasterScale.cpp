@@ -7,10 +7,10 @@
 #include <cmath>
 #include <limits>
 
-#include "firstTime.h"
+#include "host/firstTime.h"
 #include "message.h"
 #include "raster.h"
-#include "rasterScaleInternal.h"
+#include "scale/rasterScaleInternal.h"
 
 namespace raster {
 namespace {

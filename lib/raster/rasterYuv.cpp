@@ -7,14 +7,14 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterYuv.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "frameBuffer.h"
-#include "rasterYuvInternal.h"
-#include "videoColour.h"
-#include "yuvColour-inl.h"
+#include "frame/frameBuffer.h"
+#include "video/rasterYuvInternal.h"
+#include "video/videoColour.h"
+#include "video/yuvColour-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -208,10 +208,10 @@ HWY_AFTER_NAMESPACE();
 #include <atomic>
 #include <cassert>
 
-#include "firstTime.h"
-#include "kernelChoice.h"
+#include "host/firstTime.h"
+#include "vector/kernelChoice.h"
 #include "raster.h"
-#include "videoAttributes.h"
+#include "video/videoAttributes.h"
 
 namespace raster {
 namespace {

@@ -7,14 +7,14 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterops.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "byteRows-inl.h"
-#include "pixelPattern-inl.h"
-#include "rasteropsInternal.h"
-#include "rows-inl.h"
+#include "vector/byteRows-inl.h"
+#include "vector/pixelPattern-inl.h"
+#include "ops/rasteropsInternal.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -153,9 +153,9 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "kernelChoice.h"
-#include "mmxCopy.h"
-#include "panicPlace.h"
+#include "vector/kernelChoice.h"
+#include "ops/mmxCopy.h"
+#include "host/panicPlace.h"
 #include "raster.h"
 
 uint32 rasterops_mmx = 0;  // C linkage: raster.h

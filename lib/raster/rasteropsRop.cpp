@@ -8,15 +8,15 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasteropsRop.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "byteRows-inl.h"
-#include "pixelPattern-inl.h"
-#include "rasteropsRopInternal.h"
-#include "rop-inl.h"
-#include "rows-inl.h"
+#include "vector/byteRows-inl.h"
+#include "vector/pixelPattern-inl.h"
+#include "ops/rasteropsRopInternal.h"
+#include "ops/rop-inl.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -134,10 +134,10 @@ HWY_AFTER_NAMESPACE();
 
 #include <algorithm>
 
-#include "kernelChoice.h"
-#include "panicPlace.h"
+#include "vector/kernelChoice.h"
+#include "host/panicPlace.h"
 #include "raster.h"
-#include "rasteropsInternal.h"
+#include "ops/rasteropsInternal.h"
 
 namespace raster {
 namespace {

@@ -4,15 +4,15 @@
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/rasterpix.cpp"
-#include "hwySetup.h"
+#include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
 #include <algorithm>
 
-#include "rasterpixInternal.h"
-#include "rop-inl.h"
-#include "rows-inl.h"
+#include "ops/rasterpixInternal.h"
+#include "ops/rop-inl.h"
+#include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -276,10 +276,10 @@ HWY_AFTER_NAMESPACE();
 #if HWY_ONCE
 
 #include "divisionByZero.h"
-#include "kernelChoice.h"
-#include "panicPlace.h"
+#include "vector/kernelChoice.h"
+#include "host/panicPlace.h"
 #include "raster.h"
-#include "rasteropsRopInternal.h"
+#include "ops/rasteropsRopInternal.h"
 
 namespace raster {
 namespace {

@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+//
+// What the comparison kernels of one instruction-set level offer.
+
+#ifndef RASTER_RASTER_COMP_INTERNAL_H
+#define RASTER_RASTER_COMP_INTERNAL_H
+
+#include "frame/frameBuffer.h"
+
+namespace raster {
+
+/// The three bytes of a 4-byte pixel that count.
+inline constexpr uint32 kColorBits = 0x00FFFFFF;
+
+/// Whether at most `limit` bytes of a and b differ under the mask. `bytes` is their number.
+using CompareUnderMask = bool (*)(const uint8* a, const uint8* b, const uint8* mask, size_t bytes,
+                                  size_t limit);
+
+struct RasterCompKernels {
+  /// Compares rows of 4-byte pixels without the fourth byte: 0, or the difference of the first two
+  /// bytes that differ.
+  int32 (*compareColors)(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep,
+                         size_t pixels, uint32 height);
+  CompareUnderMask wholeBytes;  ///< a mask byte that is not 0 counts its whole byte
+  CompareUnderMask bits;        ///< the bits of the mask count
+  CompareUnderMask colorBits;   ///< the bits of the mask count, but none of a fourth byte
+};
+
+}  // namespace raster
+
+#endif

@@ -1,0 +1,365 @@
+// SPDX-License-Identifier: MIT
+//
+// Pixels in vector lanes: loading and storing blocks of every pixel size, and the conversion of
+// lanes from one format to another. Included once per instruction set, after Highway.
+//
+// A block is as many pixels as a vector has bytes. It lies in four vectors of 32-bit lanes or two
+// of 16-bit lanes, a pixel to a lane, and in memory it is one to four whole vectors: so a block is
+// read and written without touching a byte beside it.
+
+#if defined(RASTER_PIXEL_LANES_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef RASTER_PIXEL_LANES_INL_H
+#undef RASTER_PIXEL_LANES_INL_H
+#else
+#define RASTER_PIXEL_LANES_INL_H
+#endif
+
+#include <array>
+#include <cstddef>
+
+#include "hwy/highway.h"
+#include "frame/pixelFormat.h"
+#include "vector/rows-inl.h"
+
+#if HWY_TARGET != HWY_SCALAR
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+
+/// The pixels of a block.
+template <class D> inline constexpr size_t kBlockPixels = kLanes<D> * sizeof(hn::TFromD<D>);
+
+/// A block in lanes.
+template <class D> struct Block {
+  static constexpr size_t kVectors = sizeof(hn::TFromD<D>);
+  hn::Vec<D> v[kVectors];
+};
+
+// ---- Lanes from one format to another ----------------------------------------------------------
+
+template <int kRight, class V> HWY_INLINE V shiftLanes(V v) {
+  if constexpr (kRight > 0) {
+    return hn::ShiftRight<kRight>(v);
+  } else if constexpr (kRight < 0) {
+    return hn::ShiftLeft<-kRight>(v);
+  } else {
+    return v;
+  }
+}
+
+template <class D> HWY_INLINE hn::Vec<D> setMask(D d, uint32 mask) {
+  return hn::Set(d, static_cast<hn::TFromD<D>>(mask));
+}
+
+/// The bits that a conversion repeats `kRight` bits lower.
+template <class Move, int kRight>
+inline constexpr uint32 kRepeatMask =
+    (Move::Red::kRepeatRight == kRight ? Move::Red::kRepeatMask : 0) |
+    (Move::Green::kRepeatRight == kRight ? Move::Green::kRepeatMask : 0) |
+    (Move::Blue::kRepeatRight == kRight ? Move::Blue::kRepeatMask : 0);
+
+template <class Move, int kRight, class D>
+HWY_INLINE hn::Vec<D> addRepeated(D d, hn::Vec<D> color, hn::Vec<D> tops) {
+  constexpr uint32 kMask = kRepeatMask<Move, kRight>;
+  if constexpr (kMask == 0) {
+    return color;
+  } else {
+    return hn::OrAnd(color, hn::ShiftRight<kRight>(tops), setMask(d, kMask));
+  }
+}
+
+/// convertColor on lanes. Channels that move alike move together.
+template <class From, class To, class D>
+HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
+  using Move = ColorMove<From, To>;
+  using R = typename Move::Red;
+  using G = typename Move::Green;
+  using B = typename Move::Blue;
+  auto tops = hn::And(shiftLanes<B::kRight>(pixels), setMask(d, B::kTopMask));
+  const auto green = shiftLanes<G::kRight>(pixels);
+  if constexpr (R::kRight == G::kRight) {
+    tops = hn::OrAnd(tops, green, setMask(d, G::kTopMask | R::kTopMask));
+  } else {
+    tops = hn::OrAnd(tops, green, setMask(d, G::kTopMask));
+    tops = hn::OrAnd(tops, shiftLanes<R::kRight>(pixels), setMask(d, R::kTopMask));
+  }
+  // Every distance once: the mask of a distance has the bits of all channels that have it.
+  auto color = addRepeated<Move, R::kRepeatRight>(d, tops, tops);
+  if constexpr (G::kRepeatRight != R::kRepeatRight)
+    color = addRepeated<Move, G::kRepeatRight>(d, color, tops);
+  if constexpr (B::kRepeatRight != R::kRepeatRight && B::kRepeatRight != G::kRepeatRight)
+    color = addRepeated<Move, B::kRepeatRight>(d, color, tops);
+  return color;
+}
+
+// ---- Order of bytes and lanes ------------------------------------------------------------------
+
+/// For every 128-bit part of a vector the same choice of its bytes; kNoByte gives 0.
+using BytesOfPart = std::array<uint8, 16>;
+constexpr uint8 kNoByte = 0x80;
+
+template <class D> HWY_INLINE hn::Vec<D> chooseBytes(D d, hn::Vec<D> v, const BytesOfPart& choice) {
+  const hn::Repartition<uint8, D> d8;
+  return hn::BitCast(
+      d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::LoadDup128(d8, choice.data())));
+}
+
+/// A choice of the vector's 32-bit words.
+template <class D> using Words = std::array<int32, kLanes<hn::Repartition<uint32, D>>>;
+
+template <class D> HWY_INLINE hn::Vec<D> chooseWords(D d, hn::Vec<D> v, const Words<D>& choice) {
+  const hn::Repartition<uint32, D> d32;
+  return hn::BitCast(
+      d, hn::TableLookupLanes(hn::BitCast(d32, v), hn::SetTableIndices(d32, choice.data())));
+}
+
+// ---- Three bytes a pixel -----------------------------------------------------------------------
+
+/// Gives each part of a vector its four 3-byte pixels, from the word `first` of the vector on.
+template <class D> constexpr Words<D> spreadTriples(size_t first) {
+  Words<D> words{};
+  for (size_t i = 0; i < words.size(); ++i)
+    words[i] = i % 4 == 3 ? 0 : static_cast<int32>(first + i / 4 * 3 + i % 4);
+  return words;
+}
+
+/// Four 3-byte pixels to words, from the byte `first` of a part on.
+constexpr BytesOfPart expandTriples(size_t first) {
+  BytesOfPart bytes{};
+  for (size_t i = 0; i < bytes.size(); ++i)
+    bytes[i] = i % 4 == 3 ? kNoByte : static_cast<uint8>(first + i / 4 * 3 + i % 4);
+  return bytes;
+}
+
+/// The 3-byte pixels of one vector of 32-bit lanes, which start at the byte kFirst of `at`.
+template <size_t kFirst, class D> HWY_INLINE hn::Vec<D> loadTriples(D d, const uint8* at) {
+  const auto bytes = loadLanes(d, at);
+  if constexpr (kLanes<D> == 4) {
+    static constexpr BytesOfPart kExpand = expandTriples(kFirst);
+    return chooseBytes(d, bytes, kExpand);
+  } else {
+    static constexpr Words<D> kSpread = spreadTriples<D>(kFirst / 4);
+    static constexpr BytesOfPart kExpand = expandTriples(0);
+    return chooseBytes(d, chooseWords(d, bytes, kSpread), kExpand);
+  }
+}
+
+template <class D> HWY_INLINE Block<D> loadTripleBlock(D d, const uint8* at) {
+  constexpr size_t kLoaded = kLanes<D> * 4;
+  constexpr size_t kUsed = kLanes<D> * 3;
+  // The last vector ends where the block ends.
+  return {{loadTriples<0>(d, at), loadTriples<0>(d, at + kUsed), loadTriples<0>(d, at + 2 * kUsed),
+           loadTriples<kLoaded - kUsed>(d, at + 4 * kUsed - kLoaded)}};
+}
+
+/// Where word `i` of vector `vector` of a block comes from when the words of its 3-byte pixels,
+/// three from each part, follow each other through the memory of the block.
+constexpr size_t packedWord(size_t vector, size_t i, size_t words) {
+  const size_t used = words / 4 * 3;
+  const size_t at = (i + 4 * words - vector * used) % words;
+  return at < used ? at / 3 * 4 + at % 3 : 3;
+}
+template <class D> constexpr Words<D> packTriples(size_t vector) {
+  Words<D> words{};
+  for (size_t i = 0; i < words.size(); ++i)
+    words[i] = static_cast<int32>(packedWord(vector, i, words.size()));
+  return words;
+}
+
+/// The low three bytes of a part's four pixels as its first three words; `rotated` (by the vector
+/// of a block) where a part is the whole vector.
+constexpr BytesOfPart shrinkTriples(size_t vector) {
+  BytesOfPart bytes{};
+  for (size_t i = 0; i < bytes.size(); ++i) {
+    const size_t from = packedWord(vector, i / 4, 4) * 4 + i % 4;
+    bytes[i] = from < 12 ? static_cast<uint8>(from / 3 * 4 + from % 3) : kNoByte;
+  }
+  return bytes;
+}
+
+template <size_t kVector, class D> HWY_INLINE hn::Vec<D> packTriplesOf(D d, hn::Vec<D> pixels) {
+  if constexpr (kLanes<D> == 4) {
+    static constexpr BytesOfPart kShrink = shrinkTriples(kVector);
+    return chooseBytes(d, pixels, kShrink);
+  } else {
+    static constexpr BytesOfPart kShrink = shrinkTriples(0);
+    static constexpr Words<D> kPack = packTriples<D>(kVector);
+    return chooseWords(d, chooseBytes(d, pixels, kShrink), kPack);
+  }
+}
+
+/// Four vectors, three quarters of each in use, become three.
+template <class D> HWY_INLINE void storeTripleBlock(D d, const Block<D>& block, uint8* at) {
+  constexpr size_t kBytes = kLanes<D> * 4;
+  const auto v0 = packTriplesOf<0>(d, block.v[0]);
+  const auto v1 = packTriplesOf<1>(d, block.v[1]);
+  const auto v2 = packTriplesOf<2>(d, block.v[2]);
+  const auto v3 = packTriplesOf<3>(d, block.v[3]);
+  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4 * 3), v0, v1), at);
+  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 2), v1, v2), at + kBytes);
+  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4), v2, v3), at + 2 * kBytes);
+}
+
+// ---- Narrow lanes ------------------------------------------------------------------------------
+
+constexpr BytesOfPart evenThenOddBytes() {
+  BytesOfPart bytes{};
+  for (size_t i = 0; i < bytes.size(); ++i) bytes[i] = static_cast<uint8>(i % 8 * 2 + i / 8);
+  return bytes;
+}
+
+/// Puts parts that each hold kVectors runs of bytes, one from each vector of a block, into the
+/// order of the block.
+template <class D, size_t kVectors> constexpr Words<D> unzipParts() {
+  Words<D> words{};
+  constexpr size_t kRun = 4 / kVectors;
+  const size_t parts = words.size() / 4;
+  for (size_t i = 0; i < words.size(); ++i) {
+    const size_t run = i / kRun;
+    words[i] = static_cast<int32>(run % parts * 4 + run / parts * kRun + i % kRun);
+  }
+  return words;
+}
+
+/// Stores the low bytes of 16-bit lanes: the even bytes of `zipped` are those of the first part of
+/// a block, the odd ones those of the second.
+template <size_t kVectors, class D> HWY_INLINE void storeZipped(D d, hn::Vec<D> zipped, uint8* at) {
+  static constexpr BytesOfPart kUnzip = evenThenOddBytes();
+  auto bytes = chooseBytes(d, zipped, kUnzip);
+  if constexpr (kLanes<D> >= 16) {
+    static constexpr Words<D> kOrder = unzipParts<D, kVectors>();
+    bytes = chooseWords(d, bytes, kOrder);
+  }
+  storeLanes(d, bytes, at);
+}
+
+/// Stores lanes below 256 as bytes.
+template <class D> HWY_INLINE void storeByteBlock(D d, const Block<D>& block, uint8* at) {
+  if constexpr (Block<D>::kVectors == 2) {
+    storeZipped<2>(d, hn::Or(block.v[0], hn::ShiftLeft<8>(block.v[1])), at);
+  } else {
+    const hn::RebindToSigned<D> dSigned;
+    const hn::Repartition<int16, D> dHalves;
+    const hn::Repartition<uint16, D> d16;
+    const auto halves = [&](auto a, auto b) HWY_ATTR {
+      return hn::BitCast(
+          d16, hn::ReorderDemote2To(dHalves, hn::BitCast(dSigned, a), hn::BitCast(dSigned, b)));
+    };
+    const auto low = halves(block.v[0], block.v[1]);
+    const auto high = halves(block.v[2], block.v[3]);
+    storeZipped<4>(d16, hn::Or(low, hn::ShiftLeft<8>(high)), at);
+  }
+}
+
+/// Stores the low halves of 32-bit lanes.
+template <class D> HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, uint8* at) {
+  const hn::Repartition<uint16, D> d16;
+  for (size_t i = 0; i < 2; ++i) {
+    storeLanes(
+        d16,
+        hn::ConcatEven(d16, hn::BitCast(d16, block.v[2 * i + 1]), hn::BitCast(d16, block.v[2 * i])),
+        at + i * kBlockPixels<D>);
+  }
+  (void)d;
+}
+
+// ---- Wide channels -----------------------------------------------------------------------------
+
+/// One channel of 16-bit pixels widened to 8 bits: v of b bits, repeated, is v times
+/// (2^b + 1) * 2^(8 - 2b), rounded down.
+template <class F, class D> HWY_INLINE hn::Vec<D> widenChannel(D d, hn::Vec<D> pixels) {
+  static_assert(F::kBits >= 4 && F::kBits <= 8, "channels of 4 to 8 bits are widened");
+  constexpr int kLow = F::kTop - F::kBits;
+  constexpr auto factorAt = [](int low) {
+    return uint64{(1u << F::kBits) + 1} << (24 - 2 * F::kBits - low);
+  };
+  // Where the channel lies when it is multiplied: at the top unless its factor fits 16 bits.
+  constexpr bool kStays = kLow != 0 && factorAt(kLow) <= 0xFFFF;
+  constexpr int kUp = kStays ? 0 : 16 - F::kTop;
+  auto channel = shiftLanes<-kUp>(pixels);
+  if constexpr (kLow != 0) channel = hn::And(channel, setMask(d, F::kMask << kUp));
+  return hn::MulHigh(channel, setMask(d, static_cast<uint32>(factorAt(kLow + kUp))));
+}
+
+/// The order of quarters that makes the lower and upper halves of a vector's parts, when
+/// interleaved with others of this order, the first and the second half of the result.
+template <class D> constexpr Words<D> orderForInterleaving() {
+  Words<D> words{};
+  const size_t parts = words.size() / 4;
+  for (size_t i = 0; i < words.size(); ++i)
+    words[i] = static_cast<int32>((i / 4 + i / 2 % 2 * parts) * 2 + i % 2);
+  return words;
+}
+template <class D16> HWY_INLINE hn::Vec<D16> inOrderForInterleaving(D16 d16, hn::Vec<D16> v) {
+  if constexpr (kLanes<D16> == 8) {
+    return v;
+  } else {
+    static constexpr Words<D16> kOrder = orderForInterleaving<D16>();
+    return chooseWords(d16, v, kOrder);
+  }
+}
+
+/// Two vectors of a block from the halves of their lanes, which are in the order above.
+template <class D, class V16>
+HWY_INLINE void interleaveHalves(D d, V16 low, V16 high, hn::Vec<D>* vectors) {
+  const hn::Repartition<uint16, D> d16;
+  vectors[0] = hn::BitCast(d, hn::InterleaveLower(d16, low, high));
+  vectors[1] = hn::BitCast(d, hn::InterleaveUpper(d16, low, high));
+}
+
+/// A block of opaque code 32 from 16-bit pixels.
+template <class From, class D> HWY_INLINE Block<D> loadWidened(D d, const uint8* at) {
+  const hn::Repartition<uint16, D> d16;
+  Block<D> block;
+  for (size_t i = 0; i < 2; ++i) {
+    const auto pixels = inOrderForInterleaving(d16, loadLanes(d16, at + i * kBlockPixels<D>));
+    const auto red = widenChannel<typename From::Red>(d16, pixels);
+    const auto green = widenChannel<typename From::Green>(d16, pixels);
+    const auto blue = widenChannel<typename From::Blue>(d16, pixels);
+    interleaveHalves(d, hn::Or(blue, hn::ShiftLeft<8>(green)), hn::Or(red, setMask(d16, 0xFF00)),
+                     block.v + 2 * i);
+  }
+  return block;
+}
+
+// ---- Blocks of any pixel size ------------------------------------------------------------------
+
+template <unsigned kBytes, class D> HWY_INLINE Block<D> loadBlock(D d, const uint8* at) {
+  static_assert(kBytes >= 2 && kBytes <= 4, "no source has pixels of another size");
+  if constexpr (kBytes == 3) {
+    return loadTripleBlock(d, at);
+  } else {
+    Block<D> block;
+    for (size_t i = 0; i < Block<D>::kVectors; ++i) {
+      const uint8* const from = at + i * kLanes<D> * kBytes;
+      if constexpr (kBytes == sizeof(hn::TFromD<D>)) {
+        block.v[i] = loadLanes(d, from);
+      } else {
+        const hn::Rebind<uint16, D> dHalf;
+        block.v[i] = hn::PromoteTo(d, loadLanes(dHalf, from));
+      }
+    }
+    return block;
+  }
+}
+
+template <unsigned kBytes, class D>
+HWY_INLINE void storeBlock(D d, const Block<D>& block, uint8* at) {
+  if constexpr (kBytes == sizeof(hn::TFromD<D>)) {
+    for (size_t i = 0; i < Block<D>::kVectors; ++i)
+      storeLanes(d, block.v[i], at + i * kBlockPixels<D>);
+  } else if constexpr (kBytes == 3) {
+    storeTripleBlock(d, block, at);
+  } else if constexpr (kBytes == 2) {
+    storeHalfBlock(d, block, at);
+  } else {
+    storeByteBlock(d, block, at);
+  }
+}
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif
+
+#endif

@@ -1,0 +1,191 @@
+// SPDX-License-Identifier: MIT
+//
+// The row loops of format conversion, one for each pair of a source and a destination format.
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "raster/convert/rasterConvKernels.cpp"
+#include "vector/hwySetup.h"
+#include "hwy/foreach_target.h"
+#include "hwy/highway.h"
+
+#include <type_traits>
+#include <utility>
+
+#include "colorTable-inl.h"
+#include "pixelLanes-inl.h"
+#include "rasterConvInternal.h"
+#include "vector/rows-inl.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+/// The source that looks its pixels up in a palette.
+struct Palette {
+  static constexpr unsigned kBytes = 1;
+};
+
+/// What converted colours have in the bits outside the channels: they are opaque.
+template <class To> inline constexpr uint32 kOpaque = To::kBytes == 4 ? 0xFF000000 : 0;
+
+template <class From, class To>
+uint32 loadConverted(const uint8* at, [[maybe_unused]] const uint8* palette) {
+  if constexpr (std::is_same_v<From, Palette>) {
+    const uint32 color = loadPixel<4>(entryAt(palette, *at));
+    return kSameFields<Code32, To> ? color : convertColor<Code32, To>(color);
+  } else {
+    return convertColor<From, To>(loadPixel<From::kBytes>(at)) | kOpaque<To>;
+  }
+}
+
+/// Pixel after pixel.
+template <class From, class To> void convertRowsPlainly(const RowPair& rows, const uint8* palette) {
+  const size_t pixels = rows.bytes / To::kBytes;
+  uint8* HWY_RESTRICT dst = rows.dst;
+  const uint8* HWY_RESTRICT src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
+    for (size_t x = 0; x < pixels; ++x)
+      storePixel<To::kBytes>(dst + x * To::kBytes,
+                             loadConverted<From, To>(src + x * From::kBytes, palette));
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
+  }
+}
+
+/// The least number of pixels that make up for converting a palette.
+constexpr size_t kMinPixelsForTable = 256;
+
+template <class To> void convertRowsByTable(const RowPair& rows, const uint8* palette) {
+  ColorTable<To> table(palette);
+  const size_t pixels = rows.bytes / To::kBytes;
+  forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { table.convertRow(dst, src, pixels); });
+}
+
+template <class To> void convertPaletteRows(const RowPair& rows, const uint8* palette) {
+  if constexpr (ColorTable<To>::kPays) {
+    const size_t pixels = rows.bytes / To::kBytes;
+    if (pixels >= ColorTable<To>::kMinRow && pixels * rows.rows >= kMinPixelsForTable)
+      return convertRowsByTable<To>(rows, palette);
+  }
+  convertRowsPlainly<Palette, To>(rows, palette);
+}
+
+#if HWY_TARGET == HWY_SCALAR
+
+template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
+  if constexpr (std::is_same_v<From, Palette>) {
+    convertPaletteRows<To>(rows, palette);
+  } else {
+    convertRowsPlainly<From, To>(rows, palette);
+  }
+}
+
+#else
+
+/// Loads a block in the format To.
+template <class From, class To, class D>
+HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
+  if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
+    static_assert(kSameFields<To, Code32>, "16-bit pixels are widened to codes 24 and 32 only");
+    return loadWidened<From>(d, src);
+  } else {
+    Block<D> block = loadBlock<From::kBytes>(d, src);
+    for (auto& lanes : block.v) {
+      if constexpr (!kSameFields<From, To>) lanes = convertLanes<From, To>(d, lanes);
+      if constexpr (kOpaque<To> != 0) lanes = hn::Or(lanes, hn::Set(d, kOpaque<To>));
+    }
+    return block;
+  }
+}
+
+template <class From, class To, class D>
+HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
+  storeBlock<To::kBytes>(d, loadConvertedBlock<From, To>(d, src), dst);
+}
+
+/// Block after block; the last one ends with the row and may do some pixels again. Rows that are
+/// shorter than a block take smaller ones.
+template <class From, class To, class D> void convertRowsByBlocks(D d, const RowPair& rows) {
+  constexpr size_t kPixels = kBlockPixels<D>;
+  const size_t pixels = rows.bytes / To::kBytes;
+  if (pixels < kPixels) {
+    if constexpr (kPixels > 16) {
+      convertRowsByBlocks<From, To>(hn::Half<D>(), rows);
+    } else {
+      convertRowsPlainly<From, To>(rows, nullptr);
+    }
+    return;
+  }
+  const size_t last = pixels - kPixels;
+  // Not through forRows: the constants of a conversion would be made for every row.
+  uint8* dst = rows.dst;
+  const uint8* src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
+    for (size_t x = 0; x < last; x += kPixels)
+      convertBlock<From, To>(d, dst + x * To::kBytes, src + x * From::kBytes);
+    convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes);
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
+  }
+}
+
+template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
+  if constexpr (std::is_same_v<From, Palette>) {
+    convertPaletteRows<To>(rows, palette);
+  } else {
+    (void)palette;
+    constexpr bool kShort = From::kBytes <= 2 && To::kBytes <= 2;
+    // Between 3 and 4 bytes a pixel there is nothing to compute, and half a cache line at a time
+    // was measured to be faster than a whole one.
+    constexpr size_t kMaxLanes = From::kBytes + To::kBytes == 7 ? 8 : 64;
+    using Lane = std::conditional_t<kShort, uint16, uint32>;
+    convertRowsByBlocks<From, To>(hn::CappedTag<Lane, kMaxLanes>(), rows);
+  }
+}
+
+#endif
+
+template <class From, class To> constexpr ConvertKernel kernel() {
+  if constexpr (std::is_same_v<From, To>) {
+    return nullptr;
+  } else {
+    return convertRows<From, To>;
+  }
+}
+template <class From, size_t... kTo>
+constexpr ConvertKernelsFrom kernelsFrom(std::index_sequence<kTo...>) {
+  return {kernel<From, std::tuple_element_t<kTo, DestinationFormats>>()...};
+}
+template <class From> constexpr ConvertKernelsFrom kernelsFrom() {
+  return kernelsFrom<From>(std::make_index_sequence<std::tuple_size_v<DestinationFormats>>());
+}
+template <size_t... kFrom> constexpr ConvertKernels allKernels(std::index_sequence<kFrom...>) {
+  return {kernelsFrom<std::tuple_element_t<kFrom, SourceFormats>>()..., kernelsFrom<Palette>()};
+}
+constexpr ConvertKernels kKernels = allKernels(std::make_index_sequence<kPaletteSource>());
+
+}  // namespace
+
+const ConvertKernels* levelConvertKernels() { return &kKernels; }
+
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+
+#include "vector/kernelChoice.h"
+
+namespace raster {
+namespace {
+
+HWY_EXPORT(levelConvertKernels);
+
+const ConvertKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(levelConvertKernels)(); }
+
+}  // namespace
+
+const ConvertKernels& convertKernels() { return chosenKernels<lookUpKernels>(); }
+
+}  // namespace raster
+
+#endif

@@ -1,0 +1,34 @@
+// SPDX-License-Identifier: MIT
+//
+// Fill and copy for the other modules of the library: as the exported functions, but with signed
+// pitches and without the way through the dynamic linker.
+
+#ifndef RASTER_RASTEROPS_INTERNAL_H
+#define RASTER_RASTEROPS_INTERNAL_H
+
+#include "frame/frameBuffer.h"
+
+namespace raster {
+
+/// What the kernels of one instruction-set level offer.
+struct RasteropsKernels {
+  void (*fillRows)(const Rows& rows, const PixelWords& pixels);
+  void (*copyRows)(const RowPair& rows);
+  void (*fillAlphaRows)(const Rows& rows, uint32 alphaBits);
+};
+
+/// Copies rows from the first one to the last one, each as memmove does.
+void copyRows(const RowPair& rows);
+
+/// As Raster_RectFill.
+void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
+              uint32 width, uint32 height);
+
+/// As Raster_RectCopy.
+void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
+              uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+              uint32 width, uint32 height);
+
+}  // namespace raster
+
+#endif

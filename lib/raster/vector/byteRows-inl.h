@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+//
+// Rows of bytes as vectors that overlap. Included once per instruction set, after Highway.
+//
+// A row's first and last vector lie where the row begins and ends, the others at aligned addresses
+// between them:
+//
+//     |==first==|
+//          |--------|--------|--------|
+//                                |==last===|
+//
+// So no row has a tail loop, and rows of any length and place take the same few branches. Vectors
+// may overlap provided that each one is made before its neighbour is stored; hence this is for rows
+// of which no step reads what an earlier one stored.
+//
+// What a vector is made of is an argument: make(tag, src, dst, at) gives the lanes at the offset
+// `at` of a row.
+
+#if defined(RASTER_BYTE_ROWS_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef RASTER_BYTE_ROWS_INL_H
+#undef RASTER_BYTE_ROWS_INL_H
+#else
+#define RASTER_BYTE_ROWS_INL_H
+#endif
+
+#include "frame/frameBuffer.h"
+#include "hwy/highway.h"
+#include "rows-inl.h"
+
+#if HWY_TARGET != HWY_SCALAR
+
+HWY_BEFORE_NAMESPACE();
+namespace raster::HWY_NAMESPACE {
+namespace {
+
+/// Runs body(tag) for the largest vector that `lanes` lanes fill: `d`, a half of it and so on, of
+/// no less than kLeast lanes. Returns false where they fill none.
+template <size_t kLeast = 1, class D, class Body>
+HWY_INLINE bool withLargestVector(D d, size_t lanes, const Body& body) {
+  if (lanes >= kLanes<D>) {
+    body(d);
+    return true;
+  }
+  if constexpr (kLanes<D> >= 2 * kLeast) {
+    return withLargestVector<kLeast>(hn::Half<D>(), lanes, body);
+  } else {
+    return false;
+  }
+}
+
+/// Calls body(row) where row(dst, src, bytes) stores a row of `bytes`, at most two vectors of `d`:
+/// the widest lanes that fit, from either end.
+template <class D, class Make, class Body>
+HWY_INLINE void withShortRow(D d, size_t bytes, const Make& make, const Body& body) {
+  withLargestVector(d, bytes, [&](auto tag) HWY_ATTR {
+    constexpr size_t n = kLanes<decltype(tag)>;
+    if (bytes == n) {
+      body([&, tag](uint8* dst, const uint8* src, size_t /*size*/)
+               HWY_ATTR { storeLanes(tag, make(tag, src, dst, 0), dst); });
+    } else {
+      body([&, tag](uint8* dst, const uint8* src, size_t size) HWY_ATTR {
+        const auto first = make(tag, src, dst, 0);
+        const auto last = make(tag, src, dst, size - n);
+        storeLanes(tag, first, dst);
+        storeLanes(tag, last, dst + size - n);
+      });
+    }
+  });
+}
+
+/// Stores a row of more than a vector in the order of a walk.
+template <Walk kWalk, class Make>
+HWY_INLINE void storeLongRow(uint8* dst, const uint8* src, size_t bytes, const Make& make) {
+  const hn::ScalableTag<uint8> d;
+  constexpr size_t n = kLanes<decltype(d)>;
+  constexpr bool kRight = kWalk == Walk::kToRight;
+  const size_t end = kRight ? bytes - n : 0;
+  size_t at = kRight ? 0 : bytes - n;
+  auto block = make(d, src, dst, at);
+  const auto storeAndMake = [&](size_t next) HWY_ATTR {
+    const auto made = make(d, src, dst, next);
+    storeLanes(d, block, dst + at);
+    block = made;
+    at = next;
+  };
+  if constexpr (kRight) {
+    for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < end; i += n) storeAndMake(i);
+  } else {
+    size_t i = bytes - 1 - (reinterpret_cast<uintptr_t>(dst) + bytes - 1) % n;
+    for (; i > n; i -= n) storeAndMake(i - n);
+  }
+  storeAndMake(end);
+  storeLanes(d, block, dst + at);
+}
+
+}  // namespace
+}  // namespace raster::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#endif
+
+#endif
