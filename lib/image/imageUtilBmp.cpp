@@ -37,7 +37,7 @@ struct Layout {
 
 /// Works out the layout; false when the record is not valid, the file would have 4 GiB or more, or
 /// the pixels would be more than any block of memory.
-/// Deliberate: below 8 bits per pixel a row has no bytes.
+/// Deliberate: below 8 bits per pixel a row has no bytes. Rows without bytes are not walked.
 bool layOut(const ImageUtilImage& image, Layout* layout) {
   const bool palette = isPaletteImage(image);
   const uint32 bytesPerPixel = palette ? image.bpp / 8 : 3;
@@ -46,7 +46,7 @@ bool layOut(const ImageUtilImage& image, Layout* layout) {
   ptrdiff_t block = 0;  // the type of the largest block's size
   layout->bitsPerPixel = palette ? image.bpp : kColorDepth;
   layout->colorsUsed = palette ? image.numColors : 0;
-  layout->rows = bytesPerPixel == 0 ? 0 : image.height;
+  layout->rows = layout->rowBytes == 0 ? 0 : image.height;
   layout->dataOffset = kFileHeaderBytes + kInfoHeaderBytes + 4 * layout->colorsUsed;
   return !__builtin_mul_overflow(layout->rowBytes, image.height, &layout->imageBytes) &&
          !__builtin_add_overflow(layout->imageBytes, 0, &block) &&

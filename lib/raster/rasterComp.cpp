@@ -210,6 +210,7 @@ struct Picture {
 };
 
 int32 compareBytes(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep, RowRun run) {
+  if (run.bytes == 0) return 0;
   for (; run.rows != 0; --run.rows, a = nextRow(a, aStep), b = nextRow(b, bStep)) {
     const int32 order = memcmp(a, b, run.bytes);
     if (order != 0) return order;

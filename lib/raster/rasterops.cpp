@@ -22,7 +22,10 @@ namespace {
 
 #if HWY_TARGET == HWY_SCALAR
 
+// Rows without bytes may have no address: the C library is not told of them.
+
 void fillRows(const Rows& rows, const PixelWords& pixels) {
+  if (rows.bytes == 0) return;
   forRows(rows, [&](uint8* row) {
     size_t i = 0;
     for (; rows.bytes - i >= sizeof pixels; i += sizeof pixels)
@@ -32,6 +35,7 @@ void fillRows(const Rows& rows, const PixelWords& pixels) {
 }
 
 void copyRows(const RowPair& rows) {
+  if (rows.bytes == 0) return;
   forRows(rows, [&](uint8* dst, const uint8* src) { memmove(dst, src, rows.bytes); });
 }
 
@@ -65,7 +69,8 @@ HWY_INLINE void fillWithWord(const Rows& rows, uint32 word) {
     fillLongRows(d, rows, same, same, same, same);
   };
   const bool filled = withLargestVector<sizeof word>(Bytes(), rows.bytes, fill);
-  if (!filled) forRows(rows, [&](uint8* row) HWY_ATTR { memcpy(row, &word, rows.bytes); });
+  if (!filled && rows.bytes != 0)
+    forRows(rows, [&](uint8* row) HWY_ATTR { memcpy(row, &word, rows.bytes); });
 }
 
 HWY_NOINLINE void fillWithPattern(const Rows& rows, const PixelWords& pixels) {
