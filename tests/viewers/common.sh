@@ -34,9 +34,12 @@ stop() {
     kill -9 "$process" 2>/dev/null
     wait "$process" 2>/dev/null
     status=$?
-    background=$(echo " $background " | sed "s/ $process / /")
+    forget "$process"
   done
 }
+
+# forget PROCESS: it has ended, and its number may be somebody else's.
+forget() { background=$(echo " $background " | sed "s/ $1 / /"); }
 
 trap 'stop $background; cleanUp' EXIT
 
@@ -59,6 +62,13 @@ startScreen() {
     start xterm -geometry 80x20+300+60 -bg '#101418' -fg '#d0e0d0' +bc -e \
       sh -c 'ls -l /usr/bin | head -60; exec sleep 86400'
   fi
+}
+
+# change: something on the whole screen becomes different.
+changes=0
+change() {
+  changes=$((changes + 1))
+  xsetroot -mod $((3 + changes % 9)) $((5 + changes % 7)) -fg '#1050a0' -bg '#f0c040'
 }
 
 # startServing OPTION...: the live screen of $DISPLAY; $address is where, $serving its process.
@@ -90,4 +100,40 @@ stopServing() {
 equal() {
   "$viewer" "$address" --compare "$DISPLAY" "$@" >out 2>&1 || fail "rfbViewer $*: $(cat out)"
   note "$(cat out)"
+}
+
+# beginFollowing: from here on viewers follow the screen, until endFollowing closes their pipe. They get
+# an end of it that is open already: a viewer that is late must not wait for somebody at the other end.
+beginFollowing() {
+  mkfifo pipe
+  exec 9<>pipe 8<pipe
+  rm pipe
+  followers=
+}
+
+# follow NAME OPTION...: a viewer that has its first picture; output in NAME.viewer.
+follow() {
+  name=$1
+  shift
+  "$viewer" "$address" --until-end-of-input "$@" <&8 8<&- 9>&- >"$name.viewer" 2>&1 &
+  followers="$followers $!:$name"
+  background="$! $background"
+}
+
+# A viewer that ends early is told of at the end.
+isFollowing() { grep -qs following "$2.viewer" || ! isRunning "$1"; }
+
+# untilAllFollow: waits until every viewer has its first picture.
+untilAllFollow() {
+  for follower in $followers; do waitFor isFollowing "${follower%%:*}" "${follower#*:}"; done
+}
+
+# endFollowing: the viewers compare, if they were told to, and end.
+endFollowing() {
+  exec 9>&- 8<&-
+  for follower in $followers; do
+    wait "${follower%%:*}" || fail "the viewer ${follower#*:} ended with $?"
+    forget "${follower%%:*}"
+    note "$(sed 1d "${follower#*:}.viewer")"
+  done
 }

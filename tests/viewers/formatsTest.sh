@@ -5,22 +5,26 @@
 
 formats='32 red-lowest-32 big-endian-32 24 16 big-endian-16 15 8 6 1-1-1 high-32 3 3-3-2'
 
+# everyFormat ENCODING FORMATS: a viewer for each of them, at once.
+everyFormat() {
+  beginFollowing
+  for format in $2; do
+    follow "$format" --compare "$DISPLAY" --encoding "$1" --format "$format"
+  done
+  endFollowing
+}
+
 startScreen
 startServing --listen 127.0.0.1:0
 for version in 3.3 3.7 3.8; do equal --version $version; done
-for encoding in raw zrle tightpng copyrect,zrle; do
-  for format in $formats; do equal --encoding $encoding --format "$format"; done
-done
+for encoding in raw zrle tightpng copyrect,zrle; do everyFormat $encoding "$formats"; done
 stopServing
 [ ! -s serve.err ] || fail "serve said: $(cat serve.err)"
 
 for depth in 8 15 16; do
   startScreen 201x123x$depth
   startServing --listen 127.0.0.1:0
-  for format in 32 big-endian-32 16 15 8 6 1-1-1; do
-    for encoding in raw zrle; do equal --encoding $encoding --format "$format"; done
-  done
-  equal
+  for encoding in raw zrle; do everyFormat $encoding '32 big-endian-32 16 15 8 6 1-1-1'; done
   xsetroot -solid '#2a7f62'  # with 8 bits, a colour that the palette has not had
   equal
   stopServing

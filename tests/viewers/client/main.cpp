@@ -68,6 +68,8 @@ class Viewer {
   void followUntilEndOfInput() {
     pollfd input = {STDIN_FILENO, POLLIN, 0};
     char ignored = 0;
+    printf("following\n");
+    fflush(stdout);
     for (;;) {
       if (link_.readable(20)) receiveUpdate();
       if (poll(&input, 1, 0) == 1 && read(STDIN_FILENO, &ignored, 1) <= 0) return;
