@@ -3,7 +3,6 @@
 #include "display.h"
 
 #include <xcb/shm.h>
-#include <xcb/xfixes.h>
 
 #include <algorithm>
 #include <cstdlib>
@@ -14,7 +13,6 @@
 #include "geometry.h"
 #include "progress.h"
 #include "raster.h"
-#include "xReply.h"
 
 namespace tool {
 namespace {
@@ -45,6 +43,10 @@ bool hasKnownMasks(uint32 depth, const xcb_visualtype_t& visual) {
   }
 }
 
+xcb_connection_t* connectTo(const std::string& name, int* screenNumber) {
+  return xcb_connect(name.empty() ? nullptr : name.c_str(), screenNumber);
+}
+
 /// Rows from the server into a picture, from its row `top` down.
 void copyRows(Picture& picture, uint32 top, const uint8* rows, uint32 rowPitch, uint32 height) {
   Raster_RectCopy(picture.data(), picture.pitch(), rows, rowPitch, picture.bytesPerPixel(), 0, 0, 0,
@@ -53,9 +55,9 @@ void copyRows(Picture& picture, uint32 top, const uint8* rows, uint32 rowPitch, 
 
 }  // namespace
 
-Display::Display(const std::string& name) : connection(nullptr, xcb_disconnect) {
+Display::Display(const std::string& name) : displayName(name), connection(nullptr, xcb_disconnect) {
   int number = 0;
-  connection.reset(xcb_connect(name.empty() ? nullptr : name.c_str(), &number));
+  connection.reset(connectTo(name, &number));
   if (xcb_connection_has_error(connection.get()) != 0) {
     const char* standard = getenv("DISPLAY");
     const std::string shown = !name.empty() ? name : standard != nullptr ? standard : "";
@@ -182,6 +184,26 @@ Picture Display::capture(const Rect& region) {
   return picture;
 }
 
+/// Null when there is none at the moment. An X server gives a cursor away only while the number of
+/// the client that made it is in use; a new client gets the lowest number that is not. So for
+/// cursors of clients that have left, as xsetroot does, we come in once more, until we have theirs.
+Display::CursorReply Display::cursorReply() {
+  constexpr size_t kMostPlaceholders = 16;
+  for (;;) {
+    xcb_generic_error_t* answer = nullptr;
+    CursorReply reply(xcb_xfixes_get_cursor_image_reply(
+                          connection.get(), xcb_xfixes_get_cursor_image(connection.get()), &answer),
+                      free);
+    const ReplyPointer<xcb_generic_error_t> error(answer, free);
+    if (reply || !error || error->error_code != XCB_ACCESS) return reply;
+    if (placeholders.size() == kMostPlaceholders) break;
+    placeholders.emplace_back(connectTo(displayName, nullptr), xcb_disconnect);
+    if (xcb_connection_has_error(placeholders.back().get()) != 0) break;
+  }
+  placeholders.clear();  // the numbers that they had may be of use the next time
+  return {nullptr, free};
+}
+
 std::optional<LiveCursor> Display::cursor() {
   if (!hasExtension(connection.get(), xcb_xfixes_id))
     throw Failure("the display does not tell its cursor: it has no XFIXES extension");
@@ -189,8 +211,7 @@ std::optional<LiveCursor> Display::cursor() {
             xcb_xfixes_query_version(connection.get(), XCB_XFIXES_MAJOR_VERSION,
                                      XCB_XFIXES_MINOR_VERSION),
             xcb_xfixes_query_version_reply, "the version of XFIXES");
-  const auto reply = replyTo(connection.get(), xcb_xfixes_get_cursor_image(connection.get()),
-                             xcb_xfixes_get_cursor_image_reply);
+  const CursorReply reply = cursorReply();
   if (!reply && xcb_connection_has_error(connection.get()) == 0) return std::nullopt;
   if (!reply) throw Failure("the display went away");
   const uint32* pixels = xcb_xfixes_get_cursor_image_cursor_image(reply.get());

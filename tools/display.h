@@ -6,6 +6,7 @@
 #define RASTER_TOOLS_DISPLAY_H
 
 #include <xcb/xcb.h>
+#include <xcb/xfixes.h>
 
 #include <memory>
 #include <optional>
@@ -16,6 +17,7 @@
 #include "liveCursor.h"
 #include "picture.h"
 #include "sharedMemory.h"
+#include "xReply.h"
 
 namespace tool {
 
@@ -51,12 +53,18 @@ class Display {
   uint32 rowBytes(uint32 width) const;
 
  private:
+  using Connection = std::unique_ptr<xcb_connection_t, void (*)(xcb_connection_t*)>;
+  using CursorReply = ReplyPointer<xcb_xfixes_get_cursor_image_reply_t>;
+
   void checkFormat();
   void readPalette();
   bool captureShared(Picture& picture, const Rect& region);
   void captureInBands(Picture& picture, const Rect& region);
+  CursorReply cursorReply();
 
-  std::unique_ptr<xcb_connection_t, void (*)(xcb_connection_t*)> connection;
+  std::string displayName;
+  Connection connection;
+  std::vector<Connection> placeholders;  // for clients that have left: see cursorReply()
   ScreenSetup format;
   Rect area = {};
   std::unique_ptr<SharedMemory> sharedMemory;

@@ -27,7 +27,7 @@ const char kHelp[] =
     "  --save FILE             writes the picture as a portable pixmap\n"
     "  --pointer X,Y           moves the pointer there\n"
     "  --where DISPLAY         prints where the pointer is then, as X,Y\n"
-    "  --type TEXT             presses keys; \\n is Return\n"
+    "  --type TEXT             presses keys; the end of a line is Return\n"
     "  --patience SECONDS      for the picture to become equal (30)\n"
     "Exit status: 0 for equal, 1 for different, 2 for trouble.\n";
 

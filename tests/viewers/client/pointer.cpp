@@ -5,6 +5,7 @@
 
 #include <cstdlib>
 #include <memory>
+#include <vector>
 
 #include "link.h"
 #include "screen.h"
@@ -15,11 +16,24 @@ namespace {
 using Connection = std::unique_ptr<xcb_connection_t, decltype(&xcb_disconnect)>;
 template <class Reply> using Owned = std::unique_ptr<Reply, decltype(&free)>;
 
+Connection connected(const std::string& display) {
+  Connection x(xcb_connect(display.c_str(), nullptr), xcb_disconnect);
+  if (xcb_connection_has_error(x.get()) != 0) throw Broken("no connection to display " + display);
+  return x;
+}
+
+/// X servers tell the cursor of a client that has left only while somebody else has its number.
+std::vector<Connection> withEveryLowNumberTaken(const std::string& display) {
+  std::vector<Connection> some;
+  for (int i = 0; i < 8; ++i) some.push_back(connected(display));
+  return some;
+}
+
 }  // namespace
 
 Pointer pointerOf(const std::string& display) {
-  const Connection x(xcb_connect(display.c_str(), nullptr), xcb_disconnect);
-  if (xcb_connection_has_error(x.get()) != 0) throw Broken("no connection to display " + display);
+  const std::vector<Connection> others = withEveryLowNumberTaken(display);
+  const Connection x = connected(display);
   // The extension has to hear which version is spoken.
   const auto version = xcb_xfixes_query_version(x.get(), 4, 0);
   const Owned<xcb_xfixes_query_version_reply_t> known(
