@@ -10,6 +10,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <system_error>
+#include <utility>
 
 #include "commands.h"
 
@@ -117,9 +118,9 @@ std::optional<uint64> InputStream::left() const {
   return status.st_size > at ? static_cast<uint64>(status.st_size - at) : 0;
 }
 
-std::vector<uint8> readWhole(InputStream& input, uint64 most) {
-  std::vector<uint8> bytes;
-  input.append(bytes, most + 1);
+std::vector<uint8> readWhole(InputStream& input, uint64 most, std::vector<uint8> start) {
+  std::vector<uint8> bytes = std::move(start);
+  input.append(bytes, most + 1 - std::min<uint64>(most, bytes.size()));
   if (bytes.size() > most) throw Failure(input.name() + " is too large");
   return bytes;
 }

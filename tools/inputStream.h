@@ -45,8 +45,10 @@ class InputStream {
   bool isOurs = false;
 };
 
-/// All bytes of an input. Fails when they are more than `most`.
-std::vector<uint8> readWhole(InputStream& input, uint64 most = uint64{1} << 30);
+/// All bytes of an input, of which `start` has been read already. Fails when they are more than
+/// `most`.
+std::vector<uint8> readWhole(InputStream& input, uint64 most = uint64{1} << 30,
+                             std::vector<uint8> start = {});
 
 }  // namespace tool
 
