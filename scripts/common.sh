@@ -82,7 +82,7 @@ needI386Libraries() {
 }
 
 needBuildTools() {
-  needPackages g++ cmake ninja-build doxygen pkg-config libpng-dev libhwy-dev libgtest-dev \
+  needPackages g++ cmake ninja-build doxygen help2man pkg-config libpng-dev libhwy-dev libgtest-dev \
     libbenchmark-dev libcli11-dev libxcb1-dev libxcb-shm0-dev libxcb-xfixes0-dev libxcb-render0-dev \
     libxcb-damage0-dev libxcb-xinput-dev libxcb-xtest0-dev libxcb-keysyms1-dev zlib1g-dev
   case $1 in

@@ -1,5 +1,5 @@
 #!/bin/sh
-# Every exported name has a manual page, which is its family's.
+# Every exported name has a manual page, which is its family's; the tool has one, and each of its commands.
 . "$(dirname "$0")/common.sh"
 [ -e "$BUILD/docs/made" ] || { echo "skipped: no reference was made here"; exit 77; }
 installHere
@@ -22,6 +22,18 @@ if ls "$manual/man3" | grep -vE '^([A-Z]|raster|rect|image|tarnlibs|[a-zA-Z0-9]+
   exit 1
 fi
 
+tool=$BUILD/bin/rastertool
+if [ -e "$BUILD/docs/madeTool" ]; then
+  for command in $("$tool" help | sed -n '/^Commands:/,/^$/s/^  \([a-z]*\) .*/\1/p'); do
+    page=$manual/man1/rastertool-$command.1
+    grep -q "^rastertool-$command .- [A-Z]" "$page" || { echo "$command is not named"; exit 1; }
+    grep -A 2 '^.SH SYNOPSIS' "$page" | grep -q ",$command\>" || { echo "$command is not shown"; exit 1; }
+    grep -A 9 '^.SH EXAMPLES' "$page" | grep -q "rastertool $command" || { echo "$command has no example"; exit 1; }
+    grep -q "rastertool-$command (1)" "$manual/man1/rastertool.1" || { echo "$command is not found"; exit 1; }
+  done
+  grep -q 'Exit status: 0' "$manual/man1/rastertool.1"
+fi
+
 command -v man >/dev/null || exit 0
 MANWIDTH=100 man -M "$manual" Raster_Scale >"$work/page"
 grep -q '^ *raster_scaling - Scaling' "$work/page"
@@ -29,3 +41,7 @@ grep -q 'Only the near sides are bounded below' "$work/page"
 MANWIDTH=100 man -M "$manual" --warnings 7 raster 2>&1 >"$work/page" | tee "$work/warnings"
 [ ! -s "$work/warnings" ]
 grep -q 'Fatal errors' "$work/page"
+for page in "$manual"/man1/*; do
+  MANWIDTH=100 man -M "$manual" --warnings "$page" 2>&1 >"$work/page" | tee "$work/warnings"
+  [ ! -s "$work/warnings" ]
+done
