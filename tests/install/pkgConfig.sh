@@ -26,3 +26,6 @@ if [ -n "$BUILD" ]; then
 fi
 inUsr=$(flags --cflags)
 [ "$(echo $inUsr)" = -I/usr/include/raster ] || { echo "in /usr: $inUsr"; exit 1; }
+# Where its libraries are, pkg-config knows for the machine's own word size.
+[ -n "$TOOLCHAIN" ] || [ "$(echo $(flags --libs))" = '-lraster -ltarnlibs' ] ||
+  { echo "in /usr: $(flags --libs)"; exit 1; }
