@@ -150,7 +150,7 @@ void encodeBySpng(const ImageUtilImage& image) {
 #endif
 
 void encodePngJob(const std::string& name, uint32 depth, uint32 bpp, int level = -1) {
-  bench::job("png/encode-" + name, [=](Contenders& c, Extent e) {
+  bench::job("png/encode-" + name, bench::kFileExtents, [=](Contenders& c, Extent e) {
     const ImageUtilImage image = desktop(e, depth, bpp);
     const ImageUtilPNGWriteParams params = {level, true};
     c.add("raster", [=] {
@@ -176,7 +176,7 @@ void encodePngJob(const std::string& name, uint32 depth, uint32 bpp, int level =
 }
 
 void decodePngJob(const std::string& name, bool alpha) {
-  bench::job("png/decode-" + name, [=](Contenders& c, Extent e) {
+  bench::job("png/decode-" + name, bench::kFileExtents, [=](Contenders& c, Extent e) {
     const ImageUtilImage image = desktop(e, 24, alpha ? 32 : 24);
     const ImageUtilPNGWriteParams params = {-1, !alpha};
     DynBuf file;
@@ -197,7 +197,7 @@ void decodePngJob(const std::string& name, bool alpha) {
 }
 
 void encodeBmpJob(const std::string& name, uint32 depth, uint32 bpp) {
-  bench::job("bmp/encode-" + name, [=](Contenders& c, Extent e) {
+  bench::job("bmp/encode-" + name, bench::kFileExtents, [=](Contenders& c, Extent e) {
     const ImageUtilImage image = desktop(e, depth, bpp);
     c.add("raster", [=] {
       DynBuf out;

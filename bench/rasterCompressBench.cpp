@@ -140,7 +140,7 @@ int lz4Compress(const Pixels& pixels, char* to, int acceleration) {
 #endif
 
 void compressJob(const std::string& name, Pixels (*image)(Extent)) {
-  bench::job("rle/compress-" + name, [=](Contenders& c, Extent e) {
+  bench::job("rle/compress-" + name, bench::kFileExtents, [=](Contenders& c, Extent e) {
     const Pixels pixels = image(e);
     const Block block = compressed(pixels, e);
     c.add("raster", [=] { free(compressed(pixels, e).bytes); });
@@ -157,7 +157,7 @@ void compressJob(const std::string& name, Pixels (*image)(Extent)) {
 }
 
 void decompressJob(const std::string& name, Pixels (*image)(Extent)) {
-  bench::job("rle/decompress-" + name, [=](Contenders& c, Extent e) {
+  bench::job("rle/decompress-" + name, bench::kFileExtents, [=](Contenders& c, Extent e) {
     const Pixels pixels = image(e);
     const Block block = compressed(pixels, e);
     c.add("raster", [=] {

@@ -118,6 +118,7 @@ void addPixman([[maybe_unused]] Contenders& c, [[maybe_unused]] const Job& job,
                [[maybe_unused]] const Pictures& p) {
 #ifdef HAVE_PIXMAN
   if (job.from.pixman == kNone || job.to.pixman == kNone) return;
+  if (p.srcPitch % 4 != 0 || p.dstPitch % 4 != 0) return;
   const auto image = [&](const Format& format, uint8* pixels, uint32 pitch) {
     return bench::pixmanImage(static_cast<pixman_format_code_t>(format.pixman), pixels, p.extent,
                               pitch);

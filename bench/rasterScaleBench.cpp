@@ -4,8 +4,6 @@
 // larger side: of the destination when enlarging, of the source when reducing. Peers that do not
 // centre or weigh pixels as this library does still do the same amount of work.
 
-#include <sys/mman.h>
-
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
@@ -47,8 +45,6 @@ constexpr Job kJobs[] = {
     {"box-24-x0.5", Way::kBox, 3, 3, 0.5},
     {"nearest-32-to-16-x1.5", Way::kNearest, 4, 2, 1.5},
 };
-constexpr const char* kGrowing[] = {"nearest-32-x1.5", "bilinear-32-x1.5", "box-32-x0.5"};
-constexpr uint32 kGrowth[] = {64, 256, 1024, 4096};
 
 /// One job at one size: both frame buffers, packed.
 struct Work {
@@ -63,30 +59,15 @@ struct Work {
   int intPitch(bool ofSrc) const { return static_cast<int>(ofSrc ? srcPitch() : dstPitch()); }
 };
 
-/// Two blocks of noise that hold the largest frames of the growth curve.
-uint8* largeBuffer(int index) {
-  constexpr size_t kBytes = size_t{4} * 4096 * 4096;
-  static uint8* const base = [] {
-    void* memory =
-        mmap(nullptr, 2 * kBytes, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (memory == MAP_FAILED) abort();
-    auto* bytes = static_cast<uint8*>(memory);
-    for (size_t at = 0; at < 2 * kBytes; at += bench::kBufferBytes)
-      memcpy(bytes + at, bench::buffer(0), bench::kBufferBytes);
-    return bytes;
-  }();
-  return base + static_cast<size_t>(index) * kBytes;
-}
-
-Work workOf(const Job& job, Extent larger, bool large) {
+Work workOf(const Job& job, Extent larger) {
   const double smaller = job.scale > 1 ? 1 / job.scale : job.scale;
   const auto side = [&](uint32 n) {
     return std::max(1u, static_cast<uint32>(job.scale > 1 ? std::ceil(n * smaller)
                                                           : std::floor(n * smaller + 1e-9)));
   };
   const Extent other = {side(larger.width), side(larger.height)};
-  return {job, large ? largeBuffer(0) : bench::buffer(0), large ? largeBuffer(1) : bench::buffer(1),
-          job.scale > 1 ? other : larger, job.scale > 1 ? larger : other};
+  return {job, bench::buffer(0), bench::buffer(1), job.scale > 1 ? other : larger,
+          job.scale > 1 ? larger : other};
 }
 
 /// 32 bytes anywhere in memory.
@@ -242,15 +223,7 @@ void addContenders(Contenders& c, const Work& w) {
 int main(int argc, char** argv) {
   for (const Job& job : kJobs) {
     const std::string name = std::string("scale/") + job.name;
-    bench::job(name, [&](Contenders& c, Extent e) { addContenders(c, workOf(job, e, false)); });
-    for (const char* growing : kGrowing) {
-      if (strcmp(growing, job.name) != 0) continue;
-      for (const uint32 side : kGrowth) {
-        const Extent e = {side, side};
-        Contenders contenders(name, e, e.pixels());
-        addContenders(contenders, workOf(job, e, true));
-      }
-    }
+    bench::job(name, [&](Contenders& c, Extent e) { addContenders(c, workOf(job, e)); });
   }
   return bench::run(argc, argv);
 }

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <map>
 #include <vector>
 
@@ -98,6 +99,27 @@ void printTable() {
   }
 }
 
+void printLines() {
+  for (const std::string& job : table().jobs) {
+    const size_t slash = job.rfind('/', job.size() - 2);
+    for (const Contender& c : table().contenders[job]) {
+      if (c.seconds == 0) continue;
+      printf("%s,%s,%g,%s,%.4g\n", job.substr(0, slash).c_str(),
+             job.substr(slash + 1, job.size() - slash - 2).c_str(), c.units, c.name.c_str(),
+             c.seconds * 1e9);
+    }
+  }
+}
+
+/// Takes the option out of the arguments.
+bool takeOption(std::vector<char*>& arguments, const char* option) {
+  const auto at = std::find_if(arguments.begin(), arguments.end(),
+                               [&](const char* given) { return strcmp(given, option) == 0; });
+  if (at == arguments.end()) return false;
+  arguments.erase(at);
+  return true;
+}
+
 void fillWithNoise(uint8* bytes, size_t count) {
   uint64 state = 1;
   for (size_t i = 0; i < count; ++i) {
@@ -110,13 +132,34 @@ void fillWithNoise(uint8* bytes, size_t count) {
 
 uint8* buffer(int index) {
   static uint8* const base = [] {
-    void* memory = mmap(nullptr, kBuffers * kBufferBytes, PROT_READ | PROT_WRITE,
-                        MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    void* memory = mmap(nullptr, kBuffers * kLargestBytes, PROT_READ | PROT_WRITE,
+                        MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
     if (memory == MAP_FAILED) abort();
-    fillWithNoise(static_cast<uint8*>(memory), kBuffers * kBufferBytes);
-    return static_cast<uint8*>(memory);
+    auto* bytes = static_cast<uint8*>(memory);
+    for (size_t i = 0; i < kBuffers; ++i) fillWithNoise(bytes + i * kLargestBytes, kBufferBytes);
+    return bytes;
   }();
-  return base + static_cast<size_t>(index) * kBufferBytes;
+  return base + static_cast<size_t>(index) * kLargestBytes;
+}
+
+void Contenders::fillLargeBuffers() {
+  static const bool filled = [] {
+    for (int i = 0; i < kBuffers; ++i) {
+      for (size_t at = kBufferBytes; at < kLargestBytes; at += kBufferBytes)
+        memcpy(buffer(i) + at, buffer(i), kBufferBytes);
+    }
+    return true;
+  }();
+  (void)filled;
+}
+
+bool grows(const std::string& job) {
+  static const char* const kJobs[] = {
+      "fill/32",          "copy/32",          "ropcopy/32-xor",        "tile/32-copy-64x64",
+      "bits/32",          "convert/32-to-16", "compare/32-equal",      "blend/over-32",
+      "blend/over-16",    "yuv/YUY2-to-32",   "scale/nearest-32-x1.5", "scale/bilinear-32-x1.5",
+      "scale/box-32-x0.5"};
+  return std::find(std::begin(kJobs), std::end(kJobs), job) != std::end(kJobs);
 }
 
 void Contenders::remember(const std::string& prefix, const std::string& contender, double units) {
@@ -127,6 +170,7 @@ void Contenders::remember(const std::string& prefix, const std::string& contende
 
 int run(int argc, char** argv) {
   std::vector<char*> arguments(argv, argv + argc);
+  const bool asLines = takeOption(arguments, "--csv");
   std::string defaults[] = {"--benchmark_enable_random_interleaving=true",
                             "--benchmark_repetitions=7", "--benchmark_min_time=0.01"};
   size_t at = 1;  // before the caller's, which then prevail
@@ -135,10 +179,13 @@ int run(int argc, char** argv) {
   int count = static_cast<int>(arguments.size());
   benchmark::Initialize(&count, arguments.data());
   if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) return 2;
-  useOneThread();
+  preparePeers();
   BestTimes best;
   benchmark::RunSpecifiedBenchmarks(&best);
-  printTable();
+  if (asLines)
+    printLines();
+  else
+    printTable();
   return 0;
 }
 

@@ -29,10 +29,14 @@
 #endif
 #ifdef HAVE_SWSCALE
 extern "C" {
+#include <libavutil/cpu.h>
 #include <libavutil/log.h>
 #include <libswscale/swscale.h>
 }
 #endif
+
+#include <cstdlib>
+#include <cstring>
 
 #include "baseTypes.h"
 #include "support/jobs.h"
@@ -79,10 +83,28 @@ inline SDL_Surface* surface(Uint32 format, uint8* pixels, Extent e, uint32 pitch
 }
 #endif
 
-/// Everybody works with one thread, as this library does.
-inline void useOneThread() {
+/// Everybody works with one thread, as this library does, and those that choose an instruction set
+/// when they run choose none above RASTER_CPU_LEVEL (OpenCV and Qt: in scripts/bench, before they
+/// start; the others have nothing above SSSE3).
+inline void preparePeers() {
 #ifdef HAVE_OPENCV
   cv::setNumThreads(1);
+#endif
+  const char* level = getenv("RASTER_CPU_LEVEL");
+  if (level == nullptr) return;
+  [[maybe_unused]] const bool upToSse4 = strcmp(level, "sse4") == 0;
+  [[maybe_unused]] const bool upToAvx2 = upToSse4 || strcmp(level, "avx2") == 0;
+#ifdef HAVE_LIBYUV
+  if (upToSse4)
+    libyuv::MaskCpuFlags(libyuv::kCpuHasX86 | libyuv::kCpuHasSSE2 | libyuv::kCpuHasSSSE3 |
+                         libyuv::kCpuHasSSE41 | libyuv::kCpuHasSSE42);
+#endif
+#ifdef HAVE_SWSCALE
+  constexpr int kAbove512 = AV_CPU_FLAG_AVX512 | AV_CPU_FLAG_AVX512ICL;
+  constexpr int kAboveSse4 = AV_CPU_FLAG_AVX | AV_CPU_FLAG_AVX2 | AV_CPU_FLAG_FMA3 |
+                             AV_CPU_FLAG_FMA4 | AV_CPU_FLAG_XOP | AV_CPU_FLAG_BMI1 |
+                             AV_CPU_FLAG_BMI2;
+  if (upToAvx2) av_force_cpu_flags(av_get_cpu_flags() & ~(kAbove512 | (upToSse4 ? kAboveSse4 : 0)));
 #endif
 }
 
