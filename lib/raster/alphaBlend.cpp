@@ -5,12 +5,11 @@
 #include "blend/alphaBlendInternal.h"
 
 #include <algorithm>
-#include <array>
 #include <utility>
 
 #include "divisionByZero.h"
 #include "host/panicPlace.h"
-#include "raster.h"
+#include "vector/kernelChoice.h"
 
 namespace raster {
 namespace {
@@ -19,23 +18,30 @@ constexpr char kSource[] = "lib/raster/alphaBlend";
 constexpr int kBadFormatLine = 205;  // part of the message, whatever line the call stands on
 constexpr int kBadFormatBug = 19864;
 
-/// A destination format: its pixel size and where its kernels are.
+/// A destination format: the depth and the bits per pixel (0: any) that ask for it, the size of its
+/// pixels, and its kernels.
 struct Format {
+  uint32 depth;
+  uint32 bpp;
   uint32 bytes;
   const FormatKernels& (*kernels)();
 };
-constexpr Format kFormats[] = {{1, blendKernels6},  {1, blendKernels8},  {2, blendKernels15},
-                               {2, blendKernels16}, {3, blendKernels24}, {4, blendKernels32}};
+template <auto kLookUp, size_t kIndex> const FormatKernels& kernelsAt() {
+  return (&chosenKernels<kLookUp>())[kIndex];
+}
 
-/// The arguments of a call that reach the kernels.
-struct Call {
-  uint8* dst;
-  uint32 dstX, dstY, dstPitch;
-  const uint8* src;
-  uint32 srcX, srcY, srcPitch;
-  uint32 width, height;
-  uint32 flags, srcAlpha, dstAlpha;
-};
+/// Formats by operators by flags. Deliberate: bits per pixel decide for depth 24 only.
+constexpr Format kFormats[] = {
+    {6, 0, 1, kernelsAt<lookUpBlend8, 0>},    {8, 0, 1, kernelsAt<lookUpBlend8, 1>},
+    {15, 0, 2, kernelsAt<lookUpBlend16, 0>},  {16, 0, 2, kernelsAt<lookUpBlend16, 1>},
+    {24, 24, 3, kernelsAt<lookUpBlend32, 0>}, {24, 32, 4, kernelsAt<lookUpBlend32, 1>}};
+
+const Format& formatFor(uint32 depth, uint32 bpp) {
+  for (const Format& format : kFormats) {
+    if (format.depth == depth && (format.bpp == 0 || format.bpp == bpp)) return format;
+  }
+  assertFailed({kSource, kBadFormatLine}, kBadFormatBug);
+}
 
 /// (255 - da) / da, at most 255. Deliberate: a destination alpha of 0 faults as the division does.
 uint8 saturateShare(uint32 da) {
@@ -43,22 +49,22 @@ uint8 saturateShare(uint32 da) {
   return static_cast<uint8>(std::min(255u, (255 - da) / da));
 }
 
-BlendRect rowsOf(const Call& call, uint32 op, uint32 bytes) {
+BlendRect rowsOf(const BlendCall& call, uint32 bytes) {
   const bool scalesSrc = (call.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0;
   const bool scalesDst = (call.flags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   const auto dstAlpha = static_cast<uint8>(scalesDst ? call.dstAlpha : 255);
   BlendRect rect{};
-  rect.dstStep = pitchOf(call.dstPitch);
-  rect.dst = rowAt(call.dst, rect.dstStep, call.dstY, call.dstX, bytes);
-  rect.srcStep = pitchOf(call.srcPitch);
+  rect.dstStep = call.dst.pitch;
+  rect.dst = call.dst.pixel(bytes);
+  rect.srcStep = call.src.pitch;
   rect.before = rect.dst;
   rect.beforeStep = rect.dstStep;
-  rect.src = rowAt(call.src, rect.srcStep, call.srcY, call.srcX, 4);
+  rect.src = call.src.pixel(4);
   rect.width = call.width;
   rect.height = call.height;
   rect.srcAlpha = static_cast<uint8>(scalesSrc ? call.srcAlpha : 255);
   rect.dstAlpha = dstAlpha;
-  rect.saturateShare = op == RASTER_BLEND_SATURATE ? saturateShare(dstAlpha) : uint8{0};
+  rect.saturateShare = call.op == RASTER_BLEND_SATURATE ? saturateShare(dstAlpha) : uint8{0};
   return rect;
 }
 
@@ -69,21 +75,10 @@ const BlendKernel& kernelFor(const FormatKernels& kernels, uint32 op, const Blen
   return kernels[op][flags];
 }
 
-/// The addresses [first, end) of all rows of a rectangle and between them.
-struct Span {
-  uintptr_t first, end;
-};
-Span spanOf(const uint8* row, intptr_t step, size_t bytes, uint32 height) {
-  const auto first = reinterpret_cast<uintptr_t>(row);
-  const auto last = reinterpret_cast<uintptr_t>(rowAt(row, step, height - 1, 0, 0));
-  return {std::min(first, last), std::max(first, last) + bytes};
-}
-bool overlap(const Span& a, const Span& b) { return a.first < b.end && b.first < a.end; }
-
 /// Whether destination and source, with what lies between their rows, share no byte.
 bool isApart(const BlendRect& rect, uint32 bytes) {
-  return !overlap(spanOf(rect.dst, rect.dstStep, rect.width * bytes, rect.height),
-                  spanOf(rect.src, rect.srcStep, rect.width * 4, rect.height));
+  return RowSpan(rect.dst, rect.dstStep, rect.width * bytes, rect.height)
+      .isApartFrom(RowSpan(rect.src, rect.srcStep, rect.width * 4, rect.height));
 }
 
 /// Whether a kernel, which reads some pixels ahead of those that it has written, gives what the
@@ -159,7 +154,8 @@ constexpr size_t stageStep(size_t span) {
 void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel& kernel) {
   uint8* const dst = std::exchange(rect.dst, stage);
   const intptr_t dstStep = rect.dstStep;
-  const auto copyRows = bytes == 4 ? blendStageKernels().copyColors : blendStageKernels().copyRows;
+  const StageKernels& stages = chosenKernels<lookUpBlendStage>();
+  const auto copyRows = bytes == 4 ? stages.copyColors : stages.copyRows;
   const size_t span = rect.width * bytes;
   rect.dstStep = static_cast<intptr_t>(stageStep(span));
   if (!kernel.readsBlocks) {
@@ -201,57 +197,19 @@ void blendStaged(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel)
   }
 }
 
-void blend(const Call& call, const Format& format, uint32 op, bool staged) {
-  if (call.width == 0 || call.height == 0) return;
-  const BlendRect rect = rowsOf(call, op, format.bytes);
-  const BlendKernel& kernel = kernelFor(format.kernels(), op, rect);
-  (staged ? blendStaged : blendInPlace)(rect, format.bytes, kernel);
-}
-
-template <size_t kFormat, uint32 kOp, bool kStaged> void blendWith(const Call& call) {
-  blend(call, kFormats[kFormat], kOp, kStaged);
-}
-
-/// The blends of one operator onto one format.
-struct Pair {
-  void (*inPlace)(const Call& call);
-  void (*staged)(const Call& call);
-};
-using Row = std::array<Pair, 16>;
-
-template <size_t kFormat, size_t... kOps>
-constexpr Row tableRow(std::index_sequence<kOps...> /*operators*/) {
-  return {Pair{blendWith<kFormat, kOps, false>, blendWith<kFormat, kOps, true>}..., Pair{}, Pair{}};
-}
-template <size_t... kIndex>
-constexpr std::array<Row, sizeof...(kIndex)> tableOf(std::index_sequence<kIndex...> /*formats*/) {
-  return {tableRow<kIndex>(std::make_index_sequence<RASTER_BLEND_COUNT>())...};
-}
-constexpr auto kTable = tableOf(std::make_index_sequence<std::size(kFormats)>());
-
-/// Deliberate: bits per pixel decide for depth 24 only.
-const Row& rowFor(uint32 depth, uint32 bpp) {
-  if (depth == 6) return kTable[0];
-  if (depth == 8) return kTable[1];
-  if (depth == 15) return kTable[2];
-  if (depth == 16) return kTable[3];
-  if (depth == 24 && bpp == 24) return kTable[4];
-  if (depth == 24 && bpp == 32) return kTable[5];
-  assertFailed({kSource, kBadFormatLine}, kBadFormatBug);
-}
-
 }  // namespace
 
-void alphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src,
-                uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
-                uint32 depth, uint32 bpp, uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
-                uint8 staged) {
-  const Pair& pair = rowFor(depth, bpp)[op];
-  (staged != 0 ? pair.staged : pair.inPlace)({dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch,
-                                              width, height, flags, srcAlpha, dstAlpha});
+void alphaBlend(const BlendCall& call) {
+  const Format& format = formatFor(call.depth, call.bpp);
+  if (call.width == 0 || call.height == 0) return;
+  const BlendRect rect = rowsOf(call, format.bytes);
+  const BlendKernel& kernel = kernelFor(format.kernels(), call.op, rect);
+  (call.staged ? blendStaged : blendInPlace)(rect, format.bytes, kernel);
 }
 
 }  // namespace raster
+
+using raster::pitchOf;
 
 extern "C" {
 
@@ -259,15 +217,30 @@ void Raster_AlphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, co
                        uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
                        uint32 depth, uint32 bpp, uint32 op, uint32 flags, uint32 srcAlpha,
                        uint32 dstAlpha, uint8 staged) {
-  raster::alphaBlend(dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch, width, height, depth,
-                     bpp, op, flags, srcAlpha, dstAlpha, staged);
+  raster::alphaBlend({.dst = {dst, pitchOf(dstPitch), dstX, dstY},
+                      .src = {src, pitchOf(srcPitch), srcX, srcY},
+                      .width = width,
+                      .height = height,
+                      .depth = depth,
+                      .bpp = bpp,
+                      .op = op,
+                      .flags = flags,
+                      .srcAlpha = srcAlpha,
+                      .dstAlpha = dstAlpha,
+                      .staged = staged != 0});
 }
 
 void Raster_AlphaBlendOver(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src,
                            uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
                            uint32 depth, uint32 bpp, uint8 staged) {
-  raster::alphaBlend(dst, dstX, dstY, dstPitch, src, srcX, srcY, srcPitch, width, height, depth,
-                     bpp, RASTER_BLEND_OVER, 0, 0, 0, staged);
+  raster::alphaBlend({.dst = {dst, pitchOf(dstPitch), dstX, dstY},
+                      .src = {src, pitchOf(srcPitch), srcX, srcY},
+                      .width = width,
+                      .height = height,
+                      .depth = depth,
+                      .bpp = bpp,
+                      .op = RASTER_BLEND_OVER,
+                      .staged = staged != 0});
 }
 
 }  // extern "C"

@@ -77,25 +77,23 @@ Visible clip(int64 at, int64 size, int64 limit) {
   return v;
 }
 
-/// Where a cursor is drawn.
-struct Target {
-  uint8* bits;
-  uint32 pitch;
-  uint32 x, y;
-};
-
-void drawAlpha(const Target& to, const RasterFrameBufferDesc& fb, const RasterCursor& cursor,
+void drawAlpha(const Corner<uint8>& to, const RasterFrameBufferDesc& fb, const RasterCursor& cursor,
                const RasterCursorBox& box) {
-  alphaBlend(to.bits, to.x, to.y, to.pitch, cursor.pixels, static_cast<uint32>(box.srcX),
-             static_cast<uint32>(box.srcY), 4 * cursor.width, static_cast<uint32>(box.width),
-             static_cast<uint32>(box.height), fb.depth, fb.bpp, RASTER_BLEND_OVER, 0, 0, 0, 0);
+  alphaBlend({.dst = to,
+              .src = {cursor.pixels, pitchOf(4 * cursor.width), static_cast<uint32>(box.srcX),
+                      static_cast<uint32>(box.srcY)},
+              .width = static_cast<uint32>(box.width),
+              .height = static_cast<uint32>(box.height),
+              .depth = fb.depth,
+              .bpp = fb.bpp,
+              .op = RASTER_BLEND_OVER});
 }
 
-void drawMask(const Target& to, uint32 bytesPerPixel, const RasterCursor& cursor,
+void drawMask(const Corner<uint8>& to, uint32 bytesPerPixel, const RasterCursor& cursor,
               const RasterCursorBox& box) {
   const auto pitch = static_cast<int32>(cursor.width * bytesPerPixel);
   const auto combine = [&](const uint8* plane, uint32 rop) {
-    rectRopCopy(to.bits, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
+    rectRopCopy(to.base, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
                 static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x, to.y,
                 static_cast<uint32>(box.width), static_cast<uint32>(box.height));
   };
@@ -145,12 +143,12 @@ void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb, uint8* sa
   const uint32 bytesPerPixel = fb->bpp / 8;
   const auto x = static_cast<uint32>(box->x);
   const auto y = static_cast<uint32>(box->y);
-  raster::Target target = {fbBits, fb->pitch, x, y};
+  raster::Corner<uint8> target = {fbBits, raster::pitchOf(fb->pitch), x, y};
   if (saveBits != nullptr) {
     raster::rectCopy(saveBits, raster::pitchOf(savePitch), fbBits, raster::pitchOf(fb->pitch),
                      bytesPerPixel, x, y, 0, 0, static_cast<uint32>(box->width),
                      static_cast<uint32>(box->height));
-    target = {saveBits, savePitch, 0, 0};
+    target = {saveBits, raster::pitchOf(savePitch), 0, 0};
   }
   if (cursor->type == RASTER_CURSOR_ALPHA) {
     raster::drawAlpha(target, *fb, *cursor, *box);

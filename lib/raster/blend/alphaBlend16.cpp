@@ -12,29 +12,23 @@
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-const FormatKernels* kernels15() { return &kKernelsOf<Packed<Code15>>; }
-const FormatKernels* kernels16() { return &kKernelsOf<Packed<Code16>>; }
+namespace {
+
+constexpr FormatKernels kKernels[] = {kKernelsOf<Packed<Code15>>, kKernelsOf<Packed<Code16>>};
+
+}  // namespace
+
+const FormatKernels* kernels16() { return kKernels; }
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "vector/kernelChoice.h"
-
 namespace raster {
-namespace {
 
-HWY_EXPORT(kernels15);
 HWY_EXPORT(kernels16);
-
-const FormatKernels* lookUp15() { return HWY_DYNAMIC_DISPATCH(kernels15)(); }
-const FormatKernels* lookUp16() { return HWY_DYNAMIC_DISPATCH(kernels16)(); }
-
-}  // namespace
-
-const FormatKernels& blendKernels15() { return chosenKernels<lookUp15>(); }
-const FormatKernels& blendKernels16() { return chosenKernels<lookUp16>(); }
+const FormatKernels* lookUpBlend16() { return HWY_DYNAMIC_DISPATCH(kernels16)(); }
 
 }  // namespace raster
 

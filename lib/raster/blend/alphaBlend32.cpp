@@ -12,29 +12,23 @@
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-const FormatKernels* kernels24() { return &kKernelsOf<Bytes3>; }
-const FormatKernels* kernels32() { return &kKernelsOf<Bytes4>; }
+namespace {
+
+constexpr FormatKernels kKernels[] = {kKernelsOf<Bytes3>, kKernelsOf<Bytes4>};
+
+}  // namespace
+
+const FormatKernels* kernels32() { return kKernels; }
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "vector/kernelChoice.h"
-
 namespace raster {
-namespace {
 
-HWY_EXPORT(kernels24);
 HWY_EXPORT(kernels32);
-
-const FormatKernels* lookUp24() { return HWY_DYNAMIC_DISPATCH(kernels24)(); }
-const FormatKernels* lookUp32() { return HWY_DYNAMIC_DISPATCH(kernels32)(); }
-
-}  // namespace
-
-const FormatKernels& blendKernels24() { return chosenKernels<lookUp24>(); }
-const FormatKernels& blendKernels32() { return chosenKernels<lookUp32>(); }
+const FormatKernels* lookUpBlend32() { return HWY_DYNAMIC_DISPATCH(kernels32)(); }
 
 }  // namespace raster
 

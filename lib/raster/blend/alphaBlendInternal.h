@@ -36,19 +36,15 @@ struct BlendKernel {
   bool readsBlocks;  ///< reads the destination's rows as a block copy does: all bytes, by vectors
 };
 
-/// By the two flags.
+/// By operator, and by the two flags. The last two places are empty.
 using BlendVariants = std::array<BlendKernel, 4>;
+using FormatKernels = std::array<BlendVariants, 16>;
 
-/// By operator.
-using FormatKernels = std::array<BlendVariants, RASTER_BLEND_COUNT>;
-
-/// The kernels of the formats, for the processor.
-const FormatKernels& blendKernels6();
-const FormatKernels& blendKernels8();
-const FormatKernels& blendKernels15();
-const FormatKernels& blendKernels16();
-const FormatKernels& blendKernels24();
-const FormatKernels& blendKernels32();
+/// The kernels for this processor, each time of two formats: of depths 6 and 8, of depths 15 and
+/// 16, of pixels of three and of four bytes.
+const FormatKernels* lookUpBlend8();
+const FormatKernels* lookUpBlend16();
+const FormatKernels* lookUpBlend32();
 
 /// The block copies of the staged blends.
 struct StageKernels {
@@ -59,13 +55,21 @@ struct StageKernels {
   /// Rows of pixels of four bytes: touches byte 3 of none, or of all but the last one of a row.
   CopyRows copyColors;
 };
-const StageKernels& blendStageKernels();
+const StageKernels* lookUpBlendStage();
 
-/// As Raster_AlphaBlend.
-void alphaBlend(uint8* dst, uint32 dstX, uint32 dstY, uint32 dstPitch, const uint8* src,
-                uint32 srcX, uint32 srcY, uint32 srcPitch, uint32 width, uint32 height,
-                uint32 depth, uint32 bpp, uint32 op, uint32 flags, uint32 srcAlpha, uint32 dstAlpha,
-                uint8 staged);
+/// The arguments of Raster_AlphaBlend.
+struct BlendCall {
+  Corner<uint8> dst;
+  Corner<const uint8> src;
+  uint32 width, height;
+  uint32 depth, bpp;
+  uint32 op;
+  uint32 flags = 0;
+  uint32 srcAlpha = 0;
+  uint32 dstAlpha = 0;
+  bool staged = false;
+};
+void alphaBlend(const BlendCall& call);
 
 }  // namespace raster
 

@@ -28,28 +28,45 @@ constexpr bool dividesExactly() {
 static_assert(dividesExactly());
 
 /// A factor of 255 / 255, one of 0, and pixels that are 0: an opaque destination takes its terms
-/// out of the formulas.
+/// out of the formulas. What they do to pixels and factors is in blendOps-inl.h.
 struct One {};
 struct Zero {};
 struct Nothing {};
 
 constexpr Zero inv(One /*f*/) { return {}; }
+constexpr One inv(Zero /*f*/) { return {}; }
 constexpr Nothing alphaOf(Nothing /*p*/) { return {}; }
+constexpr Nothing mul(Nothing /*p*/, One /*f*/) { return {}; }
+constexpr Nothing mul(Nothing /*p*/, Zero /*f*/) { return {}; }
+constexpr Nothing add(Nothing /*a*/, Nothing /*b*/) { return {}; }
 
-/// What the terms of a formula are computed from: sets of inputs in place of the numbers.
+/// What a formula may read.
 inline constexpr uint32 kUsesSource = 1;
 inline constexpr uint32 kUsesDestination = 2;
 inline constexpr uint32 kUsesDstAlpha = 4;  // the constant
-template <uint32 kSet> struct UsesOf {};
 
-template <uint32 kA, uint32 kB> constexpr UsesOf<kA | kB> mul(UsesOf<kA> /*p*/, UsesOf<kB> /*f*/) {
+/// A formula as a type: letters for the inputs, and what is done with them. Operators whose
+/// formulas are the same type compute the same.
+template <char kLetter, uint32 kInputSet> struct Letter {
+  static constexpr uint32 kUses = kInputSet;
+};
+template <char kSign, class... Terms> struct Formula {
+  static constexpr uint32 kUses = (Terms::kUses | ...);
+};
+template <class Term>
+concept IsFormula = requires {
+  Term::kUses;
+};
+
+template <IsFormula P, IsFormula F> constexpr Formula<'*', P, F> mul(P /*p*/, F /*f*/) {
   return {};
 }
-template <uint32 kA, uint32 kB> constexpr UsesOf<kA | kB> add(UsesOf<kA> /*a*/, UsesOf<kB> /*b*/) {
+template <IsFormula A, IsFormula B> constexpr Formula<'+', A, B> add(A /*a*/, B /*b*/) {
   return {};
 }
-template <uint32 kSet> constexpr UsesOf<kSet> inv(UsesOf<kSet> f) { return f; }
-template <uint32 kSet> constexpr uint32 inputsOf(UsesOf<kSet> /*term*/) { return kSet; }
+template <IsFormula F> constexpr Formula<'-', F> inv(F /*f*/) { return {}; }
+
+template <IsFormula Term> constexpr uint32 inputsOf(Term /*term*/) { return Term::kUses; }
 constexpr uint32 inputsOf(Nothing /*term*/) { return 0; }
 
 }  // namespace raster

@@ -176,23 +176,22 @@ template <auto kOperator> constexpr uint32 effective(uint32 flags) {
   return flags;
 }
 
-template <class Format, auto kOperator, uint32 kFlags> constexpr BlendKernel kernelOf() {
-  return {blendRect<Format, kOperator, kFlags>,
-          HWY_TARGET != HWY_SCALAR && kReadsDestination<Format, kOperator, kFlags>};
+template <class Format, auto kOperator, uint32 kFlags>
+constexpr BlendKernel kKernel = {
+    blendRect<Format, kOperator, kFlags>,
+    HWY_TARGET != HWY_SCALAR&& kReadsDestination<Format, kOperator, kFlags>};
+
+/// The kernel of an operator onto a format: operators of the same formula share it.
+template <class Format, size_t kOp, uint32 kFlags> constexpr const BlendKernel& kernelOf() {
+  constexpr uint32 kEffective = effective<std::get<kOp>(kOperators)>(kFlags);
+  return kKernel<Format, std::get<firstLike<kEffective, kOp>()>(kOperators), kEffective>;
 }
 
-/// The kernels of an operator onto a format, by flags.
-template <class Format, auto kOperator> constexpr BlendVariants variantsOf() {
-  return {kernelOf<Format, kOperator, effective<kOperator>(0)>(),
-          kernelOf<Format, kOperator, effective<kOperator>(1)>(),
-          kernelOf<Format, kOperator, effective<kOperator>(2)>(),
-          kernelOf<Format, kOperator, effective<kOperator>(3)>()};
-}
-
-/// The kernels of a format, by operator.
+/// The kernels of a format, by operator and flags.
 template <class Format, size_t... kOps>
 constexpr FormatKernels kernelsOf(std::index_sequence<kOps...> /*operators*/) {
-  return {variantsOf<Format, std::get<kOps>(kOperators)>()...};
+  return {BlendVariants{kernelOf<Format, kOps, 0>(), kernelOf<Format, kOps, 1>(),
+                        kernelOf<Format, kOps, 2>(), kernelOf<Format, kOps, 3>()}...};
 }
 template <class Format>
 constexpr FormatKernels kKernelsOf =

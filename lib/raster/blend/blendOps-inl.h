@@ -2,8 +2,9 @@
 //
 // The fourteen compositing operators. Included once per instruction set.
 //
-// They know products, sums and complements only, so the same line serves vectors, single pixels,
-// every form that pixels come in and the question which inputs it needs.
+// They know sums of pixels, products of a pixel and a factor, and complements of factors only, in
+// any order. So the same line serves vectors, single pixels, every form that pixels come in, and
+// the questions which inputs it needs and which other operator computes the same.
 
 #include "blendArithmetic.h"
 
@@ -21,7 +22,9 @@ namespace raster::HWY_NAMESPACE {
 
 template <class P> HWY_INLINE constexpr P mul(P p, One /*f*/) { return p; }
 template <class P> HWY_INLINE constexpr Nothing mul(P /*p*/, Zero /*f*/) { return {}; }
+template <class F> HWY_INLINE constexpr Nothing mul(Nothing /*p*/, F /*f*/) { return {}; }
 template <class P> HWY_INLINE constexpr P add(P p, Nothing /*zero*/) { return p; }
+template <class P> HWY_INLINE constexpr P add(Nothing /*zero*/, P p) { return p; }
 
 namespace {
 
@@ -51,20 +54,37 @@ constexpr auto kOperators =
                     kOutReverse, kAtop, kAtopReverse, kXor, kAdd, kSaturate);
 static_assert(std::tuple_size_v<decltype(kOperators)> == RASTER_BLEND_COUNT);
 
-/// The inputs that an operator reads, with (RASTER_BLEND_USE_DST_ALPHA) or without a constant
-/// destination alpha.
+/// An operator's formula, with (RASTER_BLEND_USE_DST_ALPHA) or without a constant destination
+/// alpha.
 template <auto kOperator, uint32 kFlags>
-constexpr uint32 kInputs = [] {
+constexpr auto kFormula = [] {
   constexpr bool kConstant = (kFlags & RASTER_BLEND_USE_DST_ALPHA) != 0;
   struct {
     Nothing nothing;
-    UsesOf<kUsesSource> s, sa;
-    UsesOf<kUsesDestination> d;
-    std::conditional_t<kConstant, UsesOf<kUsesDstAlpha>, One> da;
-    std::conditional_t<kConstant, UsesOf<kUsesDstAlpha>, Zero> f;
+    Letter<'s', kUsesSource> s;
+    Letter<'a', kUsesSource> sa;
+    Letter<'d', kUsesDestination> d;
+    std::conditional_t<kConstant, Letter<'A', kUsesDstAlpha>, One> da;
+    std::conditional_t<kConstant, Letter<'f', kUsesDstAlpha>, Zero> f;
   } c;
-  return inputsOf(kOperator(c));
+  return kOperator(c);
 }();
+
+/// The inputs that it reads.
+template <auto kOperator, uint32 kFlags>
+constexpr uint32 kInputs = inputsOf(kFormula<kOperator, kFlags>);
+
+/// The number of the first operator that has the same formula.
+template <uint32 kFlags, size_t kOp, size_t kFirst = 0> constexpr size_t firstLike() {
+  if constexpr (std::is_same_v<decltype(kFormula<std::get<kFirst>(kOperators), kFlags>),
+                               decltype(kFormula<std::get<kOp>(kOperators), kFlags>)>) {
+    return kFirst;
+  } else {
+    return firstLike<kFlags, kOp, kFirst + 1>();
+  }
+}
+static_assert(firstLike<0, RASTER_BLEND_ATOP>() == RASTER_BLEND_OVER);
+static_assert(firstLike<RASTER_BLEND_USE_DST_ALPHA, RASTER_BLEND_ATOP>() == RASTER_BLEND_ATOP);
 
 }  // namespace
 

@@ -102,18 +102,10 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "vector/kernelChoice.h"
-
 namespace raster {
-namespace {
 
 HWY_EXPORT(stageKernels);
-
-const StageKernels* lookUp() { return HWY_DYNAMIC_DISPATCH(stageKernels)(); }
-
-}  // namespace
-
-const StageKernels& blendStageKernels() { return chosenKernels<lookUp>(); }
+const StageKernels* lookUpBlendStage() { return HWY_DYNAMIC_DISPATCH(stageKernels)(); }
 
 }  // namespace raster
 

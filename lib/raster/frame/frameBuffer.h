@@ -32,6 +32,15 @@ template <class Byte> inline Byte* nextRow(Byte* row, intptr_t step) {
 inline intptr_t pitchOf(uint32 pitch) { return static_cast<intptr_t>(uintptr_t{pitch}); }
 inline intptr_t pitchOf(int32 pitch) { return pitch; }
 
+/// A pixel of a frame buffer, where a rectangle begins.
+template <class Byte> struct Corner {
+  Byte* base;
+  intptr_t pitch;
+  uint32 x, y;
+
+  Byte* pixel(size_t bytesPerPixel) const { return rowAt(base, pitch, y, x, bytesPerPixel); }
+};
+
 /// Deliberate: rows of 2- and 4-byte pixels step by whole pixels, so a pitch that is not a multiple
 /// of the pixel size is rounded down (toward minus infinity) for the steps, while the first row is
 /// found with the full pitch.
