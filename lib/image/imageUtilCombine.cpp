@@ -69,8 +69,8 @@ void placeConverted(const ImageUtilImage& image, uint32 bppDepth, const Place& p
 }
 
 void placeCopied(const ImageUtilImage& image, const Place& p, const ImageUtilImage& result) {
-  rectCopy(result.data, pitchOf(result.bytesPerLine), image.data, pitchOf(image.bytesPerLine),
-           result.bpp / 8, 0, 0, p.x, p.y, p.width, p.height);
+  rectCopy({result.data, pitchOf(result.bytesPerLine), p.x, p.y},
+           {image.data, pitchOf(image.bytesPerLine), 0, 0}, result.bpp / 8, p.width, p.height);
 }
 
 /// Makes the result's record and its pixels, all zero. False when there is no memory for them.

@@ -27,8 +27,6 @@ static_assert(sizeof(RasterFrameBufferDesc) == 20 && sizeof(RasterCursorBox) == 
 
 constexpr uint32 kTooLarge = 0xFFFFFFFF;
 
-// The raster operations that draw a mask cursor.
-
 /// The bytes of a plane, or kTooLarge when a step on the way does not fit 32 bits.
 uint32 planeSize(uint32 width, uint32 height, uint32 bitsPerPixel) {
   uint32 bits = 0;
@@ -54,7 +52,7 @@ void takePlane(uint32 width, uint32 height, uint32 depth, const uint8* plane, ui
   if (depth == 1) {
     expandBitPlane(width, height, bitsPerPixel, plane, dst, size);
   } else if (depth == bitsPerPixel) {
-    if (size != 0) rectCopy(dst, 0, plane, 0, 1, 0, 0, 0, 0, size, 1);  // else it may be null
+    if (size != 0) copyRows({dst, 0, plane, 0, size, 1});  // else it may be null
   } else {
     notImplemented(kSource);
   }
@@ -91,11 +89,14 @@ void drawAlpha(const Corner<uint8>& to, const RasterFrameBufferDesc& fb, const R
 
 void drawMask(const Corner<uint8>& to, uint32 bytesPerPixel, const RasterCursor& cursor,
               const RasterCursorBox& box) {
+  // The pitches of raster operations have a sign.
+  const Corner<uint8> dst = {to.base, static_cast<int32>(to.pitch), to.x, to.y};
   const auto pitch = static_cast<int32>(cursor.width * bytesPerPixel);
   const auto combine = [&](const uint8* plane, uint32 rop) {
-    rectRopCopy(to.base, static_cast<int32>(to.pitch), plane, pitch, bytesPerPixel,
-                static_cast<uint32>(box.srcX), static_cast<uint32>(box.srcY), rop, to.x, to.y,
-                static_cast<uint32>(box.width), static_cast<uint32>(box.height));
+    const Corner<const uint8> src = {plane, pitch, static_cast<uint32>(box.srcX),
+                                     static_cast<uint32>(box.srcY)};
+    rectRopCopy(dst, src, bytesPerPixel, rop, static_cast<uint32>(box.width),
+                static_cast<uint32>(box.height));
   };
   combine(cursor.andMask, RASTER_ROP_AND);
   combine(cursor.xorMask, RASTER_ROP_XOR);
@@ -143,12 +144,12 @@ void Raster_DrawCursor(uint8* fbBits, const RasterFrameBufferDesc* fb, uint8* sa
   const uint32 bytesPerPixel = fb->bpp / 8;
   const auto x = static_cast<uint32>(box->x);
   const auto y = static_cast<uint32>(box->y);
+  const raster::Corner<const uint8> below = {fbBits, raster::pitchOf(fb->pitch), x, y};
   raster::Corner<uint8> target = {fbBits, raster::pitchOf(fb->pitch), x, y};
   if (saveBits != nullptr) {
-    raster::rectCopy(saveBits, raster::pitchOf(savePitch), fbBits, raster::pitchOf(fb->pitch),
-                     bytesPerPixel, x, y, 0, 0, static_cast<uint32>(box->width),
-                     static_cast<uint32>(box->height));
     target = {saveBits, raster::pitchOf(savePitch), 0, 0};
+    raster::rectCopy(target, below, bytesPerPixel, static_cast<uint32>(box->width),
+                     static_cast<uint32>(box->height));
   }
   if (cursor->type == RASTER_CURSOR_ALPHA) {
     raster::drawAlpha(target, *fb, *cursor, *box);

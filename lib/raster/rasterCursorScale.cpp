@@ -78,8 +78,8 @@ void RasterScaleCursorPlane(uint8* dst, const uint8* plane, uint32 width, uint32
   auto* padded = static_cast<uint8*>(UtilSafeMalloc0(bytes));
   memset(padded, fill, bytes);
   if (fitsPadded(width, height, to))
-    rectCopy(padded, pitchOf(pitch), plane, pitchOf(kBytesPerPixel * width), kBytesPerPixel, 0, 0,
-             marginOf(to.scaleX), marginOf(to.scaleY), width, height);
+    rectCopy({padded, pitchOf(pitch), marginOf(to.scaleX), marginOf(to.scaleY)},
+             {plane, pitchOf(kBytesPerPixel * width), 0, 0}, kBytesPerPixel, width, height);
   Rect all;
   Rect_SetFromXYWH(&all, 0, 0, static_cast<int32>(to.scaledWidth),
                    static_cast<int32>(to.scaledHeight));

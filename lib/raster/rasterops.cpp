@@ -213,17 +213,16 @@ void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uin
   kernels().fillRows(rows.joined(), repeatPixel(pixel, bytesPerPixel));
 }
 
-void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
-              uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+void rectCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
               uint32 width, uint32 height) {
   if (height == 0) return;
-  copyInOrder({.dst = rowAt(dst, dstPitch, dstY, dstX, bytesPerPixel),
-               .dstStep = dstPitch,
-               .src = rowAt(src, srcPitch, srcY, srcX, bytesPerPixel),
-               .srcStep = srcPitch,
+  copyInOrder({.dst = dst.pixel(bytesPerPixel),
+               .dstStep = dst.pitch,
+               .src = src.pixel(bytesPerPixel),
+               .srcStep = src.pitch,
                .bytes = size_t{width} * bytesPerPixel,
                .rows = height},
-              dstY > srcY);
+              dst.y > src.y);
 }
 
 }  // namespace raster
@@ -238,8 +237,9 @@ void Raster_RectFill(uint8* fb, uint32 pitch, uint32 bytesPerPixel, uint32 pixel
 void Raster_RectCopy(uint8* dst, uint32 dstPitch, const uint8* src, uint32 srcPitch,
                      uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
                      uint32 width, uint32 height) {
-  raster::rectCopy(dst, raster::pitchOf(dstPitch), src, raster::pitchOf(srcPitch), bytesPerPixel,
-                   srcX, srcY, dstX, dstY, width, height);
+  using namespace raster;
+  rectCopy({dst, pitchOf(dstPitch), dstX, dstY}, {src, pitchOf(srcPitch), srcX, srcY},
+           bytesPerPixel, width, height);
 }
 
 void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32 y, uint32 width,

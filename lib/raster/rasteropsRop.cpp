@@ -31,23 +31,32 @@ template <class Rop, Walk kWalk> void combineRowsInOrder(const RowPair& rows) {
                           HWY_ATTR { combineInOrder<Rop, kWalk>(dst, src, bytes); });
 }
 
+#if HWY_TARGET == HWY_SCALAR
+
 /// For rows that do not overlap.
 template <class Rop, Walk kWalk> void combineRows(const RowPair& rows) {
-#if HWY_TARGET == HWY_SCALAR
   combineRowsInOrder<Rop, kWalk>(rows);
-#else
-  const CombinedAt<Rop> combinedAt;
-  const size_t bytes = rows.bytes;
-  if (bytes > 2 * kLanes<Bytes>) {
-    forRowsInStep(rows, [&](uint8* dst, const uint8* src)
-                            HWY_ATTR { storeLongRow<kWalk>(dst, src, bytes, combinedAt); });
-  } else {
-    withShortRow(Bytes(), bytes, combinedAt, [&](auto row) HWY_ATTR {
-      forRowsInStep(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { row(dst, src, bytes); });
-    });
-  }
-#endif
 }
+
+#else
+
+/// Rows of at most two vectors are made as a whole before any of it is stored: they have no walk.
+template <class Rop> HWY_NOINLINE void combineShortRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  withShortRow(Bytes(), bytes, CombinedAt<Rop>(), [&](auto row) HWY_ATTR {
+    forRowsInStep(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { row(dst, src, bytes); });
+  });
+}
+
+template <class Rop, Walk kWalk> void combineRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  if (bytes <= 2 * kLanes<Bytes>) return combineShortRows<Rop>(rows);
+  const CombinedAt<Rop> combinedAt;
+  forRowsInStep(rows, [&](uint8* dst, const uint8* src)
+                          HWY_ATTR { storeLongRow<kWalk>(dst, src, bytes, combinedAt); });
+}
+
+#endif
 
 #if HWY_TARGET == HWY_SCALAR
 
@@ -109,13 +118,19 @@ void fillRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) 
 
 #endif
 
+// Nobody asks for Noop; and what does not read the source neither overlaps it nor has a walk.
+template <class Rop> constexpr bool kIsAskedFor = kTruthTable<Rop> != kRopNoop;
 template <Walk kWalk>
 constexpr auto kRows = ropTable([](auto rop) -> RopRowsKernel {
-  return combineRows<decltype(rop), kWalk>;
+  using Rop = decltype(rop);
+  if constexpr (kIsAskedFor<Rop>)
+    return combineRows < Rop, kReadsSrc<Rop> ? kWalk : Walk::kToRight > ;
+  return nullptr;
 });
 template <Walk kWalk>
 constexpr auto kRowsInOrder = ropTable([](auto rop) -> RopRowsKernel {
-  return combineRowsInOrder<decltype(rop), kWalk>;
+  if constexpr (kReadsSrc<decltype(rop)>) return combineRowsInOrder<decltype(rop), kWalk>;
+  return nullptr;
 });
 constexpr RopKernels kKernels = {
     kLanes<Bytes>,
@@ -215,8 +230,8 @@ KeepAndFlip withConstant(uint32 rop, uint32 pixel) {
   return {ofZeros ^ ofOnes, ofZeros};
 }
 
-/// The pitch of rows that are walked upwards.
-int32 negated(int32 pitch) { return static_cast<int32>(0 - static_cast<uint32>(pitch)); }
+/// The pitch of rows that are walked upwards: a number of 32 bits, as the given one is.
+int32 negated(intptr_t pitch) { return static_cast<int32>(0 - static_cast<uint32>(pitch)); }
 
 }  // namespace
 
@@ -231,31 +246,26 @@ void ropRows(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk) {
   kernel[rop](rows);
 }
 
-void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,
-                 uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                 uint32 height) {
-  if (rop == kRopCopy) {
-    rectCopy(dst, pitchOf(dstPitch), src, pitchOf(srcPitch), bytesPerPixel, srcX, srcY, dstX, dstY,
-             width, height);
-    return;
-  }
+void rectRopCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
+                 uint32 rop, uint32 width, uint32 height) {
+  if (rop == kRopCopy) return rectCopy(dst, src, bytesPerPixel, width, height);
   const bool unsupported = bytesPerPixel < 1 || bytesPerPixel > 4;
   // Two calls, as each walk has a line of its own in the message.
   Walk walk = Walk::kToRight;
-  if (srcY == dstY && dstX > srcX) {
+  if (src.y == dst.y && dst.x > src.x) {
     if (unsupported) unsupportedPixelSize(kSource);
     walk = Walk::kToLeft;
   } else if (unsupported) {
     unsupportedPixelSize(kSource);
   }
   if (rop >= kRopCount || rop == kRopNoop) return;
-  const bool bottomUp = srcY < dstY;
+  const bool bottomUp = src.y < dst.y;
   const uint32 firstRow = bottomUp ? height - 1 : 0;
-  const int32 dstWalked = bottomUp ? negated(dstPitch) : dstPitch;
-  const int32 srcWalked = bottomUp ? negated(srcPitch) : srcPitch;
-  ropRows({.dst = rowAt(dst, pitchOf(dstPitch), dstY + firstRow, dstX, bytesPerPixel),
+  const intptr_t dstWalked = bottomUp ? negated(dst.pitch) : dst.pitch;
+  const intptr_t srcWalked = bottomUp ? negated(src.pitch) : src.pitch;
+  ropRows({.dst = rowAt(dst.base, dst.pitch, dst.y + firstRow, dst.x, bytesPerPixel),
            .dstStep = rowStep(dstWalked, bytesPerPixel),
-           .src = rowAt(src, pitchOf(srcPitch), srcY + firstRow, srcX, bytesPerPixel),
+           .src = rowAt(src.base, src.pitch, src.y + firstRow, src.x, bytesPerPixel),
            .srcStep = rowStep(srcWalked, bytesPerPixel),
            .bytes = size_t{width} * bytesPerPixel,
            .rows = height},
@@ -290,8 +300,9 @@ void Raster_RectROPfill(uint8* fb, int32 pitch, uint32 bytesPerPixel, uint32 pix
 void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch,
                         uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX,
                         uint32 dstY, uint32 width, uint32 height) {
-  raster::rectRopCopy(dst, dstPitch, src, srcPitch, bytesPerPixel, srcX, srcY, rop, dstX, dstY,
-                      width, height);
+  using namespace raster;
+  rectRopCopy({dst, pitchOf(dstPitch), dstX, dstY}, {src, pitchOf(srcPitch), srcX, srcY},
+              bytesPerPixel, rop, width, height);
 }
 
 }  // extern "C"

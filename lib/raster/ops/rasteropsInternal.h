@@ -25,8 +25,7 @@ void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uin
               uint32 width, uint32 height);
 
 /// As Raster_RectCopy.
-void rectCopy(uint8* dst, intptr_t dstPitch, const uint8* src, intptr_t srcPitch,
-              uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
+void rectCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
               uint32 width, uint32 height);
 
 }  // namespace raster

@@ -46,9 +46,8 @@ struct RopKernels {
 void ropRows(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk);
 
 /// As Raster_RectROPcopy.
-void rectRopCopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcPitch, uint32 bytesPerPixel,
-                 uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX, uint32 dstY, uint32 width,
-                 uint32 height);
+void rectRopCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
+                 uint32 rop, uint32 width, uint32 height);
 
 }  // namespace raster
 

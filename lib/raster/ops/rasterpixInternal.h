@@ -24,14 +24,14 @@ struct TileRows {
   size_t phase;
 };
 
-/// What the kernels of one instruction-set level offer.
+/// What the kernels of one instruction-set level offer, for operations that read the source. The
+/// order of the pixels must not matter.
 struct TileKernels {
-  /// By operation. The order of the pixels must not matter.
+  /// For any pixmap, straight from its rows; by operation.
   using Tile = void (*)(const TileRows& rows);
-  /// For any pixmap, straight from its rows.
   const Tile* tile;
   /// For pixmap rows of less than 1024 bytes, which are first repeated in a buffer.
-  const Tile* tileWidened;
+  void (*tileWidened)(const TileRows& rows, uint32 rop);
 };
 
 }  // namespace raster
