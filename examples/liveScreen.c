@@ -57,7 +57,8 @@ static void closeScreen(Screen* screen) {
   xcb_disconnect(screen->connection);
 }
 
-// From here on the server sends an event for every rectangle that is drawn.
+// From here on the server sends an event for every rectangle that is drawn, and first one for the
+// whole screen.
 static void watchDamage(const Screen* screen) {
   free(xcb_damage_query_version_reply(screen->connection,
                                       xcb_damage_query_version(screen->connection, 1, 1), NULL));
@@ -137,14 +138,12 @@ int main(int argc, char** argv) {
     return kSkipped;
   }
   watchDamage(&screen);
-  RectList damage;
-  Raster_ClearRectList(&damage);
-  Raster_AddRect(&damage, 0, 0, (int32)screen.width, (int32)screen.height);
   bool isThere = true;
   for (long left = argc > 1 ? strtol(argv[1], NULL, 10) : 10; isThere && left > 0; --left) {
-    update(&screen, &damage);
+    RectList damage;
     Raster_ClearRectList(&damage);
-    isThere = left == 1 || collectDamage(&screen, &damage);
+    isThere = collectDamage(&screen, &damage);
+    if (isThere) update(&screen, &damage);
   }
   closeScreen(&screen);
   return isThere ? 0 : 1;
