@@ -7,11 +7,11 @@
 
 int main(int argc, char** argv) {
   constexpr bench::Extent kSizes[] = {{0, 0}, {1, 1}, {4, 4}, {16, 16}};
-  const bench::Library linked(nullptr);
+  const bench::Library library("libraster.so.1");
   for (const bench::Work& work : bench::works()) {
     for (const bench::Extent e : kSizes) {
       bench::Contenders contenders("call/" + work.name, e, 1);
-      contenders.add("raster", work.make(linked, e));
+      contenders.add("raster", work.make(library, e));
     }
   }
   return bench::run(argc, argv);

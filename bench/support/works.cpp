@@ -100,12 +100,10 @@ Call video(const Library& library, Extent e) {
 
 }  // namespace
 
-Library::Library(const char* path)
-    : handle_(path == nullptr ? RTLD_DEFAULT : dlopen(path, RTLD_NOW | RTLD_LOCAL)) {
-  if (path != nullptr && handle_ == nullptr) {
-    fprintf(stderr, "%s\n", dlerror());
-    exit(2);
-  }
+Library::Library(const char* path) : handle_(dlopen(path, RTLD_NOW | RTLD_LOCAL)) {
+  if (handle_ != nullptr) return;
+  fprintf(stderr, "%s\n", dlerror());
+  exit(2);
 }
 
 void* Library::address(const char* name) const {

@@ -17,8 +17,8 @@ namespace bench {
 /// The functions that the works call.
 class Library {
  public:
-  /// Loads the file, or with null takes the library that the program is linked with. Ends the
-  /// program when something is missing.
+  /// Loads a file, or what the program would be linked with when there is no slash in the name.
+  /// Ends the program when something is missing.
   explicit Library(const char* path);
 
   template <class Function> Function* find(const char* name) const {
