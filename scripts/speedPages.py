@@ -1,0 +1,259 @@
+# SPDX-License-Identifier: MIT
+"""Writes what README and docs/speed.md say in figures, and a page for each level, from the data.
+
+In README and docs/speed.md only what stands between "<!-- speed: NAME -->" and "<!-- end -->" is
+replaced; the rest is written by hand.
+"""
+import re
+import statistics
+
+from speedData import DATA, FAMILIES, LEVEL_WITH, ROOT, SIZES, read
+
+DETAIL = {"avx3": "AVX-512", "avx2": "AVX2", "sse4": "SSE4"}
+# The jobs of README, the same ones whatever they give.
+SHOWN = {
+    "convert/32-to-16": "32 bits to 5-6-5",
+    "blend/over-32": "blending, \"over\", on 32 bits",
+    "blend/over-16": "blending, \"over\", onto 5-6-5",
+    "scale/bilinear-32-x1.5": "enlarging smoothly by 1.5",
+    "yuv/YUY2-to-32": "video, YUY2 to 32 bits",
+}
+
+NOT_MEASURED = "Not measured in this run."
+
+facts, rows = read()
+levels = [name for name in DETAIL if any(key[0] == name for key in rows)]
+best = levels[0]
+
+
+def number(value):
+    """Three digits are seen in the rounds."""
+    return f"{float(f'{value:.3g}'):,.10g}" if value else "-"
+
+
+def ratio(value):
+    return f"{value:.2f}" if value is not None else "-"
+
+
+def table(head, body, right=0):
+    """The columns from `right` on are numbers."""
+    if not body:
+        return NOT_MEASURED
+    rule = ["---" if at < right else "---:" for at in range(len(head))]
+    return "\n".join("| " + " | ".join(line) + " |" for line in [head, rule, *body])
+
+
+def of(level, bits=64):
+    """The rows that count: those of a family."""
+    return [row for row in rows.values() if row.level == level and row.bits == bits and row.family()]
+
+
+def with_peer(level):
+    return [row for row in of(level) if row.of_peer() is not None]
+
+
+def not_behind(level):
+    return [row for row in with_peer(level) if row.of_peer() >= LEVEL_WITH]
+
+
+def reasons():
+    """The lines of docs/speed/reasons.txt: by level or *, job, size or *, the words."""
+    known = {}
+    for line in (DATA.parent / "reasons.txt").read_text(encoding="utf-8").splitlines():
+        if line and not line.startswith("#"):
+            where, words = line.split(": ", 1)
+            known[tuple(where.split())] = words
+    return known
+
+
+def reason(behind, known):
+    """The words for a job at a size that is behind at some levels."""
+    found = {}
+    for row in behind:
+        words = next((known[level, row.job, size] for level in (row.level, "*") for size in (row.size, "*")
+                      if (level, row.job, size) in known), None)
+        if words:
+            found.setdefault(words, []).append(row.level)
+    return "; ".join(words if len(at) == len(behind) else f"{', '.join(at)}: {words}"
+                     for words, at in found.items()) or "not profiled"
+
+
+def machine():
+    return table(["what was measured on", ""], list(facts.items()), 2)
+
+
+def summary():
+    body = []
+    for level in levels:
+        ratios = [row.of_peer() for row in with_peer(level)]
+        body.append([f"[{level}](speed/{level}.md)", str(len(ratios)),
+                     str(sum(r > 1 / LEVEL_WITH for r in ratios)),
+                     str(sum(LEVEL_WITH <= r <= 1 / LEVEL_WITH for r in ratios)),
+                     str(sum(r < LEVEL_WITH for r in ratios)), ratio(statistics.median(ratios))])
+    return table(["level", "rows with a peer", "ahead", "level (3 %)", "behind", "median ratio"], body, 1)
+
+
+def lost():
+    behind = {}
+    for level in levels:
+        for row in with_peer(level):
+            if row.of_peer() < LEVEL_WITH:
+                behind.setdefault((row.job, row.size), {})[level] = row
+    known = reasons()
+    worst = lambda item: min(row.of_peer() for row in item[1].values())
+    body = [[job, size, *(f"{ratio(at[level].of_peer())} {at[level].peer()}" if level in at else "" for level in levels),
+             reason(at.values(), known)] for (job, size), at in sorted(behind.items(), key=worst)]
+    return table(["job", "size", *levels, "why"], body, 3 + len(levels)) if body else "None."
+
+
+def picture(name, words):
+    return f"""<picture>
+  <source media="(prefers-color-scheme: dark)" srcset="images/{name}-dark.svg">
+  <img src="images/{name}-light.svg" alt="{words}">
+</picture>"""
+
+
+def families():
+    return picture("speed-families", "Bars by family and size: the rates of this library and of the fastest "
+                   "public library as parts of the limit")
+
+
+def growth():
+    if not any(key[2].startswith("growth/") for key in rows):
+        return NOT_MEASURED
+    return (picture("speed-growth", "Twelve small charts: the rate over the side of a square, of this library, "
+                    "the fastest public library and the limit")
+            + "\n\nSingle rows and single columns:\n\n"
+            + picture("speed-lines", "Twelve small charts: the rate over the length of a single row and of a "
+                      "single column"))
+
+
+def calls():
+    sizes = ["0x0", "1x1", "4x4", "16x16"]
+    jobs = dict.fromkeys(row.job for row in rows.values() if row.job.startswith("call/"))
+    time = lambda job, size, bits: rows.get((best, bits, job, size))
+    cell = lambda row: f"{row.ours:.0f}" if row else "-"
+    body = [[job[5:]] + [f"{cell(time(job, s, 64))} / {cell(time(job, s, 32))}" for s in sizes]
+            for job in jobs]
+    return table(["call", "empty", *sizes[1:]], body, 1)
+
+
+def scalar():
+    body = [[row.job[6:], row.size, number(row.rate(row.ours)), ratio(row.of_limit()),
+             ratio(row.of_peer())] for row in of("scalar") if row.peers]
+    if not body:
+        return NOT_MEASURED
+    worst = [line for line in body if float(line[4]) < LEVEL_WITH]
+    ahead = f"{len(body) - len(worst)} of {len(body)} rows are ahead of or level with pixman's portable code."
+    return ahead + ("\n\n" + table(["blend", "size", "Mpx/s", "of limit", "of pixman"], worst, 2) if worst else "")
+
+
+def narrow():
+    """The 32-bit build beside the 64-bit one."""
+    body = []
+    for level in levels:
+        wide = {(row.job, row.size): row for row in of(level)}
+        pairs = [(wide[row.job, row.size].ours / row.ours, row) for row in of(level, 32)
+                 if row.ours and wide.get((row.job, row.size)) and wide[row.job, row.size].ours]
+        if not pairs:
+            continue
+        low = [pair for pair in pairs if pair[0] < .8]
+        body.append([level, str(len(pairs)), ratio(statistics.median(p[0] for p in pairs)), str(len(low)),
+                     str(sum(row.size not in ("16x16", "4x4") for _, row in low))])
+    return table(["level", "rows", "median of 32-bit / 64-bit", "below 0.8", "of these above 16x16"], body, 1)
+
+
+def checked():
+    """What the checks add to a call."""
+    sizes = ["4x4", "16x16", "64x64", "256x256"]
+    found = {(row.job[8:], row.size): row for row in rows.values()
+             if row.job.startswith("checked/") and (row.level, row.bits) == (best, 64)}
+    body = [[job] + [f"{found[job, s].ours - found[job, s].peers['exact']:+.0f} of {found[job, s].ours:.0f}"
+                     for s in sizes] for job in dict.fromkeys(job for job, _ in found)]
+    return table(["call", *sizes], body, 1)
+
+
+def readme():
+    count, total = len(not_behind(best)), len(with_peer(best))
+    body = []
+    for job, words in SHOWN.items():
+        row = rows.get((best, 64, job, "1920x1080"))
+        if row:
+            body.append([words, number(row.rate(row.ours)), ratio(row.of_limit()), row.peer().split("~")[0],
+                         ratio(row.of_peer())])
+    head = ["a frame of 1920x1080", "million pixels/s", "of memcpy", "fastest public library", "times its rate"]
+    sizes = [size for size in SIZES if any(row.size == size for row in with_peer(best))]
+    return (f"**{count} of {total} jobs ahead of or level with the fastest public library** that does the "
+            f"same\nwork, in sizes from {sizes[-1]} to {sizes[0]}, on one core of: {facts['processor']}.\n\n"
+            + table(head, body, 1))
+
+
+def cell(row, bits):
+    if row is None or not row.ours:
+        return "-"
+    words = [number(row.rate(row.ours)), ratio(row.of_limit())]
+    if bits == 64:
+        words.append(f"{ratio(row.of_peer())} {row.peer()}" if row.peers else "-")
+    else:
+        wide = rows.get((row.level, 64, row.job, row.size))
+        words.append(ratio(wide.ours / row.ours if wide else None))
+    return " · ".join(words)
+
+
+def family_tables(level, bits):
+    text = []
+    for family in FAMILIES:
+        mine = [row for row in of(level, bits) if row.family() == family]
+        usual = dict.fromkeys(row.job for row in mine if row.size in SIZES)
+        other = [row for row in mine if row.job not in usual]
+        sizes = [size for size in SIZES if any(row.size == size for row in mine)]
+        body = [[job] + [cell(rows.get((level, bits, job, size)), bits) for size in sizes] for job in usual]
+        if body:
+            text.append(f"### {family}\n\n" + table(["job", *sizes], body, 1))
+        if other:
+            title = "" if body else f"### {family}\n\n"
+            text.append(title + table(["job", "of its own size"], [[r.job, cell(r, bits)] for r in other], 1))
+    return "\n\n".join(text)
+
+
+def level_page(level):
+    return f"""# Speed at level {level} ({DETAIL[level]})
+
+Made by `scripts/speed`. [The page about speed](../speed.md) says what was measured on, what the marks after
+a peer's name mean, and how the peers are held to this level. Rates are in million pixels a second (lists of
+rectangles: million calls).
+
+## 64-bit
+
+A cell: rate · of the limit · of the best peer, and who that is.
+
+{family_tables(level, 64)}
+
+## 32-bit
+
+A cell: rate · of the limit · of the 64-bit rate.
+
+{family_tables(level, 32)}
+"""
+
+
+def replace(path, parts):
+    text = path.read_text(encoding="utf-8")
+    for name, make in parts.items():
+        pattern = re.compile(rf"(<!-- speed: {name} -->\n).*?(\n?<!-- end -->)", re.DOTALL)
+        text, count = pattern.subn(lambda found: f"{found[1]}{make()}\n<!-- end -->", text)
+        if count != 1:
+            raise SystemExit(f"{path}: {count} places for {name}")
+    path.write_text(text, encoding="utf-8")
+
+
+replace(ROOT / "README.md", {"figures": readme})
+replace(ROOT / "docs/speed.md", {
+    "machine": machine, "summary": summary, "families": families, "lost": lost, "growth": growth,
+    "calls": calls, "checked": checked, "scalar": scalar, "narrow": narrow})
+for page in DETAIL:
+    file = DATA.parent / f"{page}.md"
+    if page in levels:
+        file.write_text(level_page(page), encoding="utf-8")
+    else:
+        file.unlink(missing_ok=True)
