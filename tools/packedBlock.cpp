@@ -6,10 +6,11 @@
 #include <cstring>
 #include <memory>
 
-#include "raster.h"
-
 namespace tool {
 namespace {
+
+constexpr uint64 kLargestPicture = uint64{1} << 30;
+constexpr uint32 kLargestSide = 1000000;
 
 /// Pixel units of the image, row padding included.
 uint64 unitsOf(const BlockHeader& header) {
@@ -60,8 +61,6 @@ uint64 BlockHeader::payload() const {
 }
 
 std::string headerFault(const BlockHeader& header) {
-  constexpr uint64 kLargestPicture = uint64{1} << 30;
-  constexpr uint32 kLargestSide = 1000000;
   const uint32 bpp = header.bpp;
   if (bpp != 8 && bpp != 16 && bpp != 24 && bpp != 32)
     return "it has " + std::to_string(bpp) + " bits per pixel";
@@ -85,22 +84,14 @@ std::string blockFault(const uint8* block, size_t size, BlockHeader& header) {
                           : storedFault(payloadSize, header);
 }
 
-void drawBlock(const uint8* block, const BlockHeader& header, uint8* to, uint32 toPitch) {
-  const auto copy = [&](const uint8* rows) {
-    Raster_RectCopy(to, toPitch, rows, header.pitch, header.bpp / 8, 0, 0, 0, 0, header.width,
-                    header.height);
-  };
-  // The library copies the pixels of a stored block over its caller's pointer, so they are taken
-  // from the block here.
-  if (!header.isCoded()) {
-    copy(block + sizeof header);
-    return;
-  }
-  uint8* pixels = nullptr;
-  uint32 pitch, bpp, width, height;
-  Raster_Decompress(block, &pixels, &pitch, &bpp, &width, &height);
-  const std::unique_ptr<uint8, decltype(&free)> owner(pixels, free);
-  copy(pixels);
+std::string drawBlock(const uint8* block, size_t size, const RasterView& to) {
+  constexpr RasterLimits kLimits = {kLargestSide, kLargestSide, kLargestPicture, UINT64_MAX, 0, 0};
+  RasterView pixels;
+  RasterStatus status = RasterChecked_Decompress(block, size, &kLimits, &pixels);
+  if (status != RASTER_STATUS_OK) return RasterChecked_Text(status);
+  const std::unique_ptr<uint8, decltype(&free)> owner(pixels.data, free);
+  status = RasterChecked_Copy(&to, nullptr, &pixels, 0, 0, 0);
+  return status != RASTER_STATUS_OK ? RasterChecked_Text(status) : "";
 }
 
 }  // namespace tool

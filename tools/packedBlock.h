@@ -7,7 +7,7 @@
 
 #include <string>
 
-#include "baseTypes.h"
+#include "rasterChecked.h"
 
 namespace tool {
 
@@ -30,8 +30,8 @@ std::string headerFault(const BlockHeader& header);
 /// Reads the header of a block and checks all of it: what is wrong, or nothing.
 std::string blockFault(const uint8* block, size_t size, BlockHeader& header);
 
-/// Unpacks a sound block into a frame buffer of its format.
-void drawBlock(const uint8* block, const BlockHeader& header, uint8* to, uint32 toPitch);
+/// Unpacks a block into a frame buffer of its format and size: what was wrong, or nothing.
+std::string drawBlock(const uint8* block, size_t size, const RasterView& to);
 
 }  // namespace tool
 

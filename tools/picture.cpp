@@ -13,6 +13,7 @@
 #include "dynBuf.h"
 #include "pngFile.h"
 #include "raster.h"
+#include "rasterChecked.h"
 #include "standardError.h"
 #include "standardOutput.h"
 
@@ -20,6 +21,10 @@ namespace tool {
 namespace {
 
 constexpr uint64 kLargestPicture = uint64{1} << 30;  // bytes
+constexpr uint32 kLargestSide = 1000000;
+/// What stands beside the pixels of a file is passed over and may be as much as the file holds.
+constexpr RasterLimits kPngLimits = {kLargestSide, kLargestSide, kLargestPicture,
+                                     UINT64_MAX,   UINT32_MAX,   UINT32_MAX};
 
 struct Storage {
   uint32 depth;
@@ -152,11 +157,14 @@ Picture Picture::decode(const PngFile& png, const std::string& name, bool keepAl
     return keepAlpha && png.hasAlpha() ? std::move(picture) : picture.convertedTo(24);
   }
   Picture picture;
-  CaughtStandardError messages;
-  const uint8 flags = keepAlpha ? IMAGE_UTIL_READ_KEEP_ALPHA : 0;
-  if (!ImageUtil_ReadPNGBuffer(&picture.record, png.bytes.data(),
-                               static_cast<uint32>(png.bytes.size()), flags))
-    throw Failure("cannot read the picture " + name + messages.remark());
+  char message[128];
+  const uint32 flags = keepAlpha ? uint32{RASTER_CHECKED_KEEP_ALPHA} : 0;
+  const RasterStatus status =
+      RasterChecked_ReadPngBuffer(png.bytes.data(), png.bytes.size(), flags, &kPngLimits,
+                                  &picture.record, message, sizeof message);
+  if (status != RASTER_STATUS_OK)
+    throw Failure("cannot read the picture " + name + " (" +
+                  (message[0] != 0 ? message : RasterChecked_Text(status)) + ")");
   return picture;
 }
 
@@ -184,6 +192,11 @@ uint32 Picture::code() const { return Raster_GetBPPDepth(record.depth, record.bp
 
 Rect Picture::bounds() const {
   return {0, 0, static_cast<int32>(width()), static_cast<int32>(height())};
+}
+
+RasterView Picture::view() const {
+  return {record.data, size_t{pitch()} * height(), pitch(), width(), height(), record.depth,
+          record.bpp};
 }
 
 FileType typeFromName(const std::string& path, FileType given) {

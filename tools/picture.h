@@ -9,6 +9,7 @@
 #include <string>
 
 #include "imageUtil.h"
+#include "rasterChecked.h"
 #include "rect.h"
 
 namespace tool {
@@ -44,6 +45,8 @@ class Picture {
   uint8* data() { return record.data; }  // NOLINT(readability-make-member-function-const)
   const uint8* data() const { return record.data; }
   Rect bounds() const;
+  /// Its memory, for the checked functions.
+  RasterView view() const;
 
   ImageUtilImage record = {};
 

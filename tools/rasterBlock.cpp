@@ -56,10 +56,11 @@ std::vector<uint8> readBlock(InputStream& input, std::vector<uint8> start) {
 
 Picture unpackBlock(const std::vector<uint8>& block) {
   BlockHeader header;
-  const std::string fault = blockFault(block.data(), block.size(), header);
+  std::string fault = blockFault(block.data(), block.size(), header);
   if (!fault.empty()) damaged(fault);
   Picture picture(header.width, header.height, header.bpp);
-  drawBlock(block.data(), header, picture.data(), picture.pitch());
+  fault = drawBlock(block.data(), block.size(), picture.view());
+  if (!fault.empty()) damaged(fault);
   return picture;
 }
 

@@ -12,6 +12,7 @@
 #include "commands.h"
 #include "names.h"
 #include "raster.h"
+#include "rasterChecked.h"
 
 namespace tool {
 namespace {
@@ -140,8 +141,12 @@ Picture decodeFrame(const VideoLayout& layout, const Size& size, const std::vect
   const Size whole = {even(size.width), layout.isPlanar ? even(size.height) : size.height};
   const uint32 rowBytes = whole.width * picture.bytesPerPixel();
   std::vector<uint8> rows(size_t{rowBytes} * whole.height);
-  Raster_YUVtoRGB(source.data(), rows.data(), whole.width, whole.height, layout.code,
-                  static_cast<int32>(code));
+  const RasterView view = {rows.data(),  rows.size(),          rowBytes,          whole.width,
+                           whole.height, picture.record.depth, picture.record.bpp};
+  const RasterStatus status =
+      RasterChecked_YuvToRgb(&view, source.data(), source.size(), layout.code);
+  if (status != RASTER_STATUS_OK)
+    throw Failure(std::string("cannot convert a frame: ") + RasterChecked_Text(status));
   if (code == 15) lowerFields(rows);
   Raster_RectCopy(picture.data(), picture.pitch(), rows.data(), rowBytes, picture.bytesPerPixel(),
                   0, 0, 0, 0, size.width, size.height);

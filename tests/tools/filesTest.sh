@@ -16,15 +16,18 @@ done
 { head -c $((size / 2)) a.png; printf 'X'; tail -c +$((size / 2 + 2)) a.png; } >bad.png
 refused 1 "cannot read the picture 'bad.png' (" convert bad.png no.png
 
-# A few bytes may promise any number of pixels: 3.6 GB are refused by their header; 720 MB are taken
-# for what they are, and where there is no memory for them that is one line, too.
+# A few bytes may promise any number of pixels: 3.6 GB are refused by their header; 720 MB since so few
+# bytes cannot hold them, before there is memory for them.
 printf '\211PNG\015\012\032\012\000\000\000\015IHDR\000\000\234@\000\000u0\010\002\000\000\000CtwW\000\000\000\010IDATx\234\003\000\000\000\000\001H\006\211\322\000\000\000\000IEND\256B\140\202' >huge.png
 refused 1 "'huge.png' is too large: 40000x30000 pixels" convert huge.png no.png
 printf '\211PNG\015\012\032\012\000\000\000\015IHDR\000\000N\040\000\000.\340\010\002\000\000\000\366L\203?\000\000\000\010IDATx\234\003\000\000\000\000\001H\006\211\322\000\000\000\000IEND\256B\140\202' >large.png
-refused 1 "cannot read the picture 'large.png' (" convert large.png no.png
+refused 1 "cannot read the picture 'large.png' (the data ends too early)" convert large.png no.png
+{ words 20000 10000 80000 32 3; words 1 1 199999998; } >large.rblk
 if (ulimit -v 400000 && "$TOOL" --version >/dev/null 2>&1); then
-  (ulimit -v 400000 && refused 1 'Out of memory: 720000000 bytes' convert large.png no.png && finish) ||
-    failures=$((failures + 1))
+  (ulimit -v 400000
+    refused 1 'the data ends too early' convert large.png no.png
+    refused 1 '20000x10000 pixels is too large' unpack large.rblk no.png
+    finish) || failures=$((failures + 1))
 else
   note 'not checked: a small address space, which this program cannot do with'
 fi

@@ -6,8 +6,8 @@
 #include <cstring>
 #include <memory>
 
-#include "raster.h"
 #include "packedBlock.h"
+#include "raster.h"
 
 namespace tool::live {
 namespace {
@@ -185,11 +185,13 @@ void RecordingReader::draw(const Part& part) {
     resize(widthOf(rect), heightOf(rect));
     return;
   }
-  BlockHeader header;
-  memcpy(&header, part.block, sizeof header);
-  uint8* to = pixels.data() + kPixelBytes * (size_t{width} * static_cast<uint32>(rect.top) +
-                                             static_cast<uint32>(rect.left));
-  drawBlock(part.block, header, to, kPixelBytes * width);
+  const size_t offset = kPixelBytes * (size_t{width} * static_cast<uint32>(rect.top) +
+                                       static_cast<uint32>(rect.left));
+  const RasterView to = {pixels.data() + offset, pixels.size() - offset, kPixelBytes * width,
+                         widthOf(rect),          heightOf(rect),         24,
+                         8 * kPixelBytes};
+  const std::string fault = drawBlock(part.block, part.blockBytes, to);
+  if (!fault.empty()) what = fault;
 }
 
 void RecordingReader::drawNext() {
