@@ -144,7 +144,7 @@ bool readImage(Reader& reader) {
   } else {
     readInterlacedRows(reader, passes);
   }
-  png_read_end(reader.png, nullptr);
+  png_read_end(reader.png, reader.info);  // with null it takes unknown critical chunks
   return true;
 }
 

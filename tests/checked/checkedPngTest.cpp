@@ -242,6 +242,32 @@ TEST(RasterChecked_ReadPngBuffer, TellsLibpngsWords) {
   free(image.data);
 }
 
+/// Puts a chunk in front of the first one of a name.
+Bytes withChunk(const Bytes& stream, const char* name, const Bytes& added) {
+  Bytes result = stream;
+  for (const tests::PngChunk& chunk : tests::chunksOf(stream)) {
+    if (chunk.name != name) continue;
+    result.insert(result.begin() + static_cast<ptrdiff_t>(chunk.offset) - 8, added.begin(),
+                  added.end());
+    break;
+  }
+  return result;
+}
+
+// A chunk whose name begins with a capital letter is one without which there is no picture.
+TEST(RasterChecked_ReadPngBuffer, RefusesUnknownChunksThatCount) {
+  const Bytes critical = {0, 0, 0, 0, 'I', 'E', 'N', 'T', 0xB3, 0xF5, 'p', 0xE6};
+  const Bytes other = {0, 0, 0, 0, 'i', 'e', 'N', 't', 0x10, 0xE4, 0xB9, 0xF0};
+  Random random(77);
+  for (const bool interlaced : {false, true}) {
+    const Bytes stream = makePng(somePicture(random, {PNG_COLOR_TYPE_RGB, 8}, 9, 9, interlaced));
+    for (const char* before : {"IDAT", "IEND"}) {
+      EXPECT_EQ(statusOf(withChunk(stream, before, critical)), RASTER_STATUS_DAMAGED) << before;
+      EXPECT_EQ(statusOf(withChunk(stream, before, other)), RASTER_STATUS_OK) << before;
+    }
+  }
+}
+
 TEST(RasterChecked_ReadPngBuffer, KeepsEveryLimit) {
   Random random(76);
   PngExtras extras;
