@@ -15,7 +15,7 @@
 #include "support/ownProcess.h"
 #include "support/random.h"
 // Not exported by the library, so this program has a copy of its own.
-#include "videoAttributes.cpp"  // NOLINT(bugprone-suspicious-include)
+#include "video/videoAttributes.cpp"  // NOLINT(bugprone-suspicious-include)
 
 namespace {
 
