@@ -15,6 +15,7 @@
 #include "blendBytes-inl.h"
 #include "blendPlanes-inl.h"
 #include "frame/frameBuffer.h"
+#include "vector/triples-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -200,28 +201,17 @@ struct Bytes4 : WholeBytes {
   }
 };
 
-/// Pixels of three bytes. Four of them are the twelve lower bytes of a block of sixteen.
+/// Pixels of three bytes.
 struct Bytes3 : WholeBytes {
   static constexpr size_t kBytes = 3;
   static constexpr bool kKeepsBytes = false;
 
   template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
-    const hn::Repartition<uint8, Lanes> d8;
-    alignas(16) static constexpr uint8 kSpread[16] = {0, 1, 2, 0x80, 3, 4,  5,  0x80,
-                                                      6, 7, 8, 0x80, 9, 10, 11, 0x80};
-    const auto blocks = hn::BitCast(d8, spreadBlocks(loadQuarters(at, part)));
-    const auto spread = hn::TableLookupBytesOr0(blocks, hn::LoadDup128(d8, kSpread));
-    return {hn::BitCast(Lanes(), spread)};
+    return {spreadTriples(Lanes(), loadQuarters(at, part))};
   }
-
   template <class P, class Before, class Part>
   static HWY_INLINE void store(P p, Before /*before*/, uint8* at, Part part) {
-    const hn::Repartition<uint8, Lanes> d8;
-    alignas(16) static constexpr uint8 kGather[16] = {0,  1,  2,  4,  5,    6,    8,    9,
-                                                      10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
-    const auto bytes = hn::BitCast(d8, bytesOf(p).v);
-    const auto blocks = hn::TableLookupBytesOr0(bytes, hn::LoadDup128(d8, kGather));
-    storeQuarters(gatherBlocks(hn::BitCast(Lanes(), blocks)), at, part);
+    storeQuarters(gatherTriples(Lanes(), bytesOf(p).v), at, part);
   }
 
  private:
@@ -254,28 +244,6 @@ struct Bytes3 : WholeBytes {
     storeLanes(kHalf, hn::LowerHalf(kHalf, v), at);
     const auto upper = hn::LowerHalf(kQuarter, hn::UpperHalf(kHalf, v));
     storeLanes(kQuarter, upper, at + kHalfBytes);
-  }
-
-  static HWY_INLINE Vector spreadBlocks(Vector quarters) {
-    if constexpr (kLanes<Lanes> == 4) {
-      return quarters;
-    } else {
-      alignas(64) static constexpr uint32 kLane[16] = {0, 1, 2, 2, 3, 4,  5,  5,
-                                                       6, 7, 8, 8, 9, 10, 11, 11};
-      return hn::TableLookupLanes(quarters, hn::SetTableIndices(Lanes(), kLane));
-    }
-  }
-  static HWY_INLINE Vector gatherBlocks(Vector blocks) {
-    if constexpr (kLanes<Lanes> == 4) {
-      return blocks;
-    } else {
-      alignas(64) static constexpr uint32 kLane[16] = {0, 1, 2, 4, 5, 6, 0, 0,
-                                                       0, 0, 0, 0, 0, 0, 0, 0};
-      alignas(64) static constexpr uint32 kLongLane[16] = {0,  1,  2,  4,  5, 6, 8, 9,
-                                                           10, 12, 13, 14, 0, 0, 0, 0};
-      constexpr const uint32* kFrom = kLanes<Lanes> == 8 ? kLane : kLongLane;
-      return hn::TableLookupLanes(blocks, hn::SetTableIndices(Lanes(), kFrom));
-    }
   }
 };
 

@@ -20,6 +20,7 @@
 #include "hwy/highway.h"
 #include "frame/pixelFormat.h"
 #include "vector/rows-inl.h"
+#include "vector/triples-inl.h"
 
 #if HWY_TARGET != HWY_SCALAR
 
@@ -92,109 +93,24 @@ HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
   return color;
 }
 
-// ---- Order of bytes and lanes ------------------------------------------------------------------
-
-/// For every 128-bit part of a vector the same choice of its bytes; kNoByte gives 0.
-using BytesOfPart = std::array<uint8, 16>;
-constexpr uint8 kNoByte = 0x80;
-
-template <class D> HWY_INLINE hn::Vec<D> chooseBytes(D d, hn::Vec<D> v, const BytesOfPart& choice) {
-  const hn::Repartition<uint8, D> d8;
-  return hn::BitCast(
-      d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::LoadDup128(d8, choice.data())));
-}
-
-/// A choice of the vector's 32-bit words.
-template <class D> using Words = std::array<int32, kLanes<hn::Repartition<uint32, D>>>;
-
-template <class D> HWY_INLINE hn::Vec<D> chooseWords(D d, hn::Vec<D> v, const Words<D>& choice) {
-  const hn::Repartition<uint32, D> d32;
-  return hn::BitCast(
-      d, hn::TableLookupLanes(hn::BitCast(d32, v), hn::SetTableIndices(d32, choice.data())));
-}
-
 // ---- Three bytes a pixel -----------------------------------------------------------------------
-
-/// Gives each part of a vector its four 3-byte pixels, from the word `first` of the vector on.
-template <class D> constexpr Words<D> spreadTriples(size_t first) {
-  Words<D> words{};
-  for (size_t i = 0; i < words.size(); ++i)
-    words[i] = i % 4 == 3 ? 0 : static_cast<int32>(first + i / 4 * 3 + i % 4);
-  return words;
-}
-
-/// Four 3-byte pixels to words, from the byte `first` of a part on.
-constexpr BytesOfPart expandTriples(size_t first) {
-  BytesOfPart bytes{};
-  for (size_t i = 0; i < bytes.size(); ++i)
-    bytes[i] = i % 4 == 3 ? kNoByte : static_cast<uint8>(first + i / 4 * 3 + i % 4);
-  return bytes;
-}
-
-/// The 3-byte pixels of one vector of 32-bit lanes, which start at the byte kFirst of `at`.
-template <size_t kFirst, class D> HWY_INLINE hn::Vec<D> loadTriples(D d, const uint8* at) {
-  const auto bytes = loadLanes(d, at);
-  if constexpr (kLanes<D> == 4) {
-    static constexpr BytesOfPart kExpand = expandTriples(kFirst);
-    return chooseBytes(d, bytes, kExpand);
-  } else {
-    static constexpr Words<D> kSpread = spreadTriples<D>(kFirst / 4);
-    static constexpr BytesOfPart kExpand = expandTriples(0);
-    return chooseBytes(d, chooseWords(d, bytes, kSpread), kExpand);
-  }
-}
 
 template <class D> HWY_INLINE Block<D> loadTripleBlock(D d, const uint8* at) {
   constexpr size_t kLoaded = kLanes<D> * 4;
   constexpr size_t kUsed = kLanes<D> * 3;
   // The last vector ends where the block ends.
-  return {{loadTriples<0>(d, at), loadTriples<0>(d, at + kUsed), loadTriples<0>(d, at + 2 * kUsed),
-           loadTriples<kLoaded - kUsed>(d, at + 4 * kUsed - kLoaded)}};
-}
-
-/// Where word `i` of vector `vector` of a block comes from when the words of its 3-byte pixels,
-/// three from each part, follow each other through the memory of the block.
-constexpr size_t packedWord(size_t vector, size_t i, size_t words) {
-  const size_t used = words / 4 * 3;
-  const size_t at = (i + 4 * words - vector * used) % words;
-  return at < used ? at / 3 * 4 + at % 3 : 3;
-}
-template <class D> constexpr Words<D> packTriples(size_t vector) {
-  Words<D> words{};
-  for (size_t i = 0; i < words.size(); ++i)
-    words[i] = static_cast<int32>(packedWord(vector, i, words.size()));
-  return words;
-}
-
-/// The low three bytes of a part's four pixels as its first three words; `rotated` (by the vector
-/// of a block) where a part is the whole vector.
-constexpr BytesOfPart shrinkTriples(size_t vector) {
-  BytesOfPart bytes{};
-  for (size_t i = 0; i < bytes.size(); ++i) {
-    const size_t from = packedWord(vector, i / 4, 4) * 4 + i % 4;
-    bytes[i] = from < 12 ? static_cast<uint8>(from / 3 * 4 + from % 3) : kNoByte;
-  }
-  return bytes;
-}
-
-template <size_t kVector, class D> HWY_INLINE hn::Vec<D> packTriplesOf(D d, hn::Vec<D> pixels) {
-  if constexpr (kLanes<D> == 4) {
-    static constexpr BytesOfPart kShrink = shrinkTriples(kVector);
-    return chooseBytes(d, pixels, kShrink);
-  } else {
-    static constexpr BytesOfPart kShrink = shrinkTriples(0);
-    static constexpr Words<D> kPack = packTriples<D>(kVector);
-    return chooseWords(d, chooseBytes(d, pixels, kShrink), kPack);
-  }
+  return {{spreadTriples(d, loadLanes(d, at)), spreadTriples(d, loadLanes(d, at + kUsed)),
+           spreadTriples(d, loadLanes(d, at + 2 * kUsed)),
+           spreadTriples<kLoaded - kUsed>(d, loadLanes(d, at + 4 * kUsed - kLoaded))}};
 }
 
 /// Four vectors, three quarters of each in use, become three.
 template <class D> HWY_INLINE void storeTripleBlock(D d, const Block<D>& block, uint8* at) {
   constexpr size_t kBytes = kLanes<D> * 4;
-  const auto v0 = packTriplesOf<0>(d, block.v[0]);
-  const auto v1 = packTriplesOf<1>(d, block.v[1]);
-  const auto v2 = packTriplesOf<2>(d, block.v[2]);
-  const auto v3 = packTriplesOf<3>(d, block.v[3]);
+  const auto v0 = gatherTriples<0>(d, block.v[0]);
+  const auto v1 = gatherTriples<1>(d, block.v[1]);
+  const auto v2 = gatherTriples<2>(d, block.v[2]);
+  const auto v3 = gatherTriples<3>(d, block.v[3]);
   storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4 * 3), v0, v1), at);
   storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 2), v1, v2), at + kBytes);
   storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4), v2, v3), at + 2 * kBytes);
@@ -210,8 +126,8 @@ constexpr BytesOfPart evenThenOddBytes() {
 
 /// Puts parts that each hold kVectors runs of bytes, one from each vector of a block, into the
 /// order of the block.
-template <class D, size_t kVectors> constexpr Words<D> unzipParts() {
-  Words<D> words{};
+template <class D, size_t kVectors> constexpr WordOrder<D> unzipParts() {
+  WordOrder<D> words{};
   constexpr size_t kRun = 4 / kVectors;
   const size_t parts = words.size() / 4;
   for (size_t i = 0; i < words.size(); ++i) {
@@ -227,7 +143,7 @@ template <size_t kVectors, class D> HWY_INLINE void storeZipped(D d, hn::Vec<D> 
   static constexpr BytesOfPart kUnzip = evenThenOddBytes();
   auto bytes = chooseBytes(d, zipped, kUnzip);
   if constexpr (kLanes<D> >= 16) {
-    static constexpr Words<D> kOrder = unzipParts<D, kVectors>();
+    static constexpr WordOrder<D> kOrder = unzipParts<D, kVectors>();
     bytes = chooseWords(d, bytes, kOrder);
   }
   storeLanes(d, bytes, at);
@@ -283,8 +199,8 @@ template <class F, class D> HWY_INLINE hn::Vec<D> widenChannel(D d, hn::Vec<D> p
 
 /// The order of quarters that makes the lower and upper halves of a vector's parts, when
 /// interleaved with others of this order, the first and the second half of the result.
-template <class D> constexpr Words<D> orderForInterleaving() {
-  Words<D> words{};
+template <class D> constexpr WordOrder<D> orderForInterleaving() {
+  WordOrder<D> words{};
   const size_t parts = words.size() / 4;
   for (size_t i = 0; i < words.size(); ++i)
     words[i] = static_cast<int32>((i / 4 + i / 2 % 2 * parts) * 2 + i % 2);
@@ -294,7 +210,7 @@ template <class D16> HWY_INLINE hn::Vec<D16> inOrderForInterleaving(D16 d16, hn:
   if constexpr (kLanes<D16> == 8) {
     return v;
   } else {
-    static constexpr Words<D16> kOrder = orderForInterleaving<D16>();
+    static constexpr WordOrder<D16> kOrder = orderForInterleaving<D16>();
     return chooseWords(d16, v, kOrder);
   }
 }

@@ -21,6 +21,7 @@
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
 #include "vector/rows-inl.h"
+#include "vector/triples-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -171,18 +172,7 @@ HWY_INLINE PixelVec mixLanes(PixelVec p0, PixelVec p1, HalvesVec w0, HalvesVec w
 
 /// A vector of 3-byte pixels as 4-byte ones, the fourth byte being 0. Reads 4 * kBlock bytes.
 HWY_INLINE PixelVec widenPixels(const uint8* at) {
-  const Pixels d;
-  const hn::Repartition<uint8, Pixels> d8;
-  alignas(64) static constexpr uint8 kWiden[64] = {
-      0, 1, 2, 0x80, 3, 4, 5, 0x80, 6, 7, 8, 0x80, 9, 10, 11, 0x80,  //
-      0, 1, 2, 0x80, 3, 4, 5, 0x80, 6, 7, 8, 0x80, 9, 10, 11, 0x80,  //
-      0, 1, 2, 0x80, 3, 4, 5, 0x80, 6, 7, 8, 0x80, 9, 10, 11, 0x80,  //
-      0, 1, 2, 0x80, 3, 4, 5, 0x80, 6, 7, 8, 0x80, 9, 10, 11, 0x80};
-  alignas(64) static constexpr uint32 kSpread[16] = {0, 1, 2, 3, 3, 4,  5,  6,
-                                                     6, 7, 8, 9, 9, 10, 11, 12};
-  auto v = loadLanes(d, at);
-  if constexpr (kBlock > 4) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kSpread));
-  return hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, v), hn::Load(d8, kWiden)));
+  return spreadTriples(Pixels(), loadLanes(Pixels(), at));
 }
 
 /// Copies a run of a few vectors at most, without a call.
@@ -200,7 +190,7 @@ HWY_INLINE void copyRow(uint8* dst, const uint8* src, size_t bytes) {
   }
 }
 
-/// The same for a row; reads exactly that. `out` has room for a vector more.
+/// Widens a row of 3-byte pixels; reads exactly that. `out` has room for a vector more.
 HWY_INLINE void widenRow(const uint8* row, uint32 count, uint8* out) {
   const Pixels d;
   uint32 i = 0;

@@ -49,25 +49,7 @@ void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width
 
 #else
 
-/// The three low bytes of each pixel, packed into the first 3 * kBlock bytes.
-HWY_INLINE PixelVec packThreeBytes(PixelVec pixels) {
-  const Pixels d;
-  const hn::Repartition<uint8, Pixels> d8;
-  alignas(64) static constexpr uint8 kPack[64] = {
-      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
-      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
-      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80,  //
-      0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0x80, 0x80, 0x80, 0x80};
-  alignas(64) static constexpr uint32 kClose8[8] = {0, 1, 2, 4, 5, 6, 7, 7};
-  alignas(64) static constexpr uint32 kClose16[16] = {0,  1,  2,  4,  5,  6,  8,  9,
-                                                      10, 12, 13, 14, 15, 15, 15, 15};
-  auto v = hn::BitCast(d, hn::TableLookupBytesOr0(hn::BitCast(d8, pixels), hn::Load(d8, kPack)));
-  if constexpr (kBlock == 8) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kClose8));
-  if constexpr (kBlock == 16) v = hn::TableLookupLanes(v, hn::SetTableIndices(d, kClose16));
-  return v;
-}
-
-/// Calls pixels(i) for each block of a row and stores the `width` results in pixels of kBytes.
+/// Calls block(i) for each block of a row and stores the `width` results in pixels of kBytes.
 template <unsigned kBytes, class Block>
 HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
   static_assert(kBytes == 3 || kBytes == 4);
@@ -79,10 +61,10 @@ HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
   } else {
     // A whole vector is stored while its excess lies within the row, and is then overwritten.
     for (; width - i >= 2 * kBlock; i += kBlock)
-      storeLanes(d, packThreeBytes(block(i)), dst + 3 * i);
+      storeLanes(d, gatherTriples(d, block(i)), dst + 3 * i);
     for (; i < width; i += kBlock) {
       uint8 packed[4 * kBlock];
-      storeLanes(d, packThreeBytes(block(i)), packed);
+      storeLanes(d, gatherTriples(d, block(i)), packed);
       copyShort(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
     }
   }

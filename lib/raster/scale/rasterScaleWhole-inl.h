@@ -114,7 +114,7 @@ HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, const Run& run, uint
     const auto squares = [&](unsigned row, size_t part) {
       return widenPixels(rows[row] + 3 * (run.column + kSide * i + part * kBlock));
     };
-    storeLanes(d, packThreeBytes(averageSquares(d, side, squares)), dst + 3 * i);
+    storeLanes(d, gatherTriples(d, averageSquares(d, side, squares)), dst + 3 * i);
   }
   for (; i < run.count; i += kBlock) {
     const size_t count = std::min(run.count - i, kBlock);
@@ -127,7 +127,7 @@ HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, const Run& run, uint
                           run.end);
     };
     uint8 packed[4 * kBlock];
-    storeLanes(d, packThreeBytes(averageSquares(d, side, squares)), packed);
+    storeLanes(d, gatherTriples(d, averageSquares(d, side, squares)), packed);
     copyShort(dst + 3 * i, packed, 3 * count);
   }
 }
