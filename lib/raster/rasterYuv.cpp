@@ -188,12 +188,12 @@ using Uyvy = PackedRows<false>;
 using Yv12 = PlanarRows;
 
 constexpr YuvKernels kKernels = {{
-    {convertFrame<Yuy2, Packing15>, convertFrame<Yuy2, Packing16>, convertFrame<Yuy2, Packing24>,
-     convertFrame<Yuy2, Packing32>},
-    {convertFrame<Uyvy, Packing15>, convertFrame<Uyvy, Packing16>, convertFrame<Uyvy, Packing24>,
-     convertFrame<Uyvy, Packing32>},
-    {convertFrame<Yv12, Packing15>, convertFrame<Yv12, Packing16>, convertFrame<Yv12, Packing24>,
-     convertFrame<Yv12, Packing32>},
+    {convertFrame<Yuy2, Packing<Video15>>, convertFrame<Yuy2, Packing<Code16>>,
+     convertFrame<Yuy2, Packing<Code24>>, convertFrame<Yuy2, Packing<Code32>>},
+    {convertFrame<Uyvy, Packing<Video15>>, convertFrame<Uyvy, Packing<Code16>>,
+     convertFrame<Uyvy, Packing<Code24>>, convertFrame<Uyvy, Packing<Code32>>},
+    {convertFrame<Yv12, Packing<Video15>>, convertFrame<Yv12, Packing<Code16>>,
+     convertFrame<Yv12, Packing<Code24>>, convertFrame<Yv12, Packing<Code32>>},
 }};
 
 }  // namespace

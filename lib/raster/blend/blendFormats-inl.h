@@ -3,8 +3,6 @@
 // The six destination formats: how blocks of their pixels become vectors of channels and go back.
 // Included once per instruction set.
 
-#include "frame/pixelFormat.h"
-
 #if defined(RASTER_BLEND_FORMATS_INL_H) == defined(HWY_TARGET_TOGGLE)
 #ifdef RASTER_BLEND_FORMATS_INL_H
 #undef RASTER_BLEND_FORMATS_INL_H
@@ -15,26 +13,11 @@
 #include "blendBytes-inl.h"
 #include "blendPlanes-inl.h"
 #include "frame/frameBuffer.h"
+#include "vector/fields-inl.h"
 #include "vector/triples-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
-
-/// Shifts left by kBits, or right where that is negative.
-template <int kBits, class V> HWY_INLINE V shiftLeft(V v) {
-  if constexpr (kBits >= 0) {
-    return hn::ShiftLeft<kBits>(v);
-  } else {
-    return hn::ShiftRight<-kBits>(v);
-  }
-}
-
-/// Multiplies a field, where it lies, by a pattern that puts copies of it into the upper byte.
-template <class Field> HWY_INLINE WordLanes copyField(WordLanes words, uint16 pattern) {
-  // A constant that GCC knows would become a chain of shifts and sums.
-  const auto copies = inRegister(hn::Set(Words(), pattern));
-  return (words & hn::Set(Words(), Field::kMask)) * copies;
-}
 
 /// Three bits as eight. Deliberate: the last two repeat the field's low two bits, not its high
 /// ones.
@@ -52,7 +35,7 @@ inline constexpr uint16 kOneAt = 8;
 
 template <class Field> HWY_INLINE WordLanes widenThrees(WordLanes words) {
   const Words d;
-  const auto fields = shiftLeft<8 + Field::kBits - Field::kTop>(words);
+  const auto fields = shiftLanes<Field::kTop - Field::kBits - 8>(words);
   const auto index = hn::OrAnd(hn::Set(d, kOneAt), fields, hn::Set(d, 0x0700));
 #if HWY_TARGET == HWY_SCALAR
   return hn::Set(d, static_cast<uint16>(kWidenedThrees[hn::GetLane(index) >> 8] << 8 | 1));
@@ -68,37 +51,11 @@ template <class Field> HWY_INLINE WordLanes widenShort(WordLanes words) {
   if constexpr (Field::kBits == 3) {
     return widenThrees<Field>(words);
   } else {
-    return copyField<Field>(words, 0x5500 >> (Field::kTop - Field::kBits)) | hn::Set(Words(), 1);
+    return copyField<Field>(Words(), words, 0x5500 >> (Field::kTop - Field::kBits)) |
+           hn::Set(Words(), 1);
   }
 }
 template <class Field> inline constexpr bool kIsShort = Field::kBits <= 3;
-
-/// Widens a field of five or six bits to the upper byte: itself, and its top bits once more. The
-/// lower byte has no meaning.
-template <class Field> HWY_INLINE WordLanes widenLong(WordLanes words) {
-  constexpr int kUp = 16 - Field::kTop;
-  if constexpr (kUp >= Field::kBits) {
-    return copyField<Field>(words, (1 << kUp) + (1 << (kUp - Field::kBits)));
-  } else {
-    const auto top = hn::ShiftLeft<kUp>(words);
-    const auto mask = hn::Set(Words(), 0xFFFF0000u >> Field::kBits & 0xFFFF);
-    return hn::OrAnd(hn::ShiftRight<Field::kBits>(top), top, mask);
-  }
-}
-
-/// Narrows the upper byte of each lane to the field's place. Bits outside it have no meaning.
-template <class Field> HWY_INLINE WordLanes narrow(WordLanes channel) {
-  return shiftLeft<Field::kTop - 16>(channel);
-}
-
-/// Narrows the upper byte of each lane to a field of a pixel that has no other fields yet.
-template <class Field> HWY_INLINE WordLanes firstField(WordLanes channel) {
-  if constexpr (Field::kTop == Field::kBits) return narrow<Field>(channel);
-  return narrow<Field>(channel) & hn::Set(Words(), Field::kMask);
-}
-template <class Field> HWY_INLINE WordLanes addField(WordLanes others, WordLanes channel) {
-  return hn::OrAnd(others, narrow<Field>(channel), hn::Set(Words(), Field::kMask));
-}
 
 /// Pixels of one or two bytes, with a field for each channel: the first one is blue. Bits outside
 /// them become 0.
@@ -117,18 +74,21 @@ template <class Format> struct Packed {
     return loadPlanes(at, part);
   }
   template <class Part> static HWY_INLINE auto load(const uint8* at, Part part) {
+    [[maybe_unused]] const Words d;
     const auto words = loadWords(at, part);
     if constexpr (kIsShort<C0> && kIsShort<C1> && kIsShort<C2>) {
       return ExactPlanes{
           {widenShort<C0>(words), widenShort<C1>(words), widenShort<C2>(words), words}};
     } else {
-      return Planes{widenLong<C0>(words), widenLong<C1>(words), widenLong<C2>(words), words};
+      return Planes{widenToUpper<C0>(d, words), widenToUpper<C1>(d, words),
+                    widenToUpper<C2>(d, words), words};
     }
   }
   template <class Part>
   static HWY_INLINE void store(const Planes& p, const Planes& /*before*/, uint8* at, Part part) {
-    const auto fields = addField<C1>(firstField<C0>(p.c0), p.c1);
-    storeWords(addField<C2>(fields, p.c2), at, part);
+    const Words d;
+    const auto fields = addField<C1>(d, firstField<C0>(d, p.c0), p.c1);
+    storeWords(addField<C2>(d, fields, p.c2), at, part);
   }
 
  private:

@@ -18,14 +18,6 @@
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 
-/// Keeps lanes in a register. Without the barrier GCC reads the memory again at every use.
-template <class V> HWY_INLINE V inRegister(V lanes) {
-#if HWY_TARGET != HWY_SCALAR
-  asm("" : "+v"(lanes.raw));
-#endif
-  return lanes;
-}
-
 /// How much of a block of pixels is in the rectangle: all of it.
 struct WholeBlock {};
 

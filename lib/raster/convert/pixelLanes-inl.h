@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// Pixels in vector lanes: loading and storing blocks of every pixel size, and the conversion of
-// lanes from one format to another. Included once per instruction set, after Highway.
+// Pixels in vector lanes: loading and storing blocks of every pixel size. Included once per
+// instruction set, after Highway.
 //
 // A block is as many pixels as a vector has bytes. It lies in four vectors of 32-bit lanes or two
 // of 16-bit lanes, a pixel to a lane, and in memory it is one to four whole vectors: so a block is
@@ -19,6 +19,7 @@
 
 #include "hwy/highway.h"
 #include "frame/pixelFormat.h"
+#include "vector/fields-inl.h"
 #include "vector/rows-inl.h"
 #include "vector/triples-inl.h"
 
@@ -35,63 +36,6 @@ template <class D> struct Block {
   static constexpr size_t kVectors = sizeof(hn::TFromD<D>);
   hn::Vec<D> v[kVectors];
 };
-
-// ---- Lanes from one format to another ----------------------------------------------------------
-
-template <int kRight, class V> HWY_INLINE V shiftLanes(V v) {
-  if constexpr (kRight > 0) {
-    return hn::ShiftRight<kRight>(v);
-  } else if constexpr (kRight < 0) {
-    return hn::ShiftLeft<-kRight>(v);
-  } else {
-    return v;
-  }
-}
-
-template <class D> HWY_INLINE hn::Vec<D> setMask(D d, uint32 mask) {
-  return hn::Set(d, static_cast<hn::TFromD<D>>(mask));
-}
-
-/// The bits that a conversion repeats `kRight` bits lower.
-template <class Move, int kRight>
-inline constexpr uint32 kRepeatMask =
-    (Move::Red::kRepeatRight == kRight ? Move::Red::kRepeatMask : 0) |
-    (Move::Green::kRepeatRight == kRight ? Move::Green::kRepeatMask : 0) |
-    (Move::Blue::kRepeatRight == kRight ? Move::Blue::kRepeatMask : 0);
-
-template <class Move, int kRight, class D>
-HWY_INLINE hn::Vec<D> addRepeated(D d, hn::Vec<D> color, hn::Vec<D> tops) {
-  constexpr uint32 kMask = kRepeatMask<Move, kRight>;
-  if constexpr (kMask == 0) {
-    return color;
-  } else {
-    return hn::OrAnd(color, hn::ShiftRight<kRight>(tops), setMask(d, kMask));
-  }
-}
-
-/// convertColor on lanes. Channels that move alike move together.
-template <class From, class To, class D>
-HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
-  using Move = ColorMove<From, To>;
-  using R = typename Move::Red;
-  using G = typename Move::Green;
-  using B = typename Move::Blue;
-  auto tops = hn::And(shiftLanes<B::kRight>(pixels), setMask(d, B::kTopMask));
-  const auto green = shiftLanes<G::kRight>(pixels);
-  if constexpr (R::kRight == G::kRight) {
-    tops = hn::OrAnd(tops, green, setMask(d, G::kTopMask | R::kTopMask));
-  } else {
-    tops = hn::OrAnd(tops, green, setMask(d, G::kTopMask));
-    tops = hn::OrAnd(tops, shiftLanes<R::kRight>(pixels), setMask(d, R::kTopMask));
-  }
-  // Every distance once: the mask of a distance has the bits of all channels that have it.
-  auto color = addRepeated<Move, R::kRepeatRight>(d, tops, tops);
-  if constexpr (G::kRepeatRight != R::kRepeatRight)
-    color = addRepeated<Move, G::kRepeatRight>(d, color, tops);
-  if constexpr (B::kRepeatRight != R::kRepeatRight && B::kRepeatRight != G::kRepeatRight)
-    color = addRepeated<Move, B::kRepeatRight>(d, color, tops);
-  return color;
-}
 
 // ---- Three bytes a pixel -----------------------------------------------------------------------
 
@@ -180,22 +124,6 @@ template <class D> HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, ui
 }
 
 // ---- Wide channels -----------------------------------------------------------------------------
-
-/// One channel of 16-bit pixels widened to 8 bits: v of b bits, repeated, is v times
-/// (2^b + 1) * 2^(8 - 2b), rounded down.
-template <class F, class D> HWY_INLINE hn::Vec<D> widenChannel(D d, hn::Vec<D> pixels) {
-  static_assert(F::kBits >= 4 && F::kBits <= 8, "channels of 4 to 8 bits are widened");
-  constexpr int kLow = F::kTop - F::kBits;
-  constexpr auto factorAt = [](int low) {
-    return uint64{(1u << F::kBits) + 1} << (24 - 2 * F::kBits - low);
-  };
-  // Where the channel lies when it is multiplied: at the top unless its factor fits 16 bits.
-  constexpr bool kStays = kLow != 0 && factorAt(kLow) <= 0xFFFF;
-  constexpr int kUp = kStays ? 0 : 16 - F::kTop;
-  auto channel = shiftLanes<-kUp>(pixels);
-  if constexpr (kLow != 0) channel = hn::And(channel, setMask(d, F::kMask << kUp));
-  return hn::MulHigh(channel, setMask(d, static_cast<uint32>(factorAt(kLow + kUp))));
-}
 
 /// The order of quarters that makes the lower and upper halves of a vector's parts, when
 /// interleaved with others of this order, the first and the second half of the result.

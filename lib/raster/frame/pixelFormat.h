@@ -18,6 +18,9 @@ template <unsigned kLowBit, unsigned kBitCount> struct Field {
   static constexpr int kBits = kBitCount;
   static constexpr int kTop = kLowBit + kBitCount;  ///< one above the highest bit
   static constexpr uint32 kMask = ((1u << kBitCount) - 1) << kLowBit;
+
+  /// The top bits of a byte, in their place.
+  static constexpr uint32 ofByte(uint32 byte) { return byte >> (8 - kBitCount) << kLowBit; }
 };
 
 /// A format by its code, its bytes a pixel, and its channels.

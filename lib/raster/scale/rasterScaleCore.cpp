@@ -117,7 +117,7 @@ void storePlainRow(const ScaleJob& job, uint8* dst, const uint32* row) {
     storeRow565(dst, row, job.width);
   } else if (job.depthsDiffer) {
     for (uint32 i = 0; i < job.width; ++i, dst += job.dstBytesPerPixel)
-      storePixel<2>(dst, to565(row[i]));
+      storePixel<2>(dst, convertColor<Code32, Code16>(row[i]));
   } else if (job.sizesDiffer) {
     storeSparseRow(dst, row, job.width, job.dstBytesPerPixel);
   } else if (job.dstBytesPerPixel == 4) {

@@ -115,11 +115,6 @@ struct WeightedRows {
   uint32 count;
 };
 
-/// 32-bit colour as 16-bit (5-6-5).
-constexpr uint32 to565(uint32 v) {
-  return (v & 0xF8) >> 3 | (v & 0xFC00) >> 5 | (v & 0xF80000) >> 8;
-}
-
 /// What the scaler of one instruction-set level offers.
 struct ScaleKernels {
   void (*draw)(const ScaleJob& job);

@@ -12,6 +12,7 @@
 
 #include "rasterScaleColumns-inl.h"
 #include "rasterScaleInternal.h"
+#include "vector/fields-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -29,7 +30,7 @@ template <unsigned kBytes> void storeRow(uint8* dst, const uint32* row, uint32 w
 }
 
 void storeRow565(uint8* dst, const uint32* row, uint32 width) {
-  makeRow<2>(dst, width, [=](uint32 i) { return to565(row[i]); });
+  makeRow<2>(dst, width, [=](uint32 i) { return convertColor<Code32, Code16>(row[i]); });
 }
 
 template <unsigned kBytes>
@@ -77,16 +78,12 @@ template <unsigned kBytes> void storeRow(uint8* dst, const uint32* row, uint32 w
 void storeRow565(uint8* dst, const uint32* row, uint32 width) {
   const Pixels d;
   const hn::Rebind<uint16, Pixels> d16;
-  const auto field = [&](PixelVec v, uint32 mask) { return hn::And(v, hn::Set(d, mask)); };
   uint32 i = 0;
   for (; width - i >= kBlock; i += kBlock) {
-    const PixelVec v = hn::LoadU(d, row + i);
-    const PixelVec packed =
-        hn::Or(hn::ShiftRight<3>(field(v, 0xF8)),
-               hn::Or(hn::ShiftRight<5>(field(v, 0xFC00)), hn::ShiftRight<8>(field(v, 0xF80000))));
+    const PixelVec packed = convertLanes<Code32, Code16>(d, hn::LoadU(d, row + i));
     storeLanes(d16, hn::TruncateTo(d16, packed), dst + size_t{2} * i);
   }
-  for (; i < width; ++i) storePixel<2>(dst + size_t{2} * i, to565(row[i]));
+  for (; i < width; ++i) storePixel<2>(dst + size_t{2} * i, convertColor<Code32, Code16>(row[i]));
 }
 
 template <unsigned kBytes>

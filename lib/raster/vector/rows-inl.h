@@ -50,6 +50,14 @@ template <class D> HWY_INLINE void storeLanes(D d, hn::Vec<D> lanes, uint8* at) 
 #endif
 }
 
+/// Keeps lanes in a register. Without the barrier GCC reads the memory again at every use.
+template <class V> HWY_INLINE V inRegister(V lanes) {
+#if HWY_TARGET != HWY_SCALAR
+  asm("" : "+v"(lanes.raw));
+#endif
+  return lanes;
+}
+
 /// What fetchAhead asks for at once.
 inline constexpr size_t kCacheLine = 64;
 

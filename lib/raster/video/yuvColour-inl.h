@@ -19,6 +19,7 @@
 #define RASTER_YUV_COLOUR_INL_H
 #endif
 
+#include "vector/fields-inl.h"
 #include "vector/rows-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -41,10 +42,10 @@ template <class D> struct Sums { hn::Vec<D> r, g, b; };
 constexpr int kFraction = 7;
 constexpr int kFractionOfBlue = 6;
 
-// Taken from the luma and added to the chroma, so that both fit a lane.
-constexpr int kShift = 4096;
-static_assert(149 * (255 - 16) + 64 - kShift <= 32767);
-static_assert(409 * 127 / 2 + kShift <= 32767);
+/// A bias: taken from the luma and added to the chroma, so that both fit a lane.
+constexpr int kBias = 4096;
+static_assert(149 * (255 - 16) + 64 - kBias <= 32767);
+static_assert(409 * 127 / 2 + kBias <= 32767);
 
 template <class D> HWY_INLINE hn::Vec<D> alternately(D d, int even, int odd) {
   const hn::RepartitionToWide<D> d32;
@@ -68,18 +69,18 @@ template <class D> HWY_INLINE ChromaTerms<D> chromaTerms(D d, Chroma<D> chroma) 
   // 65536 times the factors 409 / 2 and 129, over the 256 of the upper byte.
   const auto factors = hn::BitCast(du, alternately(d, 409 * 128, 129 * 256));
   const auto rb = hn::Add(hn::BitCast(d, hn::MulHigh(chroma.upper, factors)),
-                          alternately(d, kShift - 409 * 64, kShift / 2 - 129 * 128));
+                          alternately(d, kBias - 409 * 64, kBias / 2 - 129 * 128));
   auto none = hn::Zero(d32);
   const auto g =
       hn::ReorderWidenMulAccumulate(d32, hn::BitCast(d, chroma.lower), alternately(d, -104, -50),
-                                    hn::Set(d32, kShift + 154 * 128), none);
+                                    hn::Set(d32, kBias + 154 * 128), none);
   return {twice<0>(d, rb), twice<0>(d, hn::BitCast(d, g)), twice<2>(d, rb)};
 }
 
 template <class D>
 HWY_INLINE Sums<D> colourSums(D d, Unsigned16<D> luma, const ChromaTerms<D>& chroma) {
   const auto y = hn::Add(hn::Mul(hn::BitCast(d, luma), hn::Set(d, int16{149})),
-                         hn::Set(d, static_cast<int16>(64 - 149 * 16 - kShift)));
+                         hn::Set(d, static_cast<int16>(64 - 149 * 16 - kBias)));
   return {hn::SaturatedAdd(y, chroma.r), hn::SaturatedAdd(y, chroma.g),
           hn::SaturatedAdd(hn::ShiftRight<1>(y), chroma.b)};
 }
@@ -130,13 +131,15 @@ template <class D> constexpr size_t kQuads = kLanes<D> * sizeof(hn::TFromD<D>) /
 
 #endif
 
-/// What three colour channels become in memory: ((((R >> rs) << gw) | (G >> gs)) << bw | (B >> rs))
-/// << fs, lowest byte first.
-template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Packing {
-  static constexpr unsigned kBytes = kSize;
+/// What three colour channels become in memory: pixels of a format, lowest byte first.
+template <class Format> struct Packing {
+  static constexpr unsigned kBytes = Format::kBytes;
+  using Red = typename Format::Red;
+  using Green = typename Format::Green;
+  using Blue = typename Format::Blue;
 
   static constexpr uint32 pack(uint32 r, uint32 g, uint32 b) {
-    return ((((r >> kRs) << kGw | g >> kGs) << kBw) | b >> kRs) << kFs;
+    return Red::ofByte(r) | Green::ofByte(g) | Blue::ofByte(b);
   }
 
 #if HWY_TARGET != HWY_SCALAR
@@ -144,7 +147,7 @@ template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Pa
   /// Brings the pixels of a vector of 16-bit lanes into the order that `store` wants: for four-byte
   /// pixels, the first half of the pixels in the lower halves of the 16-byte blocks.
   template <class D> static HWY_INLINE hn::Vec<D> arrange(D d, hn::Vec<D> lanes) {
-    if constexpr (kSize != 4 || kQuads<D> == 2) {
+    if constexpr (kBytes != 4 || kQuads<D> == 2) {
       return lanes;
     } else {
       static constexpr QuadOrder<kQuads<D>> kOrder = [] {
@@ -159,9 +162,9 @@ template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Pa
 
   /// Stores the pixels of a vector.
   template <class D> static HWY_INLINE void store(D d, const Sums<D>& sums, uint8* dst) {
-    if constexpr (kSize == 2) {
+    if constexpr (kBytes == 2) {
       storeLanes(hn::RebindToUnsigned<D>(), packWords(d, sums), dst);
-    } else if constexpr (kSize == 3) {
+    } else if constexpr (kBytes == 3) {
       storeTriples(d, toBytes<false>(d, sums), dst);
     } else {
       storeQuads(d, toBytes<HWY_TARGET <= HWY_AVX3>(d, sums), dst);
@@ -170,26 +173,20 @@ template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Pa
 
  private:
   /// One channel of a word: the top bits of a sum that is limited to a byte.
-  template <int kFromFraction, int kDropped, int kAt, class D>
+  template <class Field, int kSumFraction, class D>
   static HWY_INLINE Unsigned16<D> field(D d, hn::Vec<D> sum) {
     const hn::RebindToUnsigned<D> du;
-    constexpr int kUp = kAt - (kFromFraction + kDropped);
-    const auto v = hn::BitCast(du, sum);
-    const auto mask = hn::Set(du, static_cast<uint16>((0xFF >> kDropped) << kAt));
-    if constexpr (kUp >= 0) {
-      return hn::And(hn::ShiftLeft<kUp>(v), mask);
-    } else {
-      return hn::And(hn::ShiftRight<-kUp>(v), mask);
-    }
+    const auto moved = shiftLanes<kSumFraction + 8 - Field::kTop>(hn::BitCast(du, sum));
+    return hn::And(moved, setMask(du, Field::kMask));
   }
 
   template <class D> static HWY_INLINE Unsigned16<D> packWords(D d, const Sums<D>& sums) {
     const auto zero = hn::Zero(d);
     // The other two saturate where their bytes end.
     const auto b = hn::Min(sums.b, hn::Set(d, int16{(256 << kFractionOfBlue) - 1}));
-    return hn::Or(hn::Or(field<kFraction, kRs, kGw + kBw + kFs>(d, hn::Max(sums.r, zero)),
-                         field<kFraction, kGs, kBw + kFs>(d, hn::Max(sums.g, zero))),
-                  field<kFractionOfBlue, kRs, kFs>(d, hn::Max(b, zero)));
+    return hn::Or(hn::Or(field<Red, kFraction>(d, hn::Max(sums.r, zero)),
+                         field<Green, kFraction>(d, hn::Max(sums.g, zero))),
+                  field<Blue, kFractionOfBlue>(d, hn::Max(b, zero)));
   }
 
   /// Each block becomes the first 16 and the last 8 of its 24 bytes; then these are joined.
@@ -265,10 +262,8 @@ template <unsigned kSize, int kRs, int kGs, int kGw, int kBw, int kFs> struct Pa
 #endif
 };
 
-using Packing15 = Packing<2, 3, 3, 5, 5, 1>;
-using Packing16 = Packing<2, 3, 2, 6, 5, 0>;
-using Packing24 = Packing<3, 0, 0, 8, 8, 0>;
-using Packing32 = Packing<4, 0, 0, 8, 8, 0>;
+/// Deliberate: 15 bits lie one higher than in code 15.
+using Video15 = PixelFormat<15, 2, Field<11, 5>, Field<6, 5>, Field<1, 5>>;
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
