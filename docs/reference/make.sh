@@ -15,9 +15,10 @@ for page in *; do
   esac
 done
 
-# No date, so that the same headers give the same pages; no second brief text after the name; a way on.
+# No date, so that the same headers give the same pages; no second brief text after the name; a way on; no
+# text for a command because of the apostrophe that it begins with.
 find . -type f | while read -r page; do
   sed -i -e '1s/^\(\.TH "[^"]*" 3raster\) "[^"]*" "Version \([^"]*\)".*/\1 "" "raster \2" "raster"/' \
-    -e '/^ \\- /d' -e 's/^\.SH "Author"/.SH "SEE ALSO"/' \
+    -e '/^ \\- /d' -e "s/^'/\\\\\&'/" -e 's/^\.SH "Author"/.SH "SEE ALSO"/' \
     -e 's/^Generated automatically by Doxygen.*/.BR raster (7)/' "$page"
 done

@@ -41,7 +41,8 @@ grep -q 'Only the near sides are bounded below' "$work/page"
 MANWIDTH=100 man -M "$manual" --warnings 7 raster 2>&1 >"$work/page" | tee "$work/warnings"
 [ ! -s "$work/warnings" ]
 grep -q 'Fatal errors' "$work/page"
-for page in "$manual"/man1/*; do
+find "$manual/man1" "$manual/man3" -type f | while read -r page; do
+  ! head -n 1 "$page" | grep -q '^\.so ' || continue
   MANWIDTH=100 man -M "$manual" --warnings "$page" 2>&1 >"$work/page" | tee "$work/warnings"
   [ ! -s "$work/warnings" ]
 done
