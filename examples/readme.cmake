@@ -1,10 +1,21 @@
-# Runs the program in README and looks at what it saved: a PNG file of 320 x 200 pixels.
-file(REMOVE picture.png)
-execute_process(COMMAND ${PROGRAM} RESULT_VARIABLE result)
-if(NOT result EQUAL 0)
-  message(FATAL_ERROR "the program ended with ${result}")
-endif()
+# Runs the C program in README and looks at what it saved: a PNG file of 320 x 200 pixels. Then the C++
+# program, whose file is the same.
+function(save program)
+  file(REMOVE picture.png)
+  execute_process(COMMAND ${program} RESULT_VARIABLE result)
+  if(NOT result EQUAL 0)
+    message(FATAL_ERROR "${program} ended with ${result}")
+  endif()
+endfunction()
+
+save(${PROGRAM})
 file(READ picture.png start LIMIT 24 HEX)
 if(NOT start STREQUAL "89504e470d0a1a0a0000000d4948445200000140000000c8")
   message(FATAL_ERROR "picture.png starts with ${start}")
+endif()
+file(SHA256 picture.png expected)
+save(${SAME})
+file(SHA256 picture.png found)
+if(NOT found STREQUAL expected)
+  message(FATAL_ERROR "the C++ program makes another picture")
 endif()
