@@ -24,25 +24,38 @@ stopServing() {
   wait "$@" || true
 }
 
-# A viewer without a window that follows $address until file descriptor 9 is closed; its output goes
-# to the file $live/NAME.viewer.
+# A viewer without a window that follows $address until endFollowing; its output goes to the file
+# $live/NAME.viewer.
 # usage: follow NAME [OPTION...]
 followers=()
 follow() {
   local name=$1
   shift
-  "$root/build/x86_64/bin/rfbViewer" "$address" --until-end-of-input "$@" <"$live/pipe" \
+  "$root/build/x86_64/bin/rfbViewer" "$address" --until-end-of-input "$@" <&8 8<&- 9>&- \
     >"$live/$name.viewer" 2>&1 &
   followers+=($!)  # which end when the pipe does, and with their server
 }
 
-# Between these two the followers follow.
+# Between these two the followers follow. Their end of the pipe is open from the start, since one that
+# is late would wait for somebody at the other end.
 beginFollowing() {
   followers=()
-  rm -f "$live/pipe"
   mkfifo "$live/pipe"
+  exec 9<>"$live/pipe" 8<"$live/pipe"
+  rm "$live/pipe"
 }
-endFollowing() { exec 9>&-; }
+endFollowing() { exec 9>&- 8<&-; }
+
+# Waits until every follower has its first picture; one that ends early is told of later.
+untilAllFollow() {
+  local file
+  for file in "$live"/*.viewer; do
+    for _ in $(seq 100); do
+      grep -qs following "$file" && break
+      sleep 0.1
+    done
+  done
+}
 
 # A clock that ticks and a terminal that scrolls; they are to be stopped with stopMoving.
 moving=()
