@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
+#include <utility>
 
 #include "commands.h"
 #include "cursorImage.h"
@@ -55,7 +56,8 @@ void copyRows(Picture& picture, uint32 top, const uint8* rows, uint32 rowPitch, 
 
 }  // namespace
 
-Display::Display(const std::string& name) : displayName(name), connection(nullptr, xcb_disconnect) {
+Display::Display(const std::string& name)
+    : displayName(name), connection(nullptr, xcb_disconnect), placeholder(nullptr, xcb_disconnect) {
   int number = 0;
   connection.reset(connectTo(name, &number));
   if (xcb_connection_has_error(connection.get()) != 0) {
@@ -184,24 +186,35 @@ Picture Display::capture(const Rect& region) {
   return picture;
 }
 
+Display::CursorReply Display::cursorReply(bool& isRefused) {
+  xcb_generic_error_t* answer = nullptr;
+  CursorReply reply(xcb_xfixes_get_cursor_image_reply(
+                        connection.get(), xcb_xfixes_get_cursor_image(connection.get()), &answer),
+                    free);
+  const ReplyPointer<xcb_generic_error_t> error(answer, free);
+  isRefused = error && error->error_code == XCB_ACCESS;
+  return reply;
+}
+
 /// Null when there is none at the moment. An X server gives a cursor away only while the number of
 /// the client that made it is in use; a new client gets the lowest number that is not. So for
 /// cursors of clients that have left, as xsetroot does, we come in once more, until we have theirs.
-Display::CursorReply Display::cursorReply() {
-  constexpr size_t kMostPlaceholders = 16;
-  for (;;) {
-    xcb_generic_error_t* answer = nullptr;
-    CursorReply reply(xcb_xfixes_get_cursor_image_reply(
-                          connection.get(), xcb_xfixes_get_cursor_image(connection.get()), &answer),
-                      free);
-    const ReplyPointer<xcb_generic_error_t> error(answer, free);
-    if (reply || !error || error->error_code != XCB_ACCESS) return reply;
-    if (placeholders.size() == kMostPlaceholders) break;
-    placeholders.emplace_back(connectTo(displayName, nullptr), xcb_disconnect);
-    if (xcb_connection_has_error(placeholders.back().get()) != 0) break;
+Display::CursorReply Display::cursorOfAny() {
+  constexpr size_t kMostGuests = 48;
+  constexpr std::chrono::seconds kPause(1);
+  bool isRefused = false;
+  CursorReply reply = cursorReply(isRefused);
+  const auto now = std::chrono::steady_clock::now();
+  if (!isRefused || now < nextSearch) return reply;
+  std::vector<Connection> guests;
+  while (isRefused && guests.size() < kMostGuests) {
+    guests.emplace_back(connectTo(displayName, nullptr), xcb_disconnect);
+    if (xcb_connection_has_error(guests.back().get()) != 0) break;
+    reply = cursorReply(isRefused);
   }
-  placeholders.clear();  // the numbers that they had may be of use the next time
-  return {nullptr, free};
+  if (isRefused) nextSearch = now + kPause;
+  placeholder = std::move(guests.back());  // the moving ones are asked for again and again
+  return reply;
 }
 
 std::optional<LiveCursor> Display::cursor() {
@@ -211,7 +224,7 @@ std::optional<LiveCursor> Display::cursor() {
             xcb_xfixes_query_version(connection.get(), XCB_XFIXES_MAJOR_VERSION,
                                      XCB_XFIXES_MINOR_VERSION),
             xcb_xfixes_query_version_reply, "the version of XFIXES");
-  const CursorReply reply = cursorReply();
+  const CursorReply reply = cursorOfAny();
   if (!reply && xcb_connection_has_error(connection.get()) == 0) return std::nullopt;
   if (!reply) throw Failure("the display went away");
   const uint32* pixels = xcb_xfixes_get_cursor_image_cursor_image(reply.get());

@@ -8,6 +8,7 @@
 #include <xcb/xcb.h>
 #include <xcb/xfixes.h>
 
+#include <chrono>
 #include <memory>
 #include <optional>
 #include <string>
@@ -60,11 +61,13 @@ class Display {
   void readPalette();
   bool captureShared(Picture& picture, const Rect& region);
   void captureInBands(Picture& picture, const Rect& region);
-  CursorReply cursorReply();
+  CursorReply cursorReply(bool& isRefused);
+  CursorReply cursorOfAny();
 
   std::string displayName;
   Connection connection;
-  std::vector<Connection> placeholders;  // for clients that have left: see cursorReply()
+  Connection placeholder;  // has the number of the cursor's maker, who has left
+  std::chrono::steady_clock::time_point nextSearch;  // for that number
   ScreenSetup format;
   Rect area = {};
   std::unique_ptr<SharedMemory> sharedMemory;

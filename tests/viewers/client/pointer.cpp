@@ -22,25 +22,32 @@ Connection connected(const std::string& display) {
   return x;
 }
 
+using Reply = Owned<xcb_xfixes_get_cursor_image_reply_t>;
+
+Reply ask(xcb_connection_t* x) {
+  return {xcb_xfixes_get_cursor_image_reply(x, xcb_xfixes_get_cursor_image(x), nullptr), free};
+}
+
 /// X servers tell the cursor of a client that has left only while somebody else has its number.
-std::vector<Connection> withEveryLowNumberTaken(const std::string& display) {
-  std::vector<Connection> some;
-  for (int i = 0; i < 8; ++i) some.push_back(connected(display));
-  return some;
+Reply askInCompany(xcb_connection_t* x, const std::string& display) {
+  std::vector<Connection> others;
+  Reply reply = ask(x);
+  while (reply == nullptr && others.size() < 100) {
+    others.push_back(connected(display));
+    reply = ask(x);
+  }
+  return reply;
 }
 
 }  // namespace
 
 Pointer pointerOf(const std::string& display) {
-  const std::vector<Connection> others = withEveryLowNumberTaken(display);
   const Connection x = connected(display);
   // The extension has to hear which version is spoken.
   const auto version = xcb_xfixes_query_version(x.get(), 4, 0);
   const Owned<xcb_xfixes_query_version_reply_t> known(
       xcb_xfixes_query_version_reply(x.get(), version, nullptr), free);
-  const auto request = xcb_xfixes_get_cursor_image(x.get());
-  const Owned<xcb_xfixes_get_cursor_image_reply_t> reply(
-      xcb_xfixes_get_cursor_image_reply(x.get(), request, nullptr), free);
+  const Reply reply = askInCompany(x.get(), display);
   if (known == nullptr || reply == nullptr) throw Broken("the X server tells no cursor");
   const uint32_t* words = xcb_xfixes_get_cursor_image_cursor_image(reply.get());
   const int count = xcb_xfixes_get_cursor_image_cursor_image_length(reply.get());
