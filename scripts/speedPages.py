@@ -35,6 +35,11 @@ def ratio(value):
     return f"{value:.2f}" if value is not None else "-"
 
 
+def peer_of(row):
+    """The best peer's name, with a plus where it could not be held to the row's level."""
+    return row.peer() + ("+" if row.level == "sse4" and row.peer().startswith("Qt") else "")
+
+
 def table(head, body, right=0):
     """The columns from `right` on are numbers."""
     if not body:
@@ -101,7 +106,7 @@ def lost():
                 behind.setdefault((row.job, row.size), {})[level] = row
     known = reasons()
     worst = lambda item: min(row.of_peer() for row in item[1].values())
-    body = [[job, size, *(f"{ratio(at[level].of_peer())} {at[level].peer()}" if level in at else "" for level in levels),
+    body = [[job, size, *(f"{ratio(at[level].of_peer())} {peer_of(at[level])}" if level in at else "" for level in levels),
              reason(at.values(), known)] for (job, size), at in sorted(behind.items(), key=worst)]
     return table(["job", "size", *levels, "why"], body, 3 + len(levels)) if body else "None."
 
@@ -193,7 +198,7 @@ def cell(row, bits):
         return "-"
     words = [number(row.rate(row.ours)), ratio(row.of_limit())]
     if bits == 64:
-        words.append(f"{ratio(row.of_peer())} {row.peer()}" if row.peers else "-")
+        words.append(f"{ratio(row.of_peer())} {peer_of(row)}" if row.peers else "-")
     else:
         wide = rows.get((row.level, 64, row.job, row.size))
         words.append(ratio(wide.ours / row.ours if wide else None))

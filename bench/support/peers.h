@@ -84,8 +84,8 @@ inline SDL_Surface* surface(Uint32 format, uint8* pixels, Extent e, uint32 pitch
 #endif
 
 /// Everybody works with one thread, as this library does, and those that choose an instruction set
-/// when they run choose none above RASTER_CPU_LEVEL (OpenCV and Qt: in scripts/bench, before they
-/// start; the others have nothing above SSSE3).
+/// when they run choose none above RASTER_CPU_LEVEL (OpenCV: in scripts/measure.sh, before it
+/// starts; Qt cannot be held below AVX2; the others have nothing above SSSE3).
 inline void preparePeers() {
 #ifdef HAVE_OPENCV
   cv::setNumThreads(1);
