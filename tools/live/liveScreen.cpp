@@ -132,7 +132,7 @@ bool LiveScreen::listen(Clock::time_point now) {
 }
 
 LiveScreen::Clock::time_point LiveScreen::captureTime() const {
-  if (isDamaged()) return std::max(lastCapture + interval, damagedSince + kGathering);
+  if (isDamaged()) return std::max(restsUntil(), damagedSince + kGathering);
   return lastCapture + std::max<Clock::duration>(interval, kBlindInterval);
 }
 

@@ -45,6 +45,8 @@ class LiveScreen {
   bool needsCapture() const { return isDamaged() || !watch.tellsDamage() || watch.hasPalette(); }
   bool isDamaged() const { return !damage.isEmpty(); }
   Clock::time_point captureTime() const;
+  /// No capture is due before that, and so what the display says may wait.
+  Clock::time_point restsUntil() const { return lastCapture + interval; }
   /// Brings the picture up to date and adds to `changed` what of it is another one.
   void capture(Clock::time_point now, ChangeList& changed);
 

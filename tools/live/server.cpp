@@ -64,7 +64,7 @@ void Server::printStatistics() const {
 /// Waits for something and does what it asks for; false at the end.
 bool Server::turn() {
   const Clock::time_point before = Clock::now();
-  const bool listens = !(isCapturePending() && screen.isDamaged()) && before >= nextListening;
+  const bool listens = !isCaptureCertain() && before >= nextListening;
   const bool admits = viewers.size() < kMostViewers && !(options.once && viewerCount != 0);
   std::vector<pollfd> polled = {{signals.descriptor(), POLLIN, 0},
                                 {admits ? listener.descriptor() : -1, POLLIN, 0},
@@ -99,7 +99,7 @@ void Server::attend(Clock::time_point now) {
   if (isCapturePending() && now >= screen.captureTime()) {
     listenToScreen(now);
     screen.capture(now, changed);
-    nextListening = screen.captureTime();
+    nextListening = screen.restsUntil();
   }
   screen.expire(now, changed);
   tellChanges();
@@ -109,11 +109,8 @@ void Server::attend(Clock::time_point now) {
 int Server::timeout(Clock::time_point now) const {
   constexpr Clock::time_point kNever = Clock::time_point::max();
   Clock::time_point next = kNever;
-  if (isWatched() && isCapturePending()) {
-    next = screen.captureTime();
-  } else if (now < nextListening) {
-    next = nextListening;
-  }
+  if (isWatched() && isCapturePending()) next = screen.captureTime();
+  if (!isCaptureCertain() && now < nextListening) next = std::min(next, nextListening);
   if (isWatched()) next = std::min(next, screen.nextExpiry().value_or(kNever));
   if (next == kNever) return -1;
   // Rounded up, so that it does not wake just before.

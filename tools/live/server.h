@@ -43,6 +43,8 @@ class Server {
   void tellChanges();
   bool isAnyoneReady() const;
   bool isCapturePending() const { return screen.needsCapture() && isAnyoneReady(); }
+  /// Whether one comes that needs no news of the display.
+  bool isCaptureCertain() const { return screen.isDamaged() && isAnyoneReady(); }
   int timeout(Clock::time_point now) const;
   void printStatistics() const;
 
