@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// How long it takes from a change on an X screen to its arrival at a viewer: a window becomes white,
-// or black again, and a viewer waits for that in one of its pixels.
+// How long it takes from a change on an X screen to its arrival at a viewer: a window becomes
+// white, or black again, and a viewer waits for that in one of its pixels.
 //
 // usage: rfbLatency ADDRESS DISPLAY ENCODING COUNT     (prints: median, 99 % and longest, in ms)
 
