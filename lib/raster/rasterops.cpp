@@ -188,18 +188,6 @@ bool isOneMove(const RowPair& joined, bool bottomUp) {
   return !joined.overlap() || movesUp == bottomUp;
 }
 
-/// Copies rows, given from the top one down, in the order of rows that is asked for.
-void copyInOrder(const RowPair& rows, bool bottomUp) {
-  const bool streams = rasterops_mmx != 0 && rows.bytes >= kMmxMinBytes && rows.rows >= kMmxMinRows;
-  if (!streams) {
-    const RowPair joined = rows.joined();
-    if (isOneMove(joined, bottomUp)) return copyRows(joined);
-  }
-  const RowPair walked = rows.inOrder(bottomUp || rows.gainFromLast());
-  if (streams && !walked.overlap()) return mmxCopyRows(walked);
-  copyRows(walked);
-}
-
 }  // namespace
 
 void copyRows(const RowPair& rows) { kernels().copyRows(rows); }
@@ -213,16 +201,15 @@ void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uin
   kernels().fillRows(rows.joined(), repeatPixel(pixel, bytesPerPixel));
 }
 
-void rectCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
-              uint32 width, uint32 height) {
-  if (height == 0) return;
-  copyInOrder({.dst = dst.pixel(bytesPerPixel),
-               .dstStep = dst.pitch,
-               .src = src.pixel(bytesPerPixel),
-               .srcStep = src.pitch,
-               .bytes = size_t{width} * bytesPerPixel,
-               .rows = height},
-              dst.y > src.y);
+void copyInOrder(const RowPair& rows, bool bottomUp) {
+  const bool streams = rasterops_mmx != 0 && rows.bytes >= kMmxMinBytes && rows.rows >= kMmxMinRows;
+  if (!streams) {
+    const RowPair joined = rows.joined();
+    if (isOneMove(joined, bottomUp)) return copyRows(joined);
+  }
+  const RowPair walked = rows.inOrder(bottomUp || rows.gainFromLast());
+  if (streams && !walked.overlap()) return mmxCopyRows(walked);
+  copyRows(walked);
 }
 
 }  // namespace raster

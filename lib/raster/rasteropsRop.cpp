@@ -246,8 +246,9 @@ void ropRows(const RowPair& rows, uint32 bytesPerPixel, uint32 rop, Walk walk) {
   kernel[rop](rows);
 }
 
-void rectRopCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
-                 uint32 rop, uint32 width, uint32 height) {
+/// Raster_RectROPcopy, to be part of its callers: the corners then need no memory.
+HWY_INLINE void ropCopy(const Corner<uint8>& dst, const Corner<const uint8>& src,
+                        uint32 bytesPerPixel, uint32 rop, uint32 width, uint32 height) {
   if (rop == kRopCopy) return rectCopy(dst, src, bytesPerPixel, width, height);
   const bool unsupported = bytesPerPixel < 1 || bytesPerPixel > 4;
   // Two calls, as each walk has a line of its own in the message.
@@ -270,6 +271,11 @@ void rectRopCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint3
            .bytes = size_t{width} * bytesPerPixel,
            .rows = height},
           bytesPerPixel, rop, walk);
+}
+
+void rectRopCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
+                 uint32 rop, uint32 width, uint32 height) {
+  ropCopy(dst, src, bytesPerPixel, rop, width, height);
 }
 
 }  // namespace raster
@@ -301,8 +307,8 @@ void Raster_RectROPcopy(uint8* dst, int32 dstPitch, const uint8* src, int32 srcP
                         uint32 bytesPerPixel, uint32 srcX, uint32 srcY, uint32 rop, uint32 dstX,
                         uint32 dstY, uint32 width, uint32 height) {
   using namespace raster;
-  rectRopCopy({dst, pitchOf(dstPitch), dstX, dstY}, {src, pitchOf(srcPitch), srcX, srcY},
-              bytesPerPixel, rop, width, height);
+  ropCopy({dst, pitchOf(dstPitch), dstX, dstY}, {src, pitchOf(srcPitch), srcX, srcY}, bytesPerPixel,
+          rop, width, height);
 }
 
 }  // extern "C"

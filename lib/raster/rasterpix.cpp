@@ -26,10 +26,7 @@ using Copy = std::remove_const_t<decltype(kCopy)>;
 constexpr size_t kBlockBytes = 1024;
 
 /// Combines a row with a source of the same length.
-template <class Rop> void combineShortRow(uint8* dst, const uint8* src, size_t bytes) {
-  combineInOrder<Rop, Walk::kToRight>(dst, src, bytes);
-}
-template <class Rop> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+template <class Rop, bool kFar> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   combineInOrder<Rop, Walk::kToRight>(dst, src, bytes);
 }
 
@@ -40,9 +37,9 @@ void repeatShortRow(Bytes /*d*/, uint8* dst, const uint8* src, size_t period, si
 }
 
 /// Combines a row with a pattern that repeats after `period` bytes.
-template <class Rop>
+template <class Rop, bool kFar>
 void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
-                    size_t /*lastPhase*/, bool /*far*/) {
+                    size_t /*lastPhase*/) {
   for (size_t i = 0; i != bytes; i += std::min(bytes - i, period))
     combineInOrder<Rop, Walk::kToRight>(dst + i, pattern, std::min(bytes - i, period));
 }
@@ -54,15 +51,15 @@ constexpr size_t kBlockBytes = 128;
 static_assert(kBlockBytes >= 2 * kLanes<Bytes>);
 
 /// Combines whole blocks from `dst` to less than a block before `end` with one that repeats.
-/// Returns where it stopped. The block stays in registers. Far memory is fetched ahead.
-template <class Rop>
-HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* pattern, bool far) {
+/// Returns where it stopped. The block stays in registers. With kFar, memory is fetched ahead.
+template <class Rop, bool kFar>
+HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* pattern) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   hn::Vec<Bytes> block[kBlockBytes / n];
   for (size_t k = 0; k < kBlockBytes; k += n) block[k / n] = loadLanes(d, pattern + k);
   for (; static_cast<size_t>(end - dst) >= kBlockBytes; dst += kBlockBytes) {
-    for (size_t k = 0; far && k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
+    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
     for (size_t k = 0; k < kBlockBytes; k += n)
       storeLanes(d, combinedWith<Rop>(d, block[k / n], dst + k), dst + k);
   }
@@ -72,9 +69,9 @@ HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* patte
 /// Combines a row of at least a vector with a pattern that repeats after `period` bytes, at least
 /// a block, and is there for another block. The byte `lastPhase` of the pattern falls on the start
 /// of the row's last vector.
-template <class Rop>
+template <class Rop, bool kFar>
 HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
-                               size_t lastPhase, bool far) {
+                               size_t lastPhase) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   const auto first = combined<Rop>(d, pattern, dst);
@@ -85,9 +82,9 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
   const uint8* const wrap = pattern + period;
   const auto left = [&] { return static_cast<size_t>(end - at); };
   if (period == kBlockBytes && left() >= kBlockBytes + n)
-    at = combineBlocks<Rop>(at, end - n, source, far);
+    at = combineBlocks<Rop, kFar>(at, end - n, source);
   for (; left() > kBlockBytes + n; at += kBlockBytes) {
-    for (size_t k = 0; far && k < kBlockBytes; k += kCacheLine) fetchAhead(at + k);
+    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(at + k);
     for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, source + k, at + k);
     source += kBlockBytes;
     if (source >= wrap) source -= period;
@@ -98,17 +95,14 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
   storeLanes(d, last, end - n);
 }
 
-/// Combines a row of at most two vectors with a source of the same length.
-template <class Rop> HWY_INLINE void combineShortRow(uint8* dst, const uint8* src, size_t bytes) {
-  withShortRow(Bytes(), bytes, CombinedAt<Rop>(), [&](auto row) HWY_ATTR { row(dst, src, bytes); });
-}
-
-/// Combines a row, where there may be many, with a source of the same length.
-template <class Rop> HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+/// Combines a row with a source of the same length.
+template <class Rop, bool kFar>
+HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   if (bytes > kLanes<Bytes>) {
-    combinePeriods<Rop>(dst, src, bytes, bytes, bytes - kLanes<Bytes>, true);
+    combinePeriods<Rop, kFar>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
   } else {
-    combineShortRow<Rop>(dst, src, bytes);
+    withShortRow(Bytes(), bytes, CombinedAt<Rop>(),
+                 [&](auto row) HWY_ATTR { row(dst, src, bytes); });
   }
 }
 
@@ -144,18 +138,23 @@ HWY_INLINE void repeatShortRow(D d, uint8* dst, const uint8* src, size_t period,
 
 #endif
 
-/// Combines rows with those of the pixmap, part by part: a row of the pixmap falls on a row of the
-/// destination from its phase on and over and over.
+/// Calls row(dst, src, bytes) for the parts of a row that a pixmap row falls on, from its phase on
+/// and over and over.
+template <class Row>
+HWY_INLINE void tileRow(uint8* dst, const uint8* src, size_t bytes, size_t period, size_t phase,
+                        const Row& row) {
+  size_t i = std::min(bytes, period - phase);
+  row(dst, src + phase, i);
+  for (; i != bytes; i += std::min(bytes - i, period))
+    row(dst + i, src, std::min(bytes - i, period));
+}
+
 template <class Rop> void tileRows(const TileRows& t) {
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   for (uint32 y = t.height; y != 0; --y, dst = nextRow(dst, t.dstStep)) {
-    const uint8* const src = rowAt(t.src, t.srcStep, srcY, 0, 0);
-    size_t phase = t.phase;
-    for (size_t i = 0, part = 0; i != t.bytes; i += part, phase = 0) {
-      part = std::min(t.bytes - i, t.period - phase);
-      combineRow<Rop>(dst + i, src + phase, part);
-    }
+    tileRow(dst, rowAt(t.src, t.srcStep, srcY, 0, 0), t.bytes, t.period, t.phase,
+            combineRow<Rop, true>);
     srcY = srcY + 1 == t.srcRows ? 0 : srcY + 1;
   }
 }
@@ -215,57 +214,36 @@ HWY_NOINLINE void widenRows(const uint8* src, intptr_t srcStep, size_t period, u
     copyRows(wide + i, step, src, srcStep, std::min(period, std::max(end - i, n)), rows);
 }
 
-/// Destination rows, and the widened rows that repeat in them: `y` is the first one's number.
-struct WideTiles {
-  uint8* dst;
-  intptr_t dstStep;
-  size_t bytes;
-  uint32 height;
-  const uint8* wide;
-  size_t wideStep;
-  uint32 wideRows;
-  uint32 y;
-  size_t period;
-  bool far;
-};
-
-template <class Rop> void combineWideRows(const WideTiles& t) {
+/// Combines rows with `wideRows` widened ones, from the one with the number `y` on.
+template <class Rop, bool kFar>
+HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, uint32 height,
+                                  const uint8* wide, size_t wideStep, uint32 wideRows, uint32 y,
+                                  size_t period) {
   constexpr size_t n = kLanes<Bytes>;
-  const size_t bytes = t.bytes;
-  const size_t period = t.period;
-  const size_t wideStep = t.wideStep;
-  const bool far = t.far;
-  const uint8* const end = t.wide + t.wideRows * wideStep;
-  const uint8* pattern = t.wide + t.y * wideStep;
+  const uint8* const end = wide + wideRows * wideStep;
+  const uint8* pattern = wide + y * wideStep;
   const size_t lastPhase = bytes <= n ? 0 : period == bytes ? bytes - n : (bytes - n) % period;
-  uint8* dst = t.dst;
-  for (uint32 y = t.height; y != 0; --y, dst = nextRow(dst, t.dstStep)) {
+  for (; height != 0; --height, dst = nextRow(dst, dstStep)) {
     if (bytes <= n) {
-      combineShortRow<Rop>(dst, pattern, bytes);
+      combineRow<Rop, kFar>(dst, pattern, bytes);
     } else {
-      combinePeriods<Rop>(dst, pattern, bytes, period, lastPhase, far);
+      combinePeriods<Rop, kFar>(dst, pattern, bytes, period, lastPhase);
     }
     pattern += wideStep;
-    if (pattern == end) pattern = t.wide;
+    if (pattern == end) pattern = wide;
   }
 }
 
-/// By operation; null for those that do not read the source.
-using CombineWideRows = void (*)(const WideTiles& t);
-constexpr auto kCombineWideRows = ropTable([](auto rop) -> CombineWideRows {
-  if constexpr (kReadsSrc<decltype(rop)>) return combineWideRows<decltype(rop)>;
-  return nullptr;
-});
-
 /// Widens all pixmap rows, or as many as there is room for before they are used.
-void tileWidened(const TileRows& t, uint32 rop) {
+template <class Rop> void tileWidened(const TileRows& t) {
   alignas(kLongestVector) uint8 buffer[kBufferBytes];
   const WideRows w = wideRowsOf(t);
   // Rows that are used only once or twice are not to leave the innermost cache before that.
   const size_t bytes = t.height / 2 >= t.srcRows ? kBufferBytes : kBufferBytes / 4;
   const auto room = static_cast<uint32>((bytes - kLongestVector) / w.step);
   const bool all = t.srcRows <= room && t.srcRows <= t.height;
-  const bool far = isFar(t.bytes, t.height);
+  const auto combineRows =
+      isFar(t.bytes, t.height) ? combineWideRows<Rop, true> : combineWideRows<Rop, false>;
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   uint32 height = t.height;
@@ -276,8 +254,8 @@ void tileWidened(const TileRows& t, uint32 rop) {
     // The rows of the buffer lie to vector boundaries as those of the destination do.
     uint8* wide = buffer + (reinterpret_cast<uintptr_t>(dst) - w.start) % kLongestVector;
     widenRows(rowAt(t.src, t.srcStep, first, 0, 0), t.srcStep, t.period, rows, w, wide);
-    kCombineWideRows[rop]({dst, t.dstStep, t.bytes, slice, wide + w.start, w.step, rows,
-                           srcY - first, w.period, far});
+    combineRows(dst, t.dstStep, t.bytes, slice, wide + w.start, w.step, rows, srcY - first,
+                w.period);
     dst = rowAt(dst, t.dstStep, slice, 0, 0);
     srcY = srcY + slice == t.srcRows ? 0 : srcY + slice;
     height -= slice;
@@ -288,7 +266,11 @@ constexpr auto kTileRows = ropTable([](auto rop) -> TileKernels::Tile {
   if constexpr (kReadsSrc<decltype(rop)>) return tileRows<decltype(rop)>;
   return nullptr;
 });
-constexpr TileKernels kKernels = {kTileRows.data(), tileWidened};
+constexpr auto kTileWidened = ropTable([](auto rop) -> TileKernels::Tile {
+  if constexpr (kReadsSrc<decltype(rop)>) return tileWidened<decltype(rop)>;
+  return nullptr;
+});
+constexpr TileKernels kKernels = {kTileRows.data(), kTileWidened.data()};
 
 }  // namespace
 
@@ -335,8 +317,9 @@ struct Tiling {
            !__builtin_mul_overflow(pixmapWidth, bytesPerPixel, &period);
   }
 
-  /// The rows of the whole rectangle, where they are plain.
-  TileRows rows() const {
+  /// The rows of the whole rectangle, where they are plain, from the pixmap pixel that falls on its
+  /// first one.
+  TileRows rows(uint32 phaseX, uint32 phaseY) const {
     return {.dst = dst.pixel(bytesPerPixel),
             .dstStep = dst.pitch,
             .bytes = size_t{width} * bytesPerPixel,
@@ -344,9 +327,9 @@ struct Tiling {
             .src = pixmap.base,
             .srcStep = pixmap.pitch,
             .srcRows = pixmapHeight,
-            .srcY = pixmap.y,
+            .srcY = phaseY,
             .period = size_t{pixmapWidth} * bytesPerPixel,
-            .phase = size_t{pixmap.x} * bytesPerPixel};
+            .phase = size_t{phaseX} * bytesPerPixel};
   }
 };
 
@@ -363,14 +346,15 @@ void ropBlock(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 b
           bytesPerPixel, rop, Walk::kToRight);
 }
 
-/// Cuts the rectangle into blocks that do not cross an edge of the pixmap.
-void tileBlocks(const Tiling& t, uint32 rop) {
+/// Cuts the rectangle into blocks that do not cross an edge of the pixmap. Pixmap pixel
+/// (phaseX, phaseY) falls on the rectangle's first one.
+void tileBlocks(const Tiling& t, uint32 phaseX, uint32 phaseY, uint32 rop) {
   Corner<uint8> dst = t.dst;
-  Corner<const uint8> src = t.pixmap;
+  Corner<const uint8> src = {t.pixmap.base, t.pixmap.pitch, phaseX, phaseY};
   for (uint32 h = t.height; h != 0; src.y = 0) {
     const uint32 band = std::min(t.pixmapHeight - src.y, h);
     dst.x = t.dst.x;
-    src.x = t.pixmap.x;
+    src.x = phaseX;
     for (uint32 w = t.width; w != 0; src.x = 0) {
       const uint32 chunk = std::min(t.pixmapWidth - src.x, w);
       ropBlock(dst, src, t.bytesPerPixel, rop, chunk, band);
@@ -398,18 +382,18 @@ bool isWorthWidening(const TileRows& t) {
   return t.height > t.srcRows || t.bytes > 2 * t.period;
 }
 
-void tile(Tiling t, uint32 rop) {
+void tile(const Tiling& t, uint32 rop) {
   // By a test of its own, first of all: a compiler may divide later, when the result is wanted.
   if (t.pixmapWidth == 0 || t.pixmapHeight == 0) divisionByZero();
-  t.pixmap.x %= t.pixmapWidth;
-  t.pixmap.y %= t.pixmapHeight;
+  const uint32 phaseX = t.pixmap.x % t.pixmapWidth;
+  const uint32 phaseY = t.pixmap.y % t.pixmapHeight;
   if (t.bytesPerPixel < 1 || t.bytesPerPixel > 4) unsupportedPixelSize(kSource);
   if (rop >= kRopCount || rop == kRopNoop || t.width == 0 || t.height == 0) return;
-  const TileRows rows = t.rows();
+  const TileRows rows = t.rows(phaseX, phaseY);
   if (!t.hasPlainRows() || !isOrderFree(rows) || !ropReadsSource(rop)) {
-    tileBlocks(t, rop);
+    tileBlocks(t, phaseX, phaseY, rop);
   } else if (isWorthWidening(rows)) {
-    kernels().tileWidened(rows, rop);
+    kernels().tileWidened[rop](rows);
   } else {
     kernels().tile[rop](rows);
   }

@@ -24,9 +24,22 @@ void copyRows(const RowPair& rows);
 void rectFill(uint8* fb, intptr_t pitch, uint32 bytesPerPixel, uint32 pixel, uint32 x, uint32 y,
               uint32 width, uint32 height);
 
+/// Copies rows, given from the top one down, as Raster_RectCopy does: from the last one up where
+/// bottomUp is set.
+void copyInOrder(const RowPair& rows, bool bottomUp);
+
 /// As Raster_RectCopy.
-void rectCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
-              uint32 width, uint32 height);
+inline void rectCopy(const Corner<uint8>& dst, const Corner<const uint8>& src, uint32 bytesPerPixel,
+                     uint32 width, uint32 height) {
+  if (height == 0) return;
+  copyInOrder({.dst = dst.pixel(bytesPerPixel),
+               .dstStep = dst.pitch,
+               .src = src.pixel(bytesPerPixel),
+               .srcStep = src.pitch,
+               .bytes = size_t{width} * bytesPerPixel,
+               .rows = height},
+              dst.y > src.y);
+}
 
 }  // namespace raster
 

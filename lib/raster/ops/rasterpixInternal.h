@@ -24,14 +24,15 @@ struct TileRows {
   size_t phase;
 };
 
-/// What the kernels of one instruction-set level offer, for operations that read the source. The
-/// order of the pixels must not matter.
+/// What the kernels of one instruction-set level offer.
 struct TileKernels {
-  /// For any pixmap, straight from its rows; by operation.
+  /// By operation, null for those that do not read the source. The order of the pixels must not
+  /// matter.
   using Tile = void (*)(const TileRows& rows);
+  /// For any pixmap, straight from its rows.
   const Tile* tile;
   /// For pixmap rows of less than 1024 bytes, which are first repeated in a buffer.
-  void (*tileWidened)(const TileRows& rows, uint32 rop);
+  const Tile* tileWidened;
 };
 
 }  // namespace raster
