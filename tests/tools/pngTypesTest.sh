@@ -56,14 +56,14 @@ kind() {
   ok info "$1.png"
   says "$1.png: PNG, 37x23 pixels, $2"
 }
-kind g1 'grey, 1 bits per sample'
+kind g1 'grey, 1 bit per sample'
 kind g2 'grey, 2 bits per sample'
 kind g4 'grey, 4 bits per sample'
 kind g8 'grey, 8 bits per sample'
 kind g16i 'grey, 16 bits per sample, interlaced'
 kind rgb8i 'RGB, 8 bits per sample, interlaced'
 kind rgb16 'RGB, 16 bits per sample'
-kind p2 'palette, 1 bits per sample'
+kind p2 'palette, 1 bit per sample'
 kind p4 'palette, 2 bits per sample'
 kind p16 'palette, 4 bits per sample'
 kind p200i 'palette, 8 bits per sample, interlaced'
@@ -75,7 +75,7 @@ kind gt8 'grey, 8 bits per sample, transparency'
 kind rgbt16i 'RGB, 16 bits per sample, transparency, interlaced'
 kind rgbt8 'RGB, 8 bits per sample, transparency'
 ok info pa.png
-grep -q 'palette, . bits per sample, transparency' out || fail "no palette with transparency: $(cat out)"
+grep -q 'palette, . bits\? per sample, transparency' out || fail "no palette with transparency: $(cat out)"
 
 # sees PNG: its colours at 8 bits in ./colours.pnm, its alpha in ./alpha.pgm.
 sees() {
