@@ -172,7 +172,7 @@ void blendThrough(uint8* stage, BlendRect rect, uint32 bytes, const BlendKernel&
 uint32 rowsAtOnce(const BlendRect& rect, uint32 bytes) {
   const size_t span = rect.width * bytes;
   const auto step = static_cast<size_t>(rect.dstStep < 0 ? -rect.dstStep : rect.dstStep);
-  if (span > kStageBytes || step < span) return 1;
+  if (span == 0 || span > kStageBytes || step < span) return 1;
   return static_cast<uint32>(kStageBytes / stageStep(span));
 }
 
