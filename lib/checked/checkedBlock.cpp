@@ -33,12 +33,14 @@ RasterView viewOf(const RasterBlockInfo& info, uint8* data) {
   return {data, bytes, info.pitch, info.width, info.height, depthOf(info.bpp), info.bpp};
 }
 
-/// Whether a header makes sense: it describes pixels, and only those of 32 bits have a code.
+/// Whether a header makes sense: it describes pixels, and only those of 32 bits have a code. More
+/// of them than any memory holds are not its fault: then a row is looked at.
 bool isHeader(const RasterBlockInfo& info) {
+  RasterBlockInfo fitting = info;
+  if (bytesOf(info) > SIZE_MAX) fitting.height = 1;
   uint8 anything = 0;
-  const RasterView view = viewOf(info, &anything);
-  const bool isTooLarge = bytesOf(info) > SIZE_MAX;  // for memory, not for a header
-  return (isTooLarge || checkPixels(&view) == RASTER_STATUS_OK) &&
+  const RasterView view = viewOf(fitting, &anything);
+  return info.height <= INT32_MAX && checkPixels(&view) == RASTER_STATUS_OK &&
          (info.codeWords == 0 || info.bpp == 32);
 }
 
