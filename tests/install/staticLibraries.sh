@@ -20,5 +20,5 @@ for program in consumerC consumerCpp consumerChecked; do stands "$work/build/$pr
 
 command -v pkg-config >/dev/null || exit 0
 flags() { PKG_CONFIG_PATH=$packages pkg-config --static "$@" raster-checked; }
-$CC -std=c11 "$here/consumerChecked.c" $(flags --cflags) $(flags --libs) $LDFLAGS -o "$work/consumer"
+$CC -std=c11 "$here/consumerChecked.c" $(flags --cflags) $(flags --libs) $LDFLAGS ${PNG_FOLDER:+-L"$PNG_FOLDER"} -o "$work/consumer"
 stands "$work/consumer"
