@@ -49,9 +49,14 @@ startServing --listen 127.0.0.1:0
 stopServing
 
 if have xterm; then
-  start xterm -geometry 80x10+300+150 -e sh -c 'echo >ready; read line; echo "$line" >typed; sleep 86400'
+  # Until the window has the keys, ends of lines that are pressed go to nobody; those that came are skipped.
+  start xterm -geometry 80x10+300+150 -e sh -c 'echo >ready; read line; echo >hears
+    while [ -z "$line" ]; do read line; done; echo "$line" >typed; sleep 86400'
   startServing --listen 127.0.0.1:0 --input
   waitFor [ -s ready ]
+  isHeard() { "$viewer" "$address" --pointer 350,200 --type '
+'; [ -s hears ]; }
+  waitFor isHeard
   "$viewer" "$address" --pointer 350,200 --type 'Hello, World (42)
 '
   waitFor [ -s typed ]
