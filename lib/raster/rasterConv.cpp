@@ -5,6 +5,7 @@
 #include <type_traits>
 
 #include "host/panicPlace.h"
+#include "vector/kernelChoice.h"
 #include "raster.h"
 #include "convert/rasterConvInternal.h"
 #include "ops/rasteropsInternal.h"
@@ -109,7 +110,7 @@ void copyPixels(const Rectangle& r, int32 depth) {
 /// Runs the kernel for a pair of formats, given by their indices in the table.
 void convertRectangle(const Rectangle& r, size_t srcIndex, uint32 srcBytes, size_t dstIndex,
                       uint32 dstBytes, const uint32* palette) {
-  const ConvertKernel kernel = convertKernels()[srcIndex][dstIndex];
+  const ConvertKernel kernel = chosenKernels<lookUpConvert>()[srcIndex][dstIndex];
   if (kernel == nullptr) notReached(kSource);
   if (r.width == 0) return;
   // Deliberate: 2- and 4-byte pixels are indexed as whole pixels, so the rounded pitch counts for

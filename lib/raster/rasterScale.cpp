@@ -8,6 +8,7 @@
 #include <limits>
 
 #include "host/firstTime.h"
+#include "vector/kernelChoice.h"
 #include "message.h"
 #include "raster.h"
 #include "scale/rasterScaleInternal.h"
@@ -126,7 +127,7 @@ bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth
   job.smooth = dstDepth > 23 && smooth != 0 && job.dstBytesPerPixel <= 4;
   job.depthsDiffer = src.depth != dst.depth;
   job.sizesDiffer = srcBpp != dstBpp;
-  raster::RasterScaleCore(job);
+  raster::chosenKernels<raster::lookUpScale>().draw(job);
   return true;
 }
 

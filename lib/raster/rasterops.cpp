@@ -5,170 +5,16 @@
 // A public function turns its arguments into rows (frameBuffer.h) and hands them to one kernel per
 // call, chosen for the processor; a kernel walks the rows and runs one row loop (rows-inl.h).
 
-#undef HWY_TARGET_INCLUDE
-#define HWY_TARGET_INCLUDE "raster/rasterops.cpp"
-#include "vector/hwySetup.h"
-#include "hwy/foreach_target.h"
-#include "hwy/highway.h"
-
-#include "vector/byteRows-inl.h"
-#include "vector/pixelPattern-inl.h"
-#include "ops/rasteropsInternal.h"
-#include "vector/rows-inl.h"
-
-HWY_BEFORE_NAMESPACE();
-namespace raster::HWY_NAMESPACE {
-namespace {
-
-#if HWY_TARGET == HWY_SCALAR
-
-// Rows without bytes may have no address: the C library is not told of them.
-
-void fillRows(const Rows& rows, const PixelWords& pixels) {
-  if (rows.bytes == 0) return;
-  forRows(rows, [&](uint8* row) {
-    size_t i = 0;
-    for (; rows.bytes - i >= sizeof pixels; i += sizeof pixels)
-      memcpy(row + i, &pixels, sizeof pixels);
-    memcpy(row + i, &pixels, rows.bytes - i);
-  });
-}
-
-void copyRows(const RowPair& rows) {
-  if (rows.bytes == 0) return;
-  forRows(rows, [&](uint8* dst, const uint8* src) { memmove(dst, src, rows.bytes); });
-}
-
-#else
-
-using Bytes = hn::ScalableTag<uint8>;
-
-/// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
-/// The end of a row is stored as one vector that overlaps what is there already.
-template <class D, class V = hn::Vec<D>>
-HWY_INLINE void fillLongRows(D d, const Rows& rows, V first, V second, V third, V last) {
-  constexpr size_t n = kLanes<D>;
-  const size_t bytes = rows.bytes;  // read here, as a store to a pixel might change it
-  forRows(rows, [&](uint8* row) HWY_ATTR {
-    size_t i = 0;
-    for (; bytes - i >= 3 * n; i += 3 * n) {
-      hn::StoreU(first, d, row + i);
-      hn::StoreU(second, d, row + i + n);
-      hn::StoreU(third, d, row + i + 2 * n);
-    }
-    if (bytes - i >= n) hn::StoreU(first, d, row + i);
-    if (bytes - i >= 2 * n) hn::StoreU(second, d, row + i + n);
-    hn::StoreU(last, d, row + bytes - n);
-  });
-}
-
-/// Fills with words that are all the same.
-HWY_INLINE void fillWithWord(const Rows& rows, uint32 word) {
-  const auto fill = [&](auto d) HWY_ATTR __attribute__((always_inline)) {
-    const auto same = hn::BitCast(d, hn::Set(hn::Repartition<uint32, decltype(d)>(), word));
-    fillLongRows(d, rows, same, same, same, same);
-  };
-  const bool filled = withLargestVector<sizeof word>(Bytes(), rows.bytes, fill);
-  if (!filled && rows.bytes != 0)
-    forRows(rows, [&](uint8* row) HWY_ATTR { memcpy(row, &word, rows.bytes); });
-}
-
-HWY_NOINLINE void fillWithPattern(const Rows& rows, const PixelWords& pixels) {
-  const Bytes d;
-  const size_t n = hn::Lanes(d);
-  const size_t bytes = rows.bytes;
-  const PixelPattern pattern = patternOf(pixels);
-  if (bytes >= n) {
-    const size_t lastPhase = (bytes - n) % sizeof pixels;
-    fillLongRows(d, rows, hn::LoadU(d, pattern.bytes), hn::LoadU(d, pattern.bytes + n),
-                 hn::LoadU(d, pattern.bytes + 2 * n), hn::LoadU(d, pattern.bytes + lastPhase));
-    return;
-  }
-  const auto patternAt = [&](auto tag, const uint8* /*src*/, const uint8* /*dst*/, size_t at)
-                             HWY_ATTR { return loadLanes(tag, pattern.bytes + at); };
-  withShortRow(d, bytes, patternAt, [&](auto row) HWY_ATTR {
-    forRows(rows, [&](uint8* dst) HWY_ATTR { row(dst, nullptr, bytes); });
-  });
-}
-
-void fillRows(const Rows& rows, const PixelWords& pixels) {
-  const uint32* const word = pixels.word;
-  if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(rows, pixels);
-  fillWithWord(rows, word[0]);
-}
-
-/// The lanes of the source.
-constexpr auto kCopied = [](auto d, const uint8* src, const uint8* /*dst*/, size_t at)
-                             HWY_ATTR { return loadLanes(d, src + at); };
-
-/// As memmove, of more than a vector.
-void moveRow(uint8* dst, const uint8* src, size_t bytes) {
-  const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
-  if (ahead >= bytes) {
-    storeLongRow<Walk::kToRight>(dst, src, bytes, kCopied);
-  } else {
-    storeLongRow<Walk::kToLeft>(dst, src, bytes, kCopied);
-  }
-}
-
-// Rows up to here are moved by moveRow, which is faster than the C library's memmove for them: in
-// the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
-constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 32 * 1024;
-
-HWY_NOINLINE void copyLongRows(const RowPair& rows) {
-  const size_t bytes = rows.bytes;
-  forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
-    if (bytes <= kMaxOwnBytes) {
-      moveRow(dst, src, bytes);
-    } else {
-      memmove(dst, src, bytes);
-    }
-  });
-}
-
-// Two functions, as the short rows need nothing from the stack and so no alignment of it.
-void copyRows(const RowPair& rows) {
-  const size_t bytes = rows.bytes;
-  if (bytes > 2 * kLanes<Bytes>) return copyLongRows(rows);
-  withShortRow(Bytes(), bytes, kCopied, [&](auto copy) HWY_ATTR {
-    forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { copy(dst, src, bytes); });
-  });
-}
-
-#endif
-
-void fillAlphaRows(const Rows& rows, uint32 alphaBits) {
-  const size_t pixels = rows.bytes / 4;
-  forRows(rows, [&](uint8* row) HWY_ATTR {
-    forLanes(hn::ScalableTag<uint32>(), pixels, [&](auto d, size_t x) HWY_ATTR {
-      const auto color = hn::And(loadLanes(d, row + 4 * x), hn::Set(d, 0x00FFFFFFu));
-      storeLanes(d, hn::Or(color, hn::Set(d, alphaBits)), row + 4 * x);
-    });
-  });
-}
-
-constexpr RasteropsKernels kKernels = {fillRows, copyRows, fillAlphaRows};
-
-}  // namespace
-
-const RasteropsKernels* rasteropsKernels() { return &kKernels; }
-
-}  // namespace raster::HWY_NAMESPACE
-HWY_AFTER_NAMESPACE();
-
-#if HWY_ONCE
-
 #include "vector/kernelChoice.h"
 #include "ops/mmxCopy.h"
 #include "host/panicPlace.h"
 #include "raster.h"
+#include "ops/rasteropsInternal.h"
 
 uint32 rasterops_mmx = 0;  // C linkage: raster.h
 
 namespace raster {
 namespace {
-
-HWY_EXPORT(rasteropsKernels);
 
 constexpr char kSource[] = "lib/raster/rasterops";
 
@@ -176,8 +22,7 @@ constexpr char kSource[] = "lib/raster/rasterops";
 constexpr size_t kMmxMinBytes = 32;
 constexpr uint32 kMmxMinRows = 16;
 
-const RasteropsKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(rasteropsKernels)(); }
-const RasteropsKernels& kernels() { return chosenKernels<lookUpKernels>(); }
+const RasteropsKernels& kernels() { return chosenKernels<lookUpRasterops>(); }
 
 /// Whether one move of all bytes does what a walk of the rows does: there is nothing between them,
 /// and where both sides overlap the rows are walked away from each other, as memmove does.
@@ -238,5 +83,3 @@ void Raster_RectFillAlpha(uint8* fb, uint32 pitch, uint8 alpha, uint32 x, uint32
 }
 
 }  // extern "C"
-
-#endif

@@ -26,6 +26,9 @@ struct RasterCompKernels {
   CompareUnderMask colorBits;   ///< the bits of the mask count, but none of a fourth byte
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const RasterCompKernels* lookUpComp();
+
 }  // namespace raster
 
 #endif

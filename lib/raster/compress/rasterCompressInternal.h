@@ -25,6 +25,9 @@ struct CompressKernels {
   size_t (*decode)(const uint8* code, size_t codeWords, uint8* dst, size_t room);
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const CompressKernels* lookUpCompress();
+
 }  // namespace raster
 
 #endif

@@ -28,8 +28,8 @@ using ConvertKernelsFrom = std::array<ConvertKernel, std::tuple_size_v<Destinati
 constexpr size_t kPaletteSource = std::tuple_size_v<SourceFormats>;
 using ConvertKernels = std::array<ConvertKernelsFrom, kPaletteSource + 1>;
 
-/// The kernels of the level that the process runs at.
-const ConvertKernels& convertKernels();
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const ConvertKernels* lookUpConvert();
 
 }  // namespace raster
 

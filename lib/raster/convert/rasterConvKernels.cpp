@@ -166,25 +166,21 @@ constexpr ConvertKernels kKernels = allKernels(std::make_index_sequence<kPalette
 
 }  // namespace
 
-const ConvertKernels* levelConvertKernels() { return &kKernels; }
+const ConvertKernels* convertKernels() { return &kKernels; }
 
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "vector/kernelChoice.h"
-
 namespace raster {
 namespace {
 
-HWY_EXPORT(levelConvertKernels);
-
-const ConvertKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(levelConvertKernels)(); }
+HWY_EXPORT(convertKernels);
 
 }  // namespace
 
-const ConvertKernels& convertKernels() { return chosenKernels<lookUpKernels>(); }
+const ConvertKernels* lookUpConvert() { return HWY_DYNAMIC_DISPATCH(convertKernels)(); }
 
 }  // namespace raster
 

@@ -17,6 +17,9 @@ struct RasteropsKernels {
   void (*fillAlphaRows)(const Rows& rows, uint32 alphaBits);
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const RasteropsKernels* lookUpRasterops();
+
 /// Copies rows from the first one to the last one, each as memmove does.
 void copyRows(const RowPair& rows);
 

@@ -39,6 +39,16 @@ struct RopKernels {
   const RopRowsKernel* rows[2][2];
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const RopKernels* lookUpRop();
+
+/// An operation (0 to 15) on one pixel.
+uint32 ropOnPixel(uint32 rop, uint32 s, uint32 d);
+
+/// The walk as it is defined, of an operation that reads the source: units of 1, 2 or 4 bytes, one
+/// after the other.
+void walkRopRows(const RowPair& rows, uint32 unit, uint32 rop, Walk walk);
+
 /// Applies operation `rop` (0 to 15) to rows of pixels of `bytesPerPixel` (1 to 4) bytes, given
 /// from the leftmost byte of the first row to be processed. The result is that of reading,
 /// combining and storing one pixel after the other (one byte after the other in pixels of three),

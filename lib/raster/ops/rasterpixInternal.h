@@ -35,6 +35,9 @@ struct TileKernels {
   const Tile* tileWidened;
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const TileKernels* lookUpTile();
+
 }  // namespace raster
 
 #endif

@@ -34,6 +34,9 @@ struct BitsKernels {
   Expand stencil[4];
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const BitsKernels* lookUpBits();
+
 /// As Raster_BitsToPixels.
 void bitsToPixels(const uint8* bits, uint32 bitsPitch, uint8* dst, uint32 dstPitch,
                   int32 bytesPerPixel, int32 width, int32 height, uint32 foreground,

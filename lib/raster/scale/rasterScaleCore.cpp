@@ -219,18 +219,14 @@ HWY_AFTER_NAMESPACE();
 
 #if HWY_ONCE
 
-#include "vector/kernelChoice.h"
-
 namespace raster {
 namespace {
 
 HWY_EXPORT(scaleKernels);
 
-const ScaleKernels* lookUpKernels() { return HWY_DYNAMIC_DISPATCH(scaleKernels)(); }
-
 }  // namespace
 
-void RasterScaleCore(const ScaleJob& job) { chosenKernels<lookUpKernels>().draw(job); }
+const ScaleKernels* lookUpScale() { return HWY_DYNAMIC_DISPATCH(scaleKernels)(); }
 
 }  // namespace raster
 

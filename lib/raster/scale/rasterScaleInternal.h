@@ -117,11 +117,11 @@ struct WeightedRows {
 
 /// What the scaler of one instruction-set level offers.
 struct ScaleKernels {
-  void (*draw)(const ScaleJob& job);
+  void (*draw)(const ScaleJob& job);  ///< the job's rectangle
 };
 
-/// Draws the job's rectangle.
-void RasterScaleCore(const ScaleJob& job);
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const ScaleKernels* lookUpScale();
 
 }  // namespace raster
 

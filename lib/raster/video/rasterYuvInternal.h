@@ -38,6 +38,9 @@ struct YuvKernels {
   ConvertYuv convert[3][4];  // YUY2, UYVY, YV12; 15, 16, 24, 32 bits
 };
 
+/// The kernels of the level that the process runs at, found anew by every call (kernelChoice.h).
+const YuvKernels* lookUpYuv();
+
 }  // namespace raster
 
 #endif
