@@ -7,6 +7,7 @@
 
 #include "fuzzing.h"
 #include "imageUtil.h"
+#include "support/viewImages.h"
 
 using fuzz::Bytes;
 using fuzz::Choices;
@@ -78,14 +79,8 @@ void scaleCase(Choices& c) {
 }
 
 ImageUtilImage imageOf(Choices& c, const RasterView& view) {
-  ImageUtilImage image = {};
-  image.width = view.width;
-  image.height = view.height;
-  image.depth = view.depth;
-  image.bpp = view.bpp;
-  image.bytesPerLine = view.pitch;
+  ImageUtilImage image = tests::imageOn(view);
   image.flags = c.below(2);
-  image.data = view.data;
   return image;
 }
 

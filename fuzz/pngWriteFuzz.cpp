@@ -8,6 +8,7 @@
 
 #include "fuzzing.h"
 #include "imageUtil.h"
+#include "support/viewImages.h"
 
 using fuzz::Choices;
 using fuzz::require;
@@ -15,16 +16,10 @@ using fuzz::require;
 namespace {
 
 ImageUtilImage imageOf(Choices& c, const RasterView& view) {
-  ImageUtilImage image = {};
-  image.width = view.width;
-  image.height = view.height;
-  image.depth = view.depth;
-  image.bpp = view.bpp;
-  image.bytesPerLine = view.pitch;
+  ImageUtilImage image = tests::imageOn(view);
   image.flags = c.below(4);
   image.numColors = c.chance(4) ? c.below(300) : 256;
   for (ImageUtilColor& color : image.palette) color.red = c.byte();
-  image.data = view.data;
   return image;
 }
 

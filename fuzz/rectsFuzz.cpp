@@ -2,48 +2,34 @@
 //
 // Sequences of changes to a rect list against a bitmap, and lists of any bytes.
 
-#include <bitset>
 #include <cstring>
 
 #include "fuzzing.h"
+#include "support/listBitmap.h"
 
 using fuzz::require;
 
 namespace {
 
 constexpr int32 kSide = 32;
-using Bitmap = std::bitset<kSide * kSide>;
-
-void paint(Bitmap& bitmap, const RectListEntry& r, bool value) {
-  for (int32 y = r.y; y < r.y + r.height; ++y)
-    for (int32 x = r.x; x < r.x + r.width; ++x) bitmap[static_cast<size_t>(y * kSide + x)] = value;
-}
-
-Bitmap bitmapOf(const RectList& list) {
-  Bitmap bitmap;
-  for (const RectListEntry& r : list.rects) {
-    if (r.width <= 0) break;
-    paint(bitmap, r, true);
-  }
-  return bitmap;
-}
+using Bitmap = tests::Bitmap<kSide>;
 
 void change(fuzz::Choices& c, RectList& list) {
   const RectListEntry r = {c.between(0, 23), c.between(0, 23), c.between(0, 8), c.between(0, 8)};
-  Bitmap expected = bitmapOf(list);
+  Bitmap expected = tests::bitmapOf<kSide>(list);
   uint32 area = 0;
   const bool adds = c.below(3) != 0;
-  paint(expected, r, adds);
+  tests::paint<kSide>(expected, r, adds);
   if (adds) {
     require(RasterChecked_AddRect(&list, r.x, r.y, r.width, r.height, &area) == RASTER_STATUS_OK);
-    const Bitmap made = bitmapOf(list);
+    const Bitmap made = tests::bitmapOf<kSide>(list);
     require((made & expected) == expected);  // or the box around it
     require(made == expected || list.rects[1].width == 0);
   } else if (RasterChecked_SubRect(&list, r.x, r.y, r.width, r.height, &area) == RASTER_STATUS_OK) {
-    require(bitmapOf(list) == expected);
+    require(tests::bitmapOf<kSide>(list) == expected);
   }
   const bool nothing = r.width == 0 || r.height == 0;
-  require(nothing || area == 0 || area == bitmapOf(list).count());
+  require(nothing || area == 0 || area == tests::bitmapOf<kSide>(list).count());
 }
 
 }  // namespace

@@ -12,6 +12,7 @@
 #include "imageUtil.h"
 #include "rasterChecked.h"
 #include "support/recordedMessages.h"
+#include "support/viewImages.h"
 
 namespace {
 
@@ -21,16 +22,10 @@ using tests::PixelFormat;
 using tests::Random;
 
 ImageUtilImage imageOf(Random& random, const RasterView& view) {
-  ImageUtilImage image = {};
-  image.width = view.width;
-  image.height = view.height;
-  image.depth = view.depth;
-  image.bpp = view.bpp;
-  image.bytesPerLine = view.pitch;
+  ImageUtilImage image = tests::imageOn(view);
   image.flags = random.below(2);
   image.numColors = view.bpp == 8 ? random.below(257) : 0;
   for (ImageUtilColor& color : image.palette) color.green = static_cast<uint8>(random.word());
-  image.data = view.data;
   return image;
 }
 

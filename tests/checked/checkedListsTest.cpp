@@ -5,14 +5,14 @@
 
 #include <gtest/gtest.h>
 
-#include <bitset>
 #include <cstring>
 #include <vector>
 
 #include "rasterChecked.h"
+#include "support/listBitmap.h"
 #include "support/random.h"
-#include "support/rectValues.h"
 #include "support/recordedMessages.h"
+#include "support/rectValues.h"
 
 namespace {
 
@@ -21,21 +21,7 @@ using tests::kMin;
 using tests::Random;
 
 constexpr int32 kSide = 24;
-using Bitmap = std::bitset<kSide * kSide>;
-
-void paint(Bitmap& bitmap, const RectListEntry& r, bool value) {
-  for (int32 y = r.y; y < r.y + r.height; ++y)
-    for (int32 x = r.x; x < r.x + r.width; ++x) bitmap[static_cast<size_t>(y * kSide + x)] = value;
-}
-
-Bitmap bitmapOf(const RectList& list) {
-  Bitmap bitmap;
-  for (const RectListEntry& r : list.rects) {
-    if (r.width <= 0) break;
-    paint(bitmap, r, true);
-  }
-  return bitmap;
-}
+using Bitmap = tests::Bitmap<kSide>;
 
 /// The rectangles that a region takes: runs of a row that the row above does not have just so.
 int naiveRects(const Bitmap& bitmap) {
@@ -77,8 +63,8 @@ TEST(RectLists, FollowABitmap) {
       const RectListEntry r = someEntry(random);
       const bool adds = random.below(3) != 0;
       const RectList before = list;
-      Bitmap expected = bitmapOf(list);
-      paint(expected, r, adds);
+      Bitmap expected = tests::bitmapOf<kSide>(list);
+      tests::paint<kSide>(expected, r, adds);
       RectList exact = list;
       uint32 area = 77;
       if (adds) {
@@ -87,7 +73,7 @@ TEST(RectLists, FollowABitmap) {
         ASSERT_EQ(area, Raster_AddRect(&exact, r.x, r.y, r.width, r.height));
         ASSERT_TRUE(sameLists(list, exact));
         if (naiveRects(expected) <= 15) {
-          ASSERT_EQ(bitmapOf(list), expected);
+          ASSERT_EQ(tests::bitmapOf<kSide>(list), expected);
         }
         continue;
       }
@@ -103,7 +89,7 @@ TEST(RectLists, FollowABitmap) {
       }
       ASSERT_EQ(area, Raster_SubRect(&exact, r.x, r.y, r.width, r.height));
       ASSERT_TRUE(sameLists(list, exact));
-      ASSERT_EQ(bitmapOf(list), expected);
+      ASSERT_EQ(tests::bitmapOf<kSide>(list), expected);
     }
   }
   EXPECT_GT(tooBig, 20);
@@ -121,13 +107,13 @@ TEST(RectLists, TakeListsThatOverlap) {
     }
     const RectListEntry r = someEntry(random);
     if (r.width == 0 || r.height == 0) continue;
-    Bitmap expected = bitmapOf(list);
-    paint(expected, r, false);
+    Bitmap expected = tests::bitmapOf<kSide>(list);
+    tests::paint<kSide>(expected, r, false);
     const RasterStatus status = RasterChecked_SubRect(&list, r.x, r.y, r.width, r.height, nullptr);
     const bool fits = used == 0 || naiveRects(expected) <= 15;
     ASSERT_EQ(status, fits ? RASTER_STATUS_OK : RASTER_STATUS_TOO_BIG);
     if (fits) {
-      ASSERT_EQ(bitmapOf(list), expected);
+      ASSERT_EQ(tests::bitmapOf<kSide>(list), expected);
     }
   }
 }

@@ -15,6 +15,7 @@
 #include "checked/checkedScenes.h"
 #include "image/pngFiles.h"
 #include "rasterChecked.h"
+#include "support/viewImages.h"
 
 // The allocator of this program: the C library's, with a count and a point where memory ends.
 extern "C" {
@@ -130,14 +131,8 @@ struct Outputs {
 };
 
 ImageUtilImage imageOf(const RasterView& view) {
-  ImageUtilImage image = {};
-  image.width = view.width;
-  image.height = view.height;
-  image.depth = view.depth;
-  image.bpp = view.bpp;
-  image.bytesPerLine = view.pitch;
+  ImageUtilImage image = tests::imageOn(view);
   image.numColors = 256;
-  image.data = view.data;
   return image;
 }
 

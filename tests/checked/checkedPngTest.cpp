@@ -13,6 +13,7 @@
 #include "image/pngFiles.h"
 #include "imageUtil.h"
 #include "rasterChecked.h"
+#include "support/viewImages.h"
 
 namespace {
 
@@ -411,19 +412,13 @@ TEST(RasterChecked_PngInfo, RefusesHeadersOfNoPicture) {
 
 /// An image on a view of its own.
 ImageUtilImage imageOf(Random& random, const RasterView& view) {
-  ImageUtilImage image = {};
-  image.width = view.width;
-  image.height = view.height;
-  image.depth = view.depth;
-  image.bpp = view.bpp;
-  image.bytesPerLine = view.pitch;
+  ImageUtilImage image = tests::imageOn(view);
   image.flags = random.below(2);
   image.numColors = view.bpp == 8 ? 256 : 0;
   for (ImageUtilColor& color : image.palette) {
     const Bytes bytes = random.bytes(3);
     color = {bytes[0], bytes[1], bytes[2], 0};
   }
-  image.data = view.data;
   return image;
 }
 

@@ -15,6 +15,7 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/rectValues.h"
+#include "support/someValues.h"
 
 namespace tests {
 
@@ -43,7 +44,7 @@ class GuardedView {
     if (gaps) view_.pitch += unit * random.below(9);
     const size_t bytes =
         width == 0 || height == 0 ? 0 : size_t{height - 1} * view_.pitch + rowBytesOf(view_);
-    memory_ = std::make_unique<GuardedBuffer>(bytes, random.oneOf({Guard::kBefore, Guard::kAfter}));
+    memory_ = std::make_unique<GuardedBuffer>(bytes, tests::someGuard(random));
     memory_->assign(random.bytes(bytes));
     view_.data = memory_->data();
     view_.bytes = bytes;

@@ -11,11 +11,11 @@
 #include "checked/checkedScenes.h"
 #include "rasterChecked.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using tests::Bytes;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::GuardedView;
 using tests::PixelFormat;
@@ -87,7 +87,7 @@ TEST(RasterChecked_Decompress, GivesThePixelsBack) {
     GuardedView view(random, someBlockFormat(random), random.below(40), random.below(40), false);
     makeRuns(random, view);
     const Bytes bytes = exactBlock(view.view());
-    GuardedBuffer block(bytes.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    GuardedBuffer block(bytes.size(), tests::someGuard(random));
     block.assign(bytes);
     RasterBlockInfo info = {};
     ASSERT_EQ(RasterChecked_BlockInfo(block.data(), block.size(), nullptr, &info),

@@ -4,15 +4,15 @@
 
 #include <gtest/gtest.h>
 
-#include <dlfcn.h>
-
 #include <cstring>
 #include <string>
 #include <vector>
 
 #include "imageUtil.h"
 #include "raster.h"
+#include "support/failingCalloc.h"
 #include "support/guardedBuffer.h"
+#include "support/nextFunction.h"
 #include "support/random.h"
 
 namespace {
@@ -25,7 +25,6 @@ using tests::Random;
 struct Interposed {
   std::vector<size_t> appends;
   int failingAppend = -1;  // counted from 0
-  bool failCalloc = false;
 } interposed;
 
 }  // namespace
@@ -33,23 +32,11 @@ struct Interposed {
 extern "C" {
 
 bool DynBuf_Append(DynBuf* buffer, const void* bytes, size_t length) {
-  static auto* const next = [] {
-    void* address = dlsym(RTLD_NEXT, "DynBuf_Append");
-    decltype(&DynBuf_Append) function = nullptr;
-    memcpy(&function, &address, sizeof function);
-    return function;
-  }();
+  static auto* const next = tests::next<decltype(&DynBuf_Append)>("DynBuf_Append");
   interposed.appends.push_back(length);
   if (int(interposed.appends.size()) - 1 == interposed.failingAppend) return false;
   return next(buffer, bytes, length);
 }
-
-#ifndef __SANITIZE_ADDRESS__  // which has a calloc of its own
-void* __libc_calloc(size_t count, size_t size);
-void* calloc(size_t count, size_t size) noexcept {
-  return interposed.failCalloc ? nullptr : __libc_calloc(count, size);
-}
-#endif
 
 }  // extern "C"
 
@@ -276,9 +263,9 @@ TEST_F(ImageUtil_ConstructBMPBuffer, TouchesNothingWhenThereIsNoWorkingMemory) {
   for (const uint32 bpp : {8u, 24u, 32u}) {
     const Picture picture(10, 10, bpp == 8 ? 8 : 24, bpp, 40);
     DynBuf out = {nullptr, 123, 456};
-    interposed.failCalloc = true;
+    tests::callocFails = true;
     const bool built = ::ImageUtil_ConstructBMPBuffer(&picture.image, &out);
-    interposed.failCalloc = false;
+    tests::callocFails = false;
     EXPECT_FALSE(built);
     EXPECT_EQ(out.size, 123u);
     EXPECT_EQ(out.allocated, 456u);

@@ -5,7 +5,6 @@
 
 #include <gtest/gtest.h>
 
-#include <dlfcn.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -17,6 +16,7 @@
 #include "image/pngFiles.h"
 #include "imageUtil.h"
 #include "support/guardedBuffer.h"
+#include "support/nextFunction.h"
 #include "support/random.h"
 
 namespace {
@@ -38,13 +38,6 @@ struct Interposed {
   int closedFiles = 0;
 } interposed;
 
-template <class Function> Function next(const char* name) {
-  void* address = dlsym(RTLD_NEXT, name);
-  Function function = nullptr;
-  memcpy(&function, &address, sizeof function);
-  return function;
-}
-
 }  // namespace
 
 extern "C" {
@@ -53,17 +46,18 @@ png_structp png_create_read_struct(png_const_charp version, png_voidp errorPtr,
                                    png_error_ptr errorFn, png_error_ptr warningFn) {
   ++interposed.readStructs;
   if (interposed.failReadStruct) return nullptr;
-  return next<decltype(&png_create_read_struct)>("png_create_read_struct")(version, errorPtr,
-                                                                           errorFn, warningFn);
+  return tests::next<decltype(&png_create_read_struct)>("png_create_read_struct")(
+      version, errorPtr, errorFn, warningFn);
 }
 
 png_infop png_create_info_struct(png_const_structp png) {
   if (interposed.failInfoStruct) return nullptr;
-  return next<png_infop (*)(png_const_structp)>("png_create_info_struct")(png);
+  return tests::next<png_infop (*)(png_const_structp)>("png_create_info_struct")(png);
 }
 
 int64 FileIO_GetSize(const FileIODescriptor* file) {
-  return interposed.failFileSize ? -1 : next<decltype(&FileIO_GetSize)>("FileIO_GetSize")(file);
+  return interposed.failFileSize ? -1
+                                 : tests::next<decltype(&FileIO_GetSize)>("FileIO_GetSize")(file);
 }
 
 FileIOResult FileIO_Read(const FileIODescriptor* file, void* bytes, size_t size, size_t* actual) {
@@ -71,14 +65,14 @@ FileIOResult FileIO_Read(const FileIODescriptor* file, void* bytes, size_t size,
     if (actual != nullptr) *actual = size;
     return FILEIO_ERROR;
   }
-  const auto result = next<decltype(&FileIO_Read)>("FileIO_Read")(file, bytes, size, actual);
+  const auto result = tests::next<decltype(&FileIO_Read)>("FileIO_Read")(file, bytes, size, actual);
   if (actual != nullptr) *actual -= interposed.unreported;
   return result;
 }
 
 FileIOResult FileIO_Close(FileIODescriptor* file) {
   ++interposed.closedFiles;
-  return next<decltype(&FileIO_Close)>("FileIO_Close")(file);
+  return tests::next<decltype(&FileIO_Close)>("FileIO_Close")(file);
 }
 
 }  // extern "C"

@@ -4,8 +4,6 @@
 
 #include <gtest/gtest.h>
 
-#include <dlfcn.h>
-
 #include <cstring>
 #include <set>
 #include <string>
@@ -13,6 +11,7 @@
 #include "image/pngFiles.h"
 #include "imageUtil.h"
 #include "raster.h"
+#include "support/nextFunction.h"
 #include "support/random.h"
 
 namespace {
@@ -29,32 +28,25 @@ struct Interposed {
   bool failInfoStruct = false;
 } interposed;
 
-template <class Function> Function next(const char* name) {
-  void* address = dlsym(RTLD_NEXT, name);
-  Function function = nullptr;
-  memcpy(&function, &address, sizeof function);
-  return function;
-}
-
 }  // namespace
 
 extern "C" {
 
 bool DynBuf_Append(DynBuf* buffer, const void* bytes, size_t length) {
   if (interposed.appends++ == interposed.failingAppend) return false;
-  return next<decltype(&DynBuf_Append)>("DynBuf_Append")(buffer, bytes, length);
+  return tests::next<decltype(&DynBuf_Append)>("DynBuf_Append")(buffer, bytes, length);
 }
 
 png_structp png_create_write_struct(png_const_charp version, png_voidp errorPtr,
                                     png_error_ptr errorFn, png_error_ptr warningFn) {
   if (interposed.failWriteStruct) return nullptr;
-  return next<decltype(&png_create_write_struct)>("png_create_write_struct")(version, errorPtr,
-                                                                             errorFn, warningFn);
+  return tests::next<decltype(&png_create_write_struct)>("png_create_write_struct")(
+      version, errorPtr, errorFn, warningFn);
 }
 
 png_infop png_create_info_struct(png_const_structp png) {
   if (interposed.failInfoStruct) return nullptr;
-  return next<png_infop (*)(png_const_structp)>("png_create_info_struct")(png);
+  return tests::next<png_infop (*)(png_const_structp)>("png_create_info_struct")(png);
 }
 
 }  // extern "C"

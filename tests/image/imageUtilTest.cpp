@@ -4,7 +4,6 @@
 
 #include <gtest/gtest.h>
 
-#include <dlfcn.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -15,6 +14,8 @@
 #include "fileIO.h"
 #include "imageUtil.h"
 #include "raster.h"
+#include "support/failingCalloc.h"
+#include "support/nextFunction.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
 
@@ -28,7 +29,6 @@ using tests::Random;
 struct Interposed {
   size_t missingBytes = 0;
   FileIOResult writeResult = FILEIO_SUCCESS;
-  bool failCalloc = false;
 } interposed;
 
 }  // namespace
@@ -37,19 +37,10 @@ extern "C" {
 
 FileIOResult FileIO_Write(const FileIODescriptor* file, const void* bytes, size_t size,
                           size_t* actual) {
-  void* address = dlsym(RTLD_NEXT, "FileIO_Write");
-  decltype(&FileIO_Write) next = nullptr;
-  memcpy(&next, &address, sizeof next);
+  static auto* const next = tests::next<decltype(&FileIO_Write)>("FileIO_Write");
   const FileIOResult result = next(file, bytes, size - interposed.missingBytes, actual);
   return interposed.writeResult != FILEIO_SUCCESS ? interposed.writeResult : result;
 }
-
-#ifndef __SANITIZE_ADDRESS__  // which has a calloc of its own
-void* __libc_calloc(size_t count, size_t size);
-void* calloc(size_t count, size_t size) noexcept {
-  return interposed.failCalloc ? nullptr : __libc_calloc(count, size);
-}
-#endif
 
 }  // extern "C"
 
@@ -444,9 +435,9 @@ TEST_F(ImageUtil_Combine, FailsWithTheResultUntouchedWithoutMemory) {
   EXPECT_TRUE(result.untouched());
 #ifndef __SANITIZE_ADDRESS__
   placed[0].x = placed[1].x = 0;
-  interposed.failCalloc = true;
+  tests::callocFails = true;
   const bool ok = ::ImageUtil_Combine(&placed[0].picture.image, &placed[0].x, 1, &result.image);
-  interposed.failCalloc = false;
+  tests::callocFails = false;
   EXPECT_FALSE(ok);
   EXPECT_TRUE(result.untouched());
 #endif

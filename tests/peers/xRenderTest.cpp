@@ -20,7 +20,6 @@
 namespace {
 
 using tests::Random;
-using tests::XServer;
 using Bytes = std::vector<uint8>;
 
 constexpr uint16_t kWidth = 128;
@@ -30,17 +29,7 @@ constexpr size_t kPixels = size_t{kWidth} * kHeight;
 // All but 11, which we compute otherwise, and 13, which takes the destination's alpha.
 constexpr uint8_t kOperators[] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 12};
 
-std::unique_ptr<XServer> server;
-
-/// One server for all tests; without one the program ends as skipped.
-class Environment : public testing::Environment {
-  void SetUp() override { server = tests::startXServerOrSkip(); }
-  void TearDown() override { server.reset(); }
-};
-[[maybe_unused]] testing::Environment* const kEnvironment =
-    testing::AddGlobalTestEnvironment(new Environment);
-
-xcb_connection_t* x() { return server->connection(); }
+xcb_connection_t* x() { return tests::theXServer().connection(); }
 
 /// A field of a pixel.
 struct Channel {
@@ -89,7 +78,8 @@ class Picture {
  public:
   Picture(const Format& format, const Bytes& pixels)
       : format_(format), pixmap_(xcb_generate_id(x())), id_(xcb_generate_id(x())) {
-    xcb_create_pixmap(x(), format.depth, pixmap_, server->screen().root, kWidth, kHeight);
+    xcb_create_pixmap(x(), format.depth, pixmap_, tests::theXServer().screen().root, kWidth,
+                      kHeight);
     const xcb_gcontext_t gc = xcb_generate_id(x());
     xcb_create_gc(x(), gc, pixmap_, 0, nullptr);
     xcb_put_image(x(), XCB_IMAGE_FORMAT_Z_PIXMAP, pixmap_, gc, kWidth, kHeight, 0, 0, 0,

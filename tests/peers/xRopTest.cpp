@@ -16,22 +16,11 @@
 namespace {
 
 using tests::Random;
-using tests::XServer;
 
 constexpr uint16_t kWidth = 97;
 constexpr uint16_t kHeight = 61;
 
-std::unique_ptr<XServer> server;
-
-/// One server for all tests; without one the program ends as skipped.
-class Environment : public testing::Environment {
-  void SetUp() override { server = tests::startXServerOrSkip(); }
-  void TearDown() override { server.reset(); }
-};
-[[maybe_unused]] testing::Environment* const kEnvironment =
-    testing::AddGlobalTestEnvironment(new Environment);
-
-xcb_connection_t* x() { return server->connection(); }
+xcb_connection_t* x() { return tests::theXServer().connection(); }
 
 /// A picture, in our memory and as a pixmap of the server.
 class Picture {
@@ -44,7 +33,7 @@ class Picture {
         bytes_(random.bytes(size_t{pitch_} * height)),
         id_(xcb_generate_id(x())),
         gc_(xcb_generate_id(x())) {
-    xcb_create_pixmap(x(), depth, id_, server->screen().root, width, height);
+    xcb_create_pixmap(x(), depth, id_, tests::theXServer().screen().root, width, height);
     xcb_create_gc(x(), gc_, id_, 0, nullptr);
     set(XCB_GC_GRAPHICS_EXPOSURES, {0});  // no events
     xcb_put_image(x(), XCB_IMAGE_FORMAT_Z_PIXMAP, id_, gc_, width, height, 0, 0, 0, depth,
@@ -112,7 +101,7 @@ class Bitmap {
       for (uint8& byte : sent) byte = reversed(byte);
     }
     const xcb_gcontext_t gc = xcb_generate_id(x());
-    xcb_create_pixmap(x(), 1, id_, server->screen().root, width, height);
+    xcb_create_pixmap(x(), 1, id_, tests::theXServer().screen().root, width, height);
     xcb_create_gc(x(), gc, id_, 0, nullptr);
     xcb_put_image(x(), XCB_IMAGE_FORMAT_XY_PIXMAP, id_, gc, width, height, 0, 0, 0, 1,
                   static_cast<uint32_t>(sent.size()), sent.data());

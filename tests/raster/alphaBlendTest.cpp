@@ -18,6 +18,7 @@
 #include "support/ownProcess.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
@@ -28,7 +29,6 @@ using reference::Bytes;
 using reference::kBlendFormats;
 using reference::kBlendOperators;
 using tests::Access;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::Random;
@@ -184,8 +184,8 @@ TEST(Raster_AlphaBlend, EqualsTheModelAndTouchesNothingElse) {
     reference::blendInPlace(joined, p.within(f, before.size()), f, b);
     joined.resize(before.size());
 
-    GuardedBuffer src(source.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
-    GuardedBuffer dst(before.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    GuardedBuffer src(source.size(), tests::someGuard(random));
+    GuardedBuffer dst(before.size(), tests::someGuard(random));
     src.assign(source);
     dst.assign(before);
     blendAt(dst.data(), src.data(), p, f, b, staged);

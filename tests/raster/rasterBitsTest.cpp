@@ -15,6 +15,7 @@
 #include "support/level.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
@@ -31,8 +32,6 @@ constexpr Expand kExpand[] = {nullptr, RasterBitsToPixels8, RasterBitsToPixels16
 using Stencil = void (*)(const uint8*, uint32, uint8*, uint32, int32, int32, uint32);
 constexpr Stencil kStencil[] = {nullptr, RasterBitsToPixelsStencil8, RasterBitsToPixelsStencil16,
                                 RasterBitsToPixelsStencil24, RasterBitsToPixelsStencil32};
-
-Guard someGuard(Random& random) { return random.oneOf({Guard::kBefore, Guard::kAfter}); }
 
 struct Plane {
   uint32 bitsPitch, dstPitch, bytesPerPixel;
@@ -91,8 +90,8 @@ TEST(Raster_BitsToPixels, EqualsTheModelAndReadsNoByteTooMany) {
     const Plane p = somePlane(random);
     const Bytes plane = random.bytes(p.bitsRange(0).size());
     const Bytes before = random.bytes(p.dstRange(0).size());
-    GuardedBuffer bits(plane.size(), someGuard(random));
-    GuardedBuffer dst(before.size(), someGuard(random));
+    GuardedBuffer bits(plane.size(), tests::someGuard(random));
+    GuardedBuffer dst(before.size(), tests::someGuard(random));
     bits.assign(plane);
     dst.assign(before);
     Bytes both = before;
@@ -119,7 +118,7 @@ TEST(Raster_BitsToPixels, LooksAtThePlaneForEveryFourPixelsWhereItLiesInTheRecta
     bits -= both.begin;
     const int64 dst = -both.begin;
     Bytes expected = random.bytes(both.size());
-    GuardedBuffer actual(expected.size(), someGuard(random));
+    GuardedBuffer actual(expected.size(), tests::someGuard(random));
     actual.assign(expected);
     reference::bitsToPixels(expected, bits, p.bitsPitch, dst, p.dstPitch, p.bytesPerPixel, p.width,
                             p.height, p.foreground, p.background, p.stencil);

@@ -14,12 +14,12 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::Bytes;
 using reference::Rows;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::Random;
@@ -29,10 +29,6 @@ int signOf(int32 value) { return (value > 0 ? 1 : 0) - (value < 0 ? 1 : 0); }
 bool isPlainPanic(const Messages& said) {
   return said.warning.empty() &&
          tests::isPanic(said.panic, "NOT_IMPLEMENTED", "lib/raster/rasterComp");
-}
-
-uint32 someWidth(Random& random) {
-  return random.below(12) == 0 ? 500 + random.below(2000) : random.below(71);
 }
 
 // ---- Plain -------------------------------------------------------------------------------------
@@ -70,7 +66,7 @@ struct Case {
 Case someCase(Random& random) {
   Case c{};
   c.bytesPerPixel = 1 + random.below(5);
-  c.width = someWidth(random);
+  c.width = tests::someWidth(random);
   c.height = random.below(c.width > 100 ? 4 : 12);
   const bool contiguous = random.below(3) == 0;
   for (Side* side : {&c.a, &c.b}) {
@@ -87,8 +83,8 @@ struct Buffers {
   Buffers(Random& random, const Case& c)
       : a(random.bytes(c.end(c.a))),
         b(random.bytes(c.end(c.b))),
-        memoryA(a.size(), random.oneOf({Guard::kBefore, Guard::kAfter})),
-        memoryB(b.size(), random.oneOf({Guard::kBefore, Guard::kAfter})) {
+        memoryA(a.size(), tests::someGuard(random)),
+        memoryB(b.size(), tests::someGuard(random)) {
     for (uint32 y = 0; y < c.height; ++y) {
       for (size_t i = 0; i < size_t{c.width} * c.bytesPerPixel; ++i) {
         const bool unused = c.bytesPerPixel == 4 && i % 4 == 3;
@@ -282,7 +278,7 @@ struct Images {
 };
 
 Images someImages(Random& random, int32 bpp) {
-  Images images{{}, {}, {}, someWidth(random), random.below(8), bpp};
+  Images images{{}, {}, {}, tests::someWidth(random), random.below(8), bpp};
   const size_t total = size_t{images.pitch()} * images.height;
   images.a = random.bytes(total);
   images.b = images.a;

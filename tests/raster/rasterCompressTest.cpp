@@ -15,6 +15,7 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 #include "utilAlloc.h"
 
 namespace {
@@ -139,7 +140,7 @@ TEST(Raster_Compress, EqualsTheModelForRunsOfAllKinds) {
     const size_t count = random.below(round % 50 == 0 ? 5000 : 150);
     const uint32 longest = random.oneOf({1u, 2u, 3u, 4u, 6u, 20u, 90u, 400u});
     const uint32 colours = random.oneOf({1u, 2u, 3u, 1000000000u});
-    check(someRuns(random, count, longest, colours), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    check(someRuns(random, count, longest, colours), tests::someGuard(random));
     if (HasFatalFailure()) return;
   }
 }

@@ -14,6 +14,7 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
@@ -68,7 +69,7 @@ Palette somePalette(Random& random, size_t count) {
 class Memory : public GuardedBuffer {
  public:
   Memory(Random& random, const Bytes& bytes)
-      : GuardedBuffer(bytes.size(), random.oneOf({Guard::kBefore, Guard::kAfter})) {
+      : GuardedBuffer(bytes.size(), tests::someGuard(random)) {
     assign(bytes);
   }
 };
@@ -260,11 +261,6 @@ Entry someEntry(Random& random, const Pair& pair) {
   return pair.srcDepth == 32 ? Entry::kFrom32 : Entry::kGeneral;
 }
 
-/// A width that is likely to meet a boundary of some vector size.
-uint32 someWidth(Random& random) {
-  return random.below(16) == 0 ? 500 + random.below(2000) : random.below(140);
-}
-
 Spot someSpot(Random& random, uint32 width, uint32 bytes) {
   Spot spot{};
   spot.base = random.below(70);
@@ -296,7 +292,7 @@ Bytes someSource(Random& random, size_t size, const Pair& pair, size_t paletteSi
 }
 
 void checkRandomRectangle(Random& random, const Pair& pair) {
-  const uint32 width = someWidth(random);
+  const uint32 width = tests::someWidth(random, 140);
   const uint32 height = random.below(width > 150 ? 4 : 12);
   const Spot to = someSpot(random, width, pair.dstBytes());
   const Spot from = someSpot(random, width, pair.srcBytes());

@@ -17,11 +17,11 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::Bytes;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::Random;
@@ -320,7 +320,7 @@ TEST(Raster_DrawCursor, DrawsBothKindsIntoTheFrameBuffer) {
     const Format& format = kFormats[random.below(5)];
     Scene s = someScene(random, random.below(2), format);
     const Planes planes(s);
-    GuardedBuffer fb(s.screen.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    GuardedBuffer fb(s.screen.size(), tests::someGuard(random));
     fb.assign(s.screen);
     Raster_DrawCursor(fb.data(), &s.fb, nullptr, 0, &s.cursor, &s.box);
     ASSERT_EQ(fb.bytes(), drawn(s, s.screen, s.fb.pitch, static_cast<uint32>(s.box.x),

@@ -17,12 +17,12 @@
 #include "reference/rasterScaleReference.h"
 #include "support/guardedBuffer.h"
 #include "support/random.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::ScaleAnswer;
 using reference::ScaleCall;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Random;
 using Bytes = std::vector<uint8>;
@@ -91,7 +91,7 @@ size_t srcBytesOf(const ScaleCall& c) {
 
 /// Runs a call on noise between guard pages and compares every byte with the model.
 void check(Random& random, const ScaleCall& c) {
-  const auto guard = [&] { return random.oneOf({Guard::kBefore, Guard::kAfter}); };
+  const auto guard = [&] { return tests::someGuard(random); };
   const Bytes source = random.bytes(srcBytesOf(c));
   Bytes expected = random.bytes(c.dstBase + extent(c.dstWidth, c.dstHeight, c.dstPitch, c.dstBpp));
   GuardedBuffer src(source.size(), guard());
@@ -169,7 +169,7 @@ void checkInOneMemory(Random& random, ScaleCall c) {
   c.dstBase -= static_cast<size_t>(first);
   c.srcBase -= static_cast<size_t>(first);
   Bytes expected = random.bytes(std::max(c.dstBase + dstBytes, srcBytesOf(c)));
-  GuardedBuffer memory(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+  GuardedBuffer memory(expected.size(), tests::someGuard(random));
   memory.assign(expected);
   const ScaleAnswer answer = reference::scale(expected, expected, c);
   ASSERT_EQ(run(memory.data(), memory.data(), c), answer.result) << describe(c);

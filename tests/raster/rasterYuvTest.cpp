@@ -14,13 +14,13 @@
 #include "support/guardedBuffer.h"
 #include "support/ownProcess.h"
 #include "support/random.h"
+#include "support/someValues.h"
 // Not exported by the library, so this program has a copy of its own.
 #include "video/videoAttributes.cpp"  // NOLINT(bugprone-suspicious-include)
 
 namespace {
 
 using reference::Bytes;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Random;
 
@@ -45,8 +45,8 @@ size_t frameBytes(uint32 width, uint32 height, uint32 format) {
 void checkSize(Random& random, uint32 width, uint32 height, uint32 format, int bppdepth) {
   const Bytes frame = random.bytes(frameBytes(width, height, format));
   Bytes expected = random.bytes(size_t{width} * height * reference::bytesOf(bppdepth));
-  GuardedBuffer src(frame.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
-  GuardedBuffer dst(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+  GuardedBuffer src(frame.size(), tests::someGuard(random));
+  GuardedBuffer dst(expected.size(), tests::someGuard(random));
   src.assign(frame);
   dst.assign(expected);
   reference::yuvToRgb(frame, expected, width, height, format, bppdepth);

@@ -13,24 +13,17 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::Bytes;
 using tests::ByteRange;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::moved;
 using tests::Random;
 using tests::rowsRange;
-
-/// A width that is likely to meet a boundary of some vector size.
-uint32 someWidth(Random& random) {
-  return random.below(16) == 0 ? 1000 + random.below(1000) : random.below(71);
-}
-
-Guard someGuard(Random& random) { return random.oneOf({Guard::kBefore, Guard::kAfter}); }
 
 // ---- Fill --------------------------------------------------------------------------------------
 
@@ -59,7 +52,7 @@ Fill someFill(Random& random, uint32 rop) {
   f.pixel = random.oneOf({random.word(), 0u, 0xFFFFFFFFu, 0xFFu, random.word() & 0xFFFF});
   f.x = random.below(9);
   f.y = random.below(4);
-  f.width = someWidth(random);
+  f.width = tests::someWidth(random);
   f.height = random.below(f.width > 100 ? 4 : 20);
   const auto bytes = static_cast<int32>(f.width * f.bytesPerPixel);
   // Also rows without a gap, and rows that overlap each other.
@@ -75,7 +68,7 @@ TEST(Raster_RectROPfill, EqualsTheModelAndTouchesNothingElse) {
     const ByteRange range = f.range();
     f.fb -= range.begin;
     Bytes expected = random.bytes(range.size());
-    GuardedBuffer actual(expected.size(), someGuard(random));
+    GuardedBuffer actual(expected.size(), tests::someGuard(random));
     actual.assign(expected);
     reference::rectRopFill(expected, f.fb, f.pitch, f.bytesPerPixel, f.pixel, f.rop, f.x, f.y,
                            f.width, f.height);
@@ -205,7 +198,7 @@ void checkCopy(Random& random, Copy c) {
   c.dst -= range.begin;
   c.src -= range.begin;
   Bytes expected = random.bytes(range.size());
-  GuardedBuffer actual(expected.size(), someGuard(random));
+  GuardedBuffer actual(expected.size(), tests::someGuard(random));
   actual.assign(expected);
   reference::rectRopCopy(expected, c.dst, c.dstPitch, c.src, c.srcPitch, c.bytesPerPixel, c.srcX,
                          c.srcY, c.rop, c.dstX, c.dstY, c.width, c.height);
@@ -230,7 +223,7 @@ Copy someCopy(Random& random, uint32 bytesPerPixel, uint32 rop, uint32 walk) {
   c.srcY = 4 + random.below(4);
   c.dstX = walk == 2 ? c.srcX + 1 + random.below(9) : random.below(c.srcX + 1);
   c.dstY = walk == 0 ? c.srcY - random.below(4) : c.srcY + (walk == 1 ? 1 + random.below(4) : 0);
-  c.width = someWidth(random);
+  c.width = tests::someWidth(random);
   c.height = random.below(c.width > 100 ? 4 : 12);
   c.dstPitch = somePitch(random, c.width, bytesPerPixel);
   c.srcPitch = random.below(2) == 0 ? c.dstPitch : somePitch(random, c.width, bytesPerPixel);

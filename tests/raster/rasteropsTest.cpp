@@ -12,11 +12,11 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::Bytes;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::Random;
@@ -29,11 +29,6 @@ class MmxSwitch {
   MmxSwitch(const MmxSwitch&) = delete;
   MmxSwitch& operator=(const MmxSwitch&) = delete;
 };
-
-/// A width that is likely to meet a boundary of some vector size.
-uint32 someWidth(Random& random) {
-  return random.below(16) == 0 ? 1000 + random.below(2000) : random.below(71);
-}
 
 /// Where a rectangle lies in a buffer that holds it exactly, guard to guard.
 struct Place {
@@ -54,7 +49,7 @@ Place somePlace(Random& random, uint32 bytesPerPixel) {
   place.base = random.below(70);
   place.x = random.below(9);
   place.y = random.below(4);
-  place.width = someWidth(random);
+  place.width = tests::someWidth(random);
   place.height = random.below(place.width > 100 ? 4 : 20);
   place.pitch = (place.x + place.width) * bytesPerPixel + random.below(40);
   return place;
@@ -72,7 +67,7 @@ TEST(Raster_RectFill, EqualsTheModelAndTouchesNothingElse) {
     const Place p = somePlace(random, 1 + random.below(4));
     const uint32 pixel = random.word();
     Bytes expected = random.bytes(p.end());
-    GuardedBuffer actual(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    GuardedBuffer actual(expected.size(), tests::someGuard(random));
     actual.assign(expected);
 
     reference::rectFill(expected, p.base, p.pitch, p.bytesPerPixel, pixel, p.x, p.y, p.width,
@@ -129,7 +124,7 @@ void checkCopy(Random& random, uint32 bytesPerPixel, int32 farthest) {
   shifted.pitch = from.pitch;
 
   Bytes expected = random.bytes(std::max(from.end(), shifted.end()));
-  GuardedBuffer actual(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+  GuardedBuffer actual(expected.size(), tests::someGuard(random));
   actual.assign(expected);
   reference::rectCopy(expected, shifted.base, shifted.pitch, from.base, from.pitch, bytesPerPixel,
                       from.x, from.y, to.x, to.y, to.width, to.height);
@@ -157,8 +152,8 @@ TEST(Raster_RectCopy, EqualsTheModelBetweenBuffers) {
       // One memory for the model, two guarded buffers for the library.
       const Bytes source = random.bytes(from.end());
       Bytes expected = random.bytes(to.end());
-      GuardedBuffer src(source.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
-      GuardedBuffer dst(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+      GuardedBuffer src(source.size(), tests::someGuard(random));
+      GuardedBuffer dst(expected.size(), tests::someGuard(random));
       src.assign(source);
       dst.assign(expected);
       Bytes joined = expected;
@@ -198,7 +193,7 @@ TEST(Raster_RectCopy, MovesRowsOfAnyLengthWithinThemselves) {
         const uint32 from = random.below(64) + (right ? 0 : distance);
         const uint32 to = right ? from + distance : from - distance;
         Bytes expected = random.bytes(std::max(from, to) + bytes);
-        GuardedBuffer actual(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+        GuardedBuffer actual(expected.size(), tests::someGuard(random));
         actual.assign(expected);
         memmove(&expected[to], &expected[from], bytes);
         Raster_RectCopy(actual.data(), 0, actual.data(), 0, 1, from, 0, to, 0, bytes, 1);
@@ -241,7 +236,7 @@ TEST(Raster_RectFillAlpha, EqualsTheModelAndTouchesNothingElse) {
     const Place p = somePlace(random, 4);
     const auto alpha = static_cast<uint8>(random.word());
     Bytes expected = random.bytes(p.end());
-    GuardedBuffer actual(expected.size(), random.oneOf({Guard::kBefore, Guard::kAfter}));
+    GuardedBuffer actual(expected.size(), tests::someGuard(random));
     actual.assign(expected);
     reference::rectFillAlpha(expected, p.base, p.pitch, alpha, p.x, p.y, p.width, p.height);
     Raster_RectFillAlpha(actual.data() + p.base, p.pitch, alpha, p.x, p.y, p.width, p.height);

@@ -14,19 +14,17 @@
 #include "support/ownProcess.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
+#include "support/someValues.h"
 
 namespace {
 
 using reference::Bytes;
 using tests::ByteRange;
-using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::moved;
 using tests::Random;
 using tests::rowsRange;
-
-Guard someGuard(Random& random) { return random.oneOf({Guard::kBefore, Guard::kAfter}); }
 
 uint32 roundedPitch(uint32 pitch, uint32 bytesPerPixel) {
   return bytesPerPixel == 3 ? pitch : pitch / bytesPerPixel * bytesPerPixel;
@@ -95,7 +93,7 @@ void checkTiling(Random& random, Tiling t) {
   t.dst -= range.begin;
   t.pixmap -= range.begin;
   Bytes expected = random.bytes(range.size());
-  GuardedBuffer actual(expected.size(), someGuard(random));
+  GuardedBuffer actual(expected.size(), tests::someGuard(random));
   actual.assign(expected);
   reference::rectPixmapRopCopy(expected, t.dst, t.dstPitch, t.pixmap, t.pixmapPitch,
                                t.bytesPerPixel, t.tileX, t.tileY, t.pixmapWidth, t.pixmapHeight,
@@ -173,7 +171,7 @@ TEST(Raster_RectPixmapROPcopy, EqualsTheModelWherePixmapRowsHaveMoreBytesThanAnA
       const uint32 tileX = random.below(3);
       const uint32 pitch = (width + tileX) * bytesPerPixel;
       Bytes expected = random.bytes(size_t{pitch} * (height + 2));
-      GuardedBuffer actual(expected.size(), someGuard(random));
+      GuardedBuffer actual(expected.size(), tests::someGuard(random));
       actual.assign(expected);
       const int64 dst = 2 * int64{pitch};  // after the two rows of the pixmap
       reference::rectPixmapRopCopy(expected, dst, pitch, 0, pitch, bytesPerPixel, tileX, 1,
@@ -222,7 +220,7 @@ TEST(RasterRectPixmapROPcopy, EqualsTheModelAtEveryByteDistance) {
         dst -= both.begin + 2 * int64{dstPitch} + 3 * int64{bytesPerPixel};
         src -= both.begin + 5 * int64{srcPitch} + int64{bytesPerPixel};
         Bytes expected = random.bytes(both.size());
-        GuardedBuffer actual(expected.size(), someGuard(random));
+        GuardedBuffer actual(expected.size(), tests::someGuard(random));
         actual.assign(expected);
         reference::pixmapBlock(expected, dst, dstPitch, src, srcPitch, bytesPerPixel, 1, 5, rop, 3,
                                2, width, height);

@@ -3,6 +3,7 @@
 #include "support/xServer.h"
 
 #include <fcntl.h>
+#include <gtest/gtest.h>
 #include <poll.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
@@ -87,14 +88,25 @@ const xcb_screen_t& XServer::screen() const {
   return *xcb_setup_roots_iterator(xcb_get_setup(connection_)).data;
 }
 
-std::unique_ptr<XServer> startXServerOrSkip() {
-  std::string why;
-  auto server = XServer::start(why);
-  if (server == nullptr) {
+namespace {
+
+std::unique_ptr<XServer> server;
+
+class Environment : public testing::Environment {
+  void SetUp() override {
+    std::string why;
+    server = XServer::start(why);
+    if (server != nullptr) return;
     printf("skipped: no X server: %s\n", why.c_str());
     exit(kSkipped);
   }
-  return server;
-}
+  void TearDown() override { server.reset(); }
+};
+[[maybe_unused]] testing::Environment* const kEnvironment =
+    testing::AddGlobalTestEnvironment(new Environment);
+
+}  // namespace
+
+XServer& theXServer() { return *server; }
 
 }  // namespace tests

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 //
-// A private X server for the tests that draw with one. Only their programs link XCB.
+// A private X server for the tests that draw with one. Only their programs link this source and
+// XCB.
 
 #ifndef TESTS_X_SERVER_H
 #define TESTS_X_SERVER_H
@@ -33,9 +34,9 @@ class XServer {
   xcb_connection_t* connection_ = nullptr;
 };
 
-/// As XServer::start, for programs that cannot do without: where there is no server, says so and
-/// ends the program with the status that CTest counts as skipped.
-std::unique_ptr<XServer> startXServerOrSkip();
+/// One server for all tests of a program. Where there is none, the program says so at its start and
+/// ends with the status that CTest counts as skipped.
+XServer& theXServer();
 
 }  // namespace tests
 
