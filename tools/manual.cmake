@@ -1,15 +1,7 @@
 # The manual pages of the tool and its commands, made of its own help where help2man is, under the same
 # option as the reference (cmake/Docs.cmake).
-if(NOT RASTER_BUILD_DOCS)
-  return()
-endif()
-find_program(RASTER_HELP2MAN help2man)
-mark_as_advanced(RASTER_HELP2MAN)
+raster_find_docs_program(RASTER_HELP2MAN help2man "the tool's manual pages")
 if(NOT RASTER_HELP2MAN)
-  if(NOT RASTER_BUILD_DOCS STREQUAL AUTO)
-    message(FATAL_ERROR "RASTER_BUILD_DOCS: help2man was not found")
-  endif()
-  message(STATUS "Without the tool's manual pages: not found here: help2man")
   return()
 endif()
 
