@@ -103,6 +103,19 @@ bool isWorthWidening(const TileRows& t) {
   return t.height > t.srcRows || t.bytes > 2 * t.period;
 }
 
+/// In the order of the exported functions' arguments.
+Tiling tilingOf(uint8* dst, uint32 dstPitch, const uint8* pixmap, uint32 pixmapPitch,
+                int32 bytesPerPixel, uint32 tileX, uint32 tileY, uint32 pixmapWidth,
+                uint32 pixmapHeight, uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
+  return {.dst = {dst, pitchOf(dstPitch), dstX, dstY},
+          .pixmap = {pixmap, pitchOf(pixmapPitch), tileX, tileY},
+          .pixmapWidth = pixmapWidth,
+          .pixmapHeight = pixmapHeight,
+          .width = width,
+          .height = height,
+          .bytesPerPixel = static_cast<uint32>(bytesPerPixel)};
+}
+
 void tile(const Tiling& t, uint32 rop) {
   // By a test of its own, first of all: a compiler may divide later, when the result is wanted.
   if (t.pixmapWidth == 0 || t.pixmapHeight == 0) divisionByZero();
@@ -131,13 +144,8 @@ void Raster_RectPixmapCopy(uint8* dst, uint32 dstPitch, const uint8* pixmap, uin
                            int32 bytesPerPixel, uint32 tileX, uint32 tileY, uint32 pixmapWidth,
                            uint32 pixmapHeight, uint32 dstX, uint32 dstY, uint32 width,
                            uint32 height) {
-  raster::tile({.dst = {dst, pitchOf(dstPitch), dstX, dstY},
-                .pixmap = {pixmap, pitchOf(pixmapPitch), tileX, tileY},
-                .pixmapWidth = pixmapWidth,
-                .pixmapHeight = pixmapHeight,
-                .width = width,
-                .height = height,
-                .bytesPerPixel = static_cast<uint32>(bytesPerPixel)},
+  raster::tile(raster::tilingOf(dst, dstPitch, pixmap, pixmapPitch, bytesPerPixel, tileX, tileY,
+                                pixmapWidth, pixmapHeight, dstX, dstY, width, height),
                raster::kRopCopy);
 }
 
@@ -145,13 +153,8 @@ void Raster_RectPixmapROPcopy(uint8* dst, uint32 dstPitch, const uint8* pixmap, 
                               int32 bytesPerPixel, uint32 tileX, uint32 tileY, uint32 pixmapWidth,
                               uint32 pixmapHeight, uint32 rop, uint32 dstX, uint32 dstY,
                               uint32 width, uint32 height) {
-  raster::tile({.dst = {dst, pitchOf(dstPitch), dstX, dstY},
-                .pixmap = {pixmap, pitchOf(pixmapPitch), tileX, tileY},
-                .pixmapWidth = pixmapWidth,
-                .pixmapHeight = pixmapHeight,
-                .width = width,
-                .height = height,
-                .bytesPerPixel = static_cast<uint32>(bytesPerPixel)},
+  raster::tile(raster::tilingOf(dst, dstPitch, pixmap, pixmapPitch, bytesPerPixel, tileX, tileY,
+                                pixmapWidth, pixmapHeight, dstX, dstY, width, height),
                rop);
 }
 
