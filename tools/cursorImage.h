@@ -14,8 +14,8 @@ namespace tool {
 
 /// Whether a cursor of this size can be drawn, and scaled by any factor that is allowed.
 inline bool isCursorSize(uint32 width, uint32 height) {
-  constexpr uint32 kLargestSide = 1024;
-  return width <= kLargestSide && height <= kLargestSide;
+  constexpr uint32 kLargestCursorSide = 1024;
+  return width <= kLargestCursorSide && height <= kLargestCursorSide;
 }
 
 class CursorImage {

@@ -6,11 +6,10 @@
 #include <cstring>
 #include <memory>
 
+#include "pictureLimits.h"
+
 namespace tool {
 namespace {
-
-constexpr uint64 kLargestPicture = uint64{1} << 30;
-constexpr uint32 kLargestSide = 1000000;
 
 /// Pixel units of the image, row padding included.
 uint64 unitsOf(const BlockHeader& header) {

@@ -15,13 +15,12 @@
 #include "raster.h"
 #include "rasterChecked.h"
 #include "standardError.h"
+#include "pictureLimits.h"
 #include "standardOutput.h"
 
 namespace tool {
 namespace {
 
-constexpr uint64 kLargestPicture = uint64{1} << 30;  // bytes
-constexpr uint32 kLargestSide = 1000000;
 /// What stands beside the pixels of a file is passed over and may be as much as the file holds.
 constexpr RasterLimits kPngLimits = {kLargestSide, kLargestSide, kLargestPicture,
                                      UINT64_MAX,   UINT32_MAX,   UINT32_MAX};

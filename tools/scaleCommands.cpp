@@ -16,7 +16,7 @@
 namespace tool {
 namespace {
 
-constexpr uint32 kLargestSide = 32767;
+constexpr uint32 kLargestScaledSide = 32767;
 
 struct ScaleOptions {
   std::string input;
@@ -26,8 +26,8 @@ struct ScaleOptions {
 };
 
 void checkSides(uint32 width, uint32 height) {
-  if (width > kLargestSide || height > kLargestSide)
-    throw Failure("no side of a scaled picture may be over " + std::to_string(kLargestSide) +
+  if (width > kLargestScaledSide || height > kLargestScaledSide)
+    throw Failure("no side of a scaled picture may be over " + std::to_string(kLargestScaledSide) +
                   " pixels");
 }
 

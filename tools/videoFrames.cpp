@@ -90,7 +90,7 @@ void lowerFields(std::vector<uint8>& pixels) {
   }
 }
 
-constexpr uint32 kLargestSide = 16384;
+constexpr uint32 kLargestFrameSide = 16384;
 
 /// The side that a word of a YUV4MPEG2 header gives after its letter, or 0.
 uint32 sideIn(const std::string& word) {
@@ -101,8 +101,8 @@ uint32 sideIn(const std::string& word) {
 }
 
 bool isFrameSize(const Size& size) {
-  return size.width != 0 && size.height != 0 && size.width <= kLargestSide &&
-         size.height <= kLargestSide;
+  return size.width != 0 && size.height != 0 && size.width <= kLargestFrameSide &&
+         size.height <= kLargestFrameSide;
 }
 
 }  // namespace
@@ -242,7 +242,8 @@ bool FrameReader::goTo(uint64 wanted) {
 Size parseFrameSize(const std::string& text) {
   const Size size = parseSize(text);
   if (!isFrameSize(size))
-    throw CLI::ValidationError("no side of a frame may be over " + std::to_string(kLargestSide));
+    throw CLI::ValidationError("no side of a frame may be over " +
+                               std::to_string(kLargestFrameSide));
   return size;
 }
 
