@@ -71,7 +71,8 @@ RasterStatus drawPlane(const RasterView* dst, const Rect* rect, const RasterView
   if (status != RASTER_STATUS_OK) return status;
   if (!isPlane(*plane)) return RASTER_STATUS_BAD_FORMAT;
   if (area.isEmpty()) return RASTER_STATUS_OK;
-  if (area.inDst(*dst).overlaps(Span(*plane))) return RASTER_STATUS_OVERLAP;
+  if (areNear(*dst, *plane) && area.inDst(*dst).overlaps(Span(*plane)))
+    return RASTER_STATUS_OVERLAP;
   const uint32 bytesPerPixel = dst->bpp / 8;
   const Job job = {plane->data + size_t{area.srcY} * plane->pitch + area.srcX / 8,
                    plane->pitch,

@@ -81,7 +81,8 @@ RasterStatus RasterChecked_Convert(const RasterView* dst, const Rect* rect, cons
   if (status != RASTER_STATUS_OK) return status;
   if (!converts(*dst, *src, palette != nullptr)) return RASTER_STATUS_BAD_FORMAT;
   if (area.isEmpty()) return RASTER_STATUS_OK;
-  if (area.inDst(*dst).overlaps(area.inSrc(*src))) return RASTER_STATUS_OVERLAP;
+  if (areNear(*dst, *src) && area.inDst(*dst).overlaps(area.inSrc(*src)))
+    return RASTER_STATUS_OVERLAP;
   uint32 whole[kPaletteSize];
   if (palette != nullptr && colors < kPaletteSize) {
     memcpy(whole, palette, sizeof(uint32) * colors);

@@ -10,13 +10,15 @@ namespace raster::checked {
 namespace {
 
 /// Where a copy works: two views of the same pixel size, which may overlap where they are one.
-RasterStatus placeCopy(const RasterView* dst, const Rect* rect, const RasterView* src, int32 srcX,
-                       int32 srcY, uint32 flags, Area* area) {
+[[gnu::always_inline]] inline RasterStatus placeCopy(const RasterView* dst, const Rect* rect,
+                                                     const RasterView* src, int32 srcX, int32 srcY,
+                                                     uint32 flags, Area* area) {
   const RasterStatus status = placeBoth(dst, rect, src, srcX, srcY, flags, area);
   if (status != RASTER_STATUS_OK) return status;
   if (dst->bpp != src->bpp) return RASTER_STATUS_BAD_FORMAT;
   const bool same = dst->data == src->data && dst->pitch == src->pitch;
-  if (!same && area->inDst(*dst).overlaps(area->inSrc(*src))) return RASTER_STATUS_OVERLAP;
+  if (!same && areNear(*dst, *src) && area->inDst(*dst).overlaps(area->inSrc(*src)))
+    return RASTER_STATUS_OVERLAP;
   return RASTER_STATUS_OK;
 }
 
@@ -87,7 +89,7 @@ RasterStatus RasterChecked_RopCopy(const RasterView* dst, const Rect* rect, cons
 
 RasterStatus RasterChecked_Tile(const RasterView* dst, const Rect* rect, const RasterView* pixmap,
                                 int32 tileX, int32 tileY, uint32 rop, uint32 flags) {
-  using raster::checked::phase;
+  using namespace raster::checked;
   if (rop >= RASTER_ROP_COUNT) return RASTER_STATUS_BAD_ARGUMENT;
   Area area;
   RasterStatus status = raster::checked::checkPixels(pixmap);
@@ -96,7 +98,8 @@ RasterStatus RasterChecked_Tile(const RasterView* dst, const Rect* rect, const R
   if (dst->bpp != pixmap->bpp) return RASTER_STATUS_BAD_FORMAT;
   if (pixmap->width == 0 || pixmap->height == 0) return RASTER_STATUS_BAD_ARGUMENT;
   if (area.isEmpty()) return RASTER_STATUS_OK;
-  if (area.inDst(*dst).overlaps(raster::checked::Span(*pixmap))) return RASTER_STATUS_OVERLAP;
+  if (areNear(*dst, *pixmap) && area.inDst(*dst).overlaps(Span(*pixmap)))
+    return RASTER_STATUS_OVERLAP;
   Raster_RectPixmapROPcopy(dst->data, dst->pitch, pixmap->data, pixmap->pitch,
                            static_cast<int32>(dst->bpp / 8), phase(tileX, area.srcX, pixmap->width),
                            phase(tileY, area.srcY, pixmap->height), pixmap->width, pixmap->height,

@@ -50,7 +50,7 @@ RasterStatus RasterChecked_Scale(const RasterView* dst, const Rect* rect, const 
   if (!isScaleSize(dst->width, dst->height) || !isScaleSize(src->width, src->height))
     return RASTER_STATUS_TOO_BIG;
   if (area.isEmpty() || src->width == 0 || src->height == 0) return RASTER_STATUS_OK;
-  if (area.inDst(*dst).overlaps(Span(*src))) return RASTER_STATUS_OVERLAP;
+  if (areNear(*dst, *src) && area.inDst(*dst).overlaps(Span(*src))) return RASTER_STATUS_OVERLAP;
   return drawScaled(*dst, area, *src, {scaleX, scaleY}, smooth != 0);
 }
 

@@ -37,10 +37,35 @@ constexpr uint64 kMebibyte = uint64{1} << 20;
 constexpr RasterLimits kDefaultLimits = {16384,           16384,         256 * kMebibyte,
                                          256 * kMebibyte, 8 * kMebibyte, 1000};
 
+/// What is left of one side, in numbers that do not wrap.
+struct Part {
+  int64 to;
+  int64 from;
+  int64 size;
+
+  Part(int32 first, int32 end, uint32 viewSize, int32 begin, uint32 sourceSize)
+      : to(first), from(begin) {
+    const int64 low = std::max<int64>(0, std::max(-to, -from));
+    const int64 high = std::min(end - to, std::min<int64>(viewSize - to, sourceSize - from));
+    to += low;
+    from += low;
+    size = high - low;
+  }
+};
+
 }  // namespace
 
 RasterLimits limitsOf(const RasterLimits* given) {
   return given != nullptr ? *given : kDefaultLimits;
+}
+
+Area clipped(const RasterView& dst, Rect rect, Source src) {
+  const Part across(rect.left, rect.right, dst.width, src.x, src.width);
+  const Part down(rect.top, rect.bottom, dst.height, src.y, src.height);
+  if (across.size <= 0 || down.size <= 0) return {};
+  return {static_cast<uint32>(across.to),   static_cast<uint32>(down.to),
+          static_cast<uint32>(across.from), static_cast<uint32>(down.from),
+          static_cast<uint32>(across.size), static_cast<uint32>(down.size)};
 }
 
 }  // namespace raster::checked

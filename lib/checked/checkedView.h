@@ -17,18 +17,13 @@ RasterLimits limitsOf(const RasterLimits* given);
 
 // ---- Views -------------------------------------------------------------------------------------
 
+/// The depths of pixels of 0 to 4 bytes, a bit each.
+inline constexpr uint32 kDepths[] = {0, 1u << 8 | 1u << 6 | 1u << 3, 1u << 16 | 1u << 15, 1u << 24,
+                                     1u << 24};
+
 inline bool isFormat(uint32 depth, uint32 bpp) {
-  switch (bpp) {
-    case 32:
-    case 24:
-      return depth == 24;
-    case 16:
-      return depth == 16 || depth == 15;
-    case 8:
-      return depth == 8 || depth == 6 || depth == 3;
-    default:
-      return bpp == 1 && depth == 1;
-  }
+  if (bpp == 1) return depth == 1;
+  return bpp <= 32 && bpp % 8 == 0 && depth < 32 && (kDepths[bpp / 8] >> depth & 1) != 0;
 }
 
 inline bool isPlane(const RasterView& view) { return view.bpp == 1; }
@@ -57,7 +52,7 @@ inline RasterStatus checkView(const RasterView* view) {
   if (!isFormat(view->depth, view->bpp)) return RASTER_STATUS_BAD_FORMAT;
   // Of pixels of 2 and 4 bytes there are only whole ones in a row.
   const uint32 part = view->bpp == 16 || view->bpp == 32 ? view->bpp / 8 - 1 : 0;
-  if (view->width > INT32_MAX || view->height > INT32_MAX || view->pitch > INT32_MAX ||
+  if ((view->width | view->height | view->pitch) > INT32_MAX ||
       view->pitch < rowBytes(view->width, view->bpp) || (view->pitch & part) != 0)
     return RASTER_STATUS_BAD_VIEW;
   const uint64 needed = rowsBytes(view->width, view->height, view->pitch, view->bpp);
@@ -103,51 +98,56 @@ struct Area {
   Span inSrc(const RasterView& view) const { return {view, srcX, srcY, width, height}; }
 };
 
-/// A source of any size and the place in it that falls on the top left of the rectangle.
+/// Whether two valid views may have memory in common: what is cheap to ask before the same question
+/// about parts of them. Gaps behind their last rows count.
+inline bool areNear(const RasterView& a, const RasterView& b) {
+  const uint64 atA = reinterpret_cast<uintptr_t>(a.data);
+  const uint64 atB = reinterpret_cast<uintptr_t>(b.data);
+  return atA < atB + uint64{b.pitch} * b.height && atB < atA + uint64{a.pitch} * a.height;
+}
+
+/// The size of a source and the place in it that falls on the top left of the rectangle.
 struct Source {
-  int64 x, y;
-  int64 width, height;
+  int32 x, y;
+  uint32 width, height;
 };
-inline constexpr int64 kEndless = int64{1} << 40;
-/// For calls without a source: the area's place in it is how much was clipped off.
-inline constexpr Source kNoSource = {0, 0, kEndless, kEndless};
+/// For calls without a source, which is never too small then: the area's place in it is how much
+/// was clipped off.
+inline constexpr Source kNoSource = {0, 0, UINT32_MAX, UINT32_MAX};
 
-/// One side of an area, as numbers of any size.
-struct Side {
-  int64 to;
-  int64 from;
-  int64 size;
+/// Whether a piece from `first` to `end`, which is not empty, lies in a view's side, and as much
+/// from `from` on in a source's.
+inline bool fits(int32 first, int32 end, uint32 viewSize, int32 from, uint32 sourceSize) {
+  return first >= 0 && static_cast<uint32>(end) <= viewSize && from >= 0 &&
+         static_cast<uint32>(from) <= sourceSize &&
+         static_cast<uint32>(end - first) <= sourceSize - static_cast<uint32>(from);
+}
 
-  /// Cuts off what lies outside; false when there was something.
-  bool cut(int64 toSize, int64 fromSize) {
-    if (to >= 0 && from >= 0 && to + size <= toSize && from + size <= fromSize) return true;
-    const int64 low = std::max<int64>(0, std::max(-to, -from));
-    const int64 high = std::min(size, std::min(toSize - to, fromSize - from));
-    *this = {to + low, from + low, std::max<int64>(0, high - low)};
-    return false;
-  }
-};
+/// What is left of a rectangle that is not empty.
+Area clipped(const RasterView& dst, Rect rect, Source src);
 
 /// Checks a rectangle (null: the whole view) against a valid view and its source, and clips it if
 /// the flags say so. The one place where coordinates are compared with sizes.
-inline RasterStatus place(const RasterView& dst, const Rect* rect, const Source& src, uint32 flags,
+inline RasterStatus place(const RasterView& dst, const Rect* given, Source src, uint32 flags,
                           Area* area) {
   if ((flags & ~uint32{RASTER_CHECKED_CLIP}) != 0) return RASTER_STATUS_BAD_ARGUMENT;
-  Side column = {0, src.x, dst.width};
-  Side row = {0, src.y, dst.height};
-  if (rect != nullptr) {
-    column = {rect->left, src.x, int64{rect->right} - rect->left};
-    row = {rect->top, src.y, int64{rect->bottom} - rect->top};
+  Rect rect = {0, 0, static_cast<int32>(dst.width), static_cast<int32>(dst.height)};
+  if (given != nullptr) rect = *given;
+  if (rect.right <= rect.left || rect.bottom <= rect.top) {
+    *area = {};
+  } else if (fits(rect.left, rect.right, dst.width, src.x, src.width) &&
+             fits(rect.top, rect.bottom, dst.height, src.y, src.height)) {
+    *area = {static_cast<uint32>(rect.left),
+             static_cast<uint32>(rect.top),
+             static_cast<uint32>(src.x),
+             static_cast<uint32>(src.y),
+             static_cast<uint32>(rect.right - rect.left),
+             static_cast<uint32>(rect.bottom - rect.top)};
+  } else if (flags == 0) {
+    return RASTER_STATUS_OUTSIDE;
+  } else {
+    *area = clipped(dst, rect, src);
   }
-  *area = {};
-  if (column.size <= 0 || row.size <= 0) return RASTER_STATUS_OK;
-  const bool inColumns = column.cut(dst.width, src.width);
-  const bool inRows = row.cut(dst.height, src.height);
-  if (!(inColumns && inRows) && flags == 0) return RASTER_STATUS_OUTSIDE;
-  if (column.size == 0 || row.size == 0) return RASTER_STATUS_OK;
-  *area = {static_cast<uint32>(column.to),   static_cast<uint32>(row.to),
-           static_cast<uint32>(column.from), static_cast<uint32>(row.from),
-           static_cast<uint32>(column.size), static_cast<uint32>(row.size)};
   return RASTER_STATUS_OK;
 }
 
