@@ -7,7 +7,7 @@
 /// - A frame buffer is a base pointer to byte 0 of row 0, a pitch (bytes from one row to the next),
 ///   and a pixel size or format. Pixel (x, y) starts at base + y * pitch + x * bytes per pixel.
 ///   Base and pitch may have any alignment. Nothing outside the named rectangle is read or written.
-/// - No pointer may be null unless its function says so, not even where nothing is drawn.
+/// - No pointer may be null unless its function says so, but for the pixels of empty rectangles.
 /// - Memory that is read and memory that is written must not overlap unless the function says what
 ///   happens then.
 /// - Coordinates and sizes are in pixels, 32-bit. The caller clips; nothing checks bounds.
