@@ -1,6 +1,6 @@
 #!/bin/sh
 # What the example of a live screen says of a screen of its own. In the environment: LIVE_SCREEN, the program.
-. "$(dirname "$0")/../tests/tools/common.sh"
+. "$(dirname "$0")/common.sh"
 for program in Xvfb xsetroot xlogo; do
   have $program || { note "skipped: no $program here"; exit 77; }
 done
