@@ -76,7 +76,9 @@ void ScreenWatch::begin() {
   xcb_connection_t* connection = screen.handle();
   if (hasDamage && damageId == XCB_NONE) {
     damageId = xcb_generate_id(connection);
-    xcb_damage_create(connection, damageId, screen.root(), XCB_DAMAGE_REPORT_LEVEL_RAW_RECTANGLES);
+    // What was told since the last capture is not told again.
+    xcb_damage_create(connection, damageId, screen.root(),
+                      XCB_DAMAGE_REPORT_LEVEL_DELTA_RECTANGLES);
   }
   if (hasCursor)
     xcb_xfixes_select_cursor_input(connection, screen.root(),
