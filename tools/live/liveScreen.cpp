@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <ctime>
 #include <utility>
 
 #include "cursorImage.h"
@@ -12,8 +13,6 @@
 namespace tool::live {
 namespace {
 
-using std::chrono::duration;
-using std::chrono::duration_cast;
 using std::chrono::milliseconds;
 
 constexpr milliseconds kGathering(2);        // from the first damage on, so that drawing ends
@@ -28,12 +27,19 @@ LiveCursor scaledCursor(LiveCursor cursor, double scale) {
       cursor.hotSpotOnScreen, {shape.hotX, shape.hotY}, shape.width, shape.height, image.pixels()};
 }
 
+/// What this process has had so far.
+Pace::Clock::duration cpuTime() {
+  timespec spent;
+  clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &spent);
+  return std::chrono::seconds(spent.tv_sec) + std::chrono::nanoseconds(spent.tv_nsec);
+}
+
 }  // namespace
 
 LiveScreen::LiveScreen(const ServeOptions& chosen)
     : options(chosen),
       watch(chosen.display, chosen.region, chosen.hidden),
-      interval(duration_cast<Clock::duration>(duration<double>(1 / chosen.maxRate))) {
+      pace(chosen.maxRate, chosen.busyRate) {
   if (!watch.tellsDamage())
     fputs("the display does not tell what changes: comparing four times a second\n", stderr);
   changeSize();
@@ -133,12 +139,13 @@ bool LiveScreen::listen(Clock::time_point now) {
 
 LiveScreen::Clock::time_point LiveScreen::captureTime() const {
   if (isDamaged()) return std::max(restsUntil(), damagedSince + kGathering);
-  return lastCapture + std::max<Clock::duration>(interval, kBlindInterval);
+  return std::max(restsUntil(), pace.lastCapture() + kBlindInterval);
 }
+
+void LiveScreen::rest(Clock::time_point captured) { pace.captured(captured, cpuTime()); }
 
 void LiveScreen::capture(Clock::time_point now, ChangeList& changed) {
   if (!watch.tellsDamage() || watch.refreshPalette()) damage.addAll();
-  lastCapture = now;
   const std::optional<PixelView> captured = watch.capture(damage);
   if (!captured) return;
   ChangeList differing(watch.width(), watch.height());

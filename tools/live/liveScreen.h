@@ -9,6 +9,7 @@
 #include <chrono>
 #include <optional>
 
+#include "pace.h"
 #include "scaledPicture.h"
 #include "screenWatch.h"
 #include "serveOptions.h"
@@ -20,7 +21,7 @@ namespace tool::live {
 
 class LiveScreen {
  public:
-  using Clock = std::chrono::steady_clock;
+  using Clock = Pace::Clock;
 
   explicit LiveScreen(const ServeOptions& chosen);
 
@@ -46,9 +47,11 @@ class LiveScreen {
   bool isDamaged() const { return !damage.isEmpty(); }
   Clock::time_point captureTime() const;
   /// No capture is due before that, and so what the display says may wait.
-  Clock::time_point restsUntil() const { return lastCapture + interval; }
+  Clock::time_point restsUntil() const { return pace.restsUntil(); }
   /// Brings the picture up to date and adds to `changed` what of it is another one.
   void capture(Clock::time_point now, ChangeList& changed);
+  /// What came of a capture has been sent to the viewers that waited.
+  void rest(Clock::time_point captured);
 
   /// When a tint is to go, and the going of it.
   std::optional<Clock::time_point> nextExpiry() const;
@@ -80,7 +83,7 @@ class LiveScreen {
 
   const ServeOptions& options;
   ScreenWatch watch;
-  Clock::duration interval;
+  Pace pace;
   Picture seen;  // what viewers have or will get
   std::optional<ScaledPicture> scaled;
   std::optional<TintedPicture> tinted;
@@ -94,7 +97,6 @@ class LiveScreen {
   bool heard = false;
   bool hasMore = false;
   Clock::time_point damagedSince;
-  Clock::time_point lastCapture;
   uint64 rectCount = 0;
   uint64 pixelCount = 0;
   TileCount tileCount;

@@ -60,6 +60,12 @@ void addWhat(CLI::App* command, ServeOptions& options) {
       ->check(finiteNumber(0.1, 1000))
       ->type_name("FPS")
       ->capture_default_str();
+  command
+      ->add_option("--busy-rate", options.busyRate,
+                   "captures a second at least, however much CPU time they cost")
+      ->check(finiteNumber(0.1, 1000))
+      ->type_name("FPS")
+      ->capture_default_str();
   CLI::Option* input =
       command->add_flag("--input", options.input,
                         "let viewers move the pointer and type; on a shared machine with "

@@ -26,7 +26,8 @@ struct ServeOptions {
   std::string recording;
   bool once = false;
   bool stats = false;
-  double maxRate = 40;
+  double maxRate = 60;
+  double busyRate = 20;
 };
 
 }  // namespace tool::live

@@ -96,14 +96,17 @@ void Server::attend(Clock::time_point now) {
   }));
   if (now >= nextListening) listenToScreen(now);
   if (!isWatched()) return;
-  if (isCapturePending() && now >= screen.captureTime()) {
+  const bool captures = isCapturePending() && now >= screen.captureTime();
+  if (captures) {
     listenToScreen(now);
     screen.capture(now, changed);
-    nextListening = screen.restsUntil();
   }
   screen.expire(now, changed);
   tellChanges();
   if (screen.hasPicture()) update();
+  if (!captures) return;
+  screen.rest(now);
+  nextListening = screen.restsUntil();
 }
 
 int Server::timeout(Clock::time_point now) const {
