@@ -209,4 +209,23 @@ TEST(ZrleEncoder, IsDecodedToTheSamePixelsInEveryFormat) {
   for (const bool wasMet : forms) EXPECT_TRUE(wasMet);
 }
 
+TEST(ZrleEncoder, RepeatsAPatternBrieflyWhicheverColourItBeginsWith) {
+  constexpr uint32 kSide = 64;
+  const uint32 colours[] = {0xC0C0C0, 0x102030, 0xFFFFFF, 0x808080};
+  Random random(8);
+  std::vector<uint32> pixels;
+  for (uint32 i = 0; i < kSide * kSide; ++i) pixels.push_back(colours[random.below(4)]);
+  const PixelView view = {reinterpret_cast<const uint8*>(pixels.data()), 4 * kSide, kSide, kSide};
+  ZrleEncoder encoder;
+  Bytes out;
+  encoder.put(view, view.bounds(), ViewerFormat(), out);
+  EXPECT_GT(out.size(), kSide * kSide / 4);
+  for (const uint32 colour : colours) {
+    pixels[0] = colour;
+    out.clear();
+    encoder.put(view, view.bounds(), ViewerFormat(), out);
+    EXPECT_LT(out.size(), kSide * kSide / 4 / 8);
+  }
+}
+
 }  // namespace

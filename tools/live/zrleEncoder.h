@@ -25,13 +25,16 @@ class ZrleEncoder {
   void put(const PixelView& pixels, const Rect& rect, const ViewerFormat& format, Bytes& out);
 
  private:
+  // Of the levels that take no more time than 1, the one whose output is the smallest.
+  static constexpr int kUsualLevel = 5;
+
   void putTiles(const PixelView& pixels, const Rect& rect, const ViewerFormat& format);
   void deflateTo(Bytes& out);
 
   z_stream stream = {};
   bool isStarted = false;
-  int level = 1;
-  int usedLevel = 1;
+  int level = kUsualLevel;
+  int usedLevel = kUsualLevel;
   Bytes tiles;
 };
 

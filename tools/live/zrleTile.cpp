@@ -44,6 +44,17 @@ Survey surveyOf(const uint32* pixels, uint32 count) {
   return survey;
 }
 
+/// The same colours in the order of their values, whichever of them the tile began with: what looks
+/// alike in two tiles then has the same bytes, and zlib finds it.
+Palette sorted(const Palette& palette) {
+  uint32 colours[Palette::kNone];
+  for (uint32 i = 0; i < palette.size(); ++i) colours[i] = palette.colour(i);
+  std::sort(colours, colours + palette.size());
+  Palette inOrder;
+  for (uint32 i = 0; i < palette.size(); ++i) inOrder.indexOf(colours[i]);
+  return inOrder;
+}
+
 uint32 bitsOfIndex(uint32 colours) { return colours <= 2 ? 1 : colours <= 4 ? 2 : 4; }
 
 /// Writes into room that is known to be enough, and three bytes beyond.
@@ -92,7 +103,7 @@ void writePalette(Writer& writer, const Palette& palette) {
   for (uint32 i = 0; i < palette.size(); ++i) writer.putPixel(palette.colour(i));
 }
 
-void writePaletteRuns(Writer& writer, const Tile& tile, Palette& palette) {
+void writePaletteRuns(Writer& writer, const Tile& tile, Palette palette) {
   constexpr uint32 kIsRun = 128;
   writer.put(kPlainRuns + palette.size());
   writePalette(writer, palette);
@@ -103,7 +114,7 @@ void writePaletteRuns(Writer& writer, const Tile& tile, Palette& palette) {
   });
 }
 
-void writePacked(Writer& writer, const Tile& tile, Palette& palette) {
+void writePacked(Writer& writer, const Tile& tile, Palette palette) {
   const uint32 bits = bitsOfIndex(palette.size());
   writer.put(palette.size());
   writePalette(writer, palette);
@@ -150,9 +161,9 @@ void putZrleTile(const uint32* pixels, uint32 width, uint32 height, const PixelP
     writer.put(kSolid);
     writer.putPixel(*pixels);
   } else if (packed == least) {
-    writePacked(writer, tile, survey.palette);
+    writePacked(writer, tile, sorted(survey.palette));
   } else if (paletteRuns == least) {
-    writePaletteRuns(writer, tile, survey.palette);
+    writePaletteRuns(writer, tile, sorted(survey.palette));
   } else if (plainRuns == least) {
     writePlainRuns(writer, tile);
   } else {
