@@ -21,6 +21,7 @@
 #include "frame/pixelFormat.h"
 #include "vector/fields-inl.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 #include "vector/triples-inl.h"
 
 #if HWY_TARGET != HWY_SCALAR
@@ -49,15 +50,16 @@ template <class D> HWY_INLINE Block<D> loadTripleBlock(D d, const uint8* at) {
 }
 
 /// Four vectors, three quarters of each in use, become three.
-template <class D> HWY_INLINE void storeTripleBlock(D d, const Block<D>& block, uint8* at) {
+template <bool kStreams, class D>
+HWY_INLINE void storeTripleBlock(D d, const Block<D>& block, uint8* at) {
   constexpr size_t kBytes = kLanes<D> * 4;
   const auto v0 = gatherTriples<0>(d, block.v[0]);
   const auto v1 = gatherTriples<1>(d, block.v[1]);
   const auto v2 = gatherTriples<2>(d, block.v[2]);
   const auto v3 = gatherTriples<3>(d, block.v[3]);
-  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4 * 3), v0, v1), at);
-  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 2), v1, v2), at + kBytes);
-  storeLanes(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4), v2, v3), at + 2 * kBytes);
+  putLanes<kStreams>(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4 * 3), v0, v1), at);
+  putLanes<kStreams>(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 2), v1, v2), at + kBytes);
+  putLanes<kStreams>(d, hn::IfThenElse(hn::FirstN(d, kLanes<D> / 4), v2, v3), at + 2 * kBytes);
 }
 
 // ---- Narrow lanes ------------------------------------------------------------------------------
@@ -112,10 +114,11 @@ template <class D> HWY_INLINE void storeByteBlock(D d, const Block<D>& block, ui
 }
 
 /// Stores the low halves of 32-bit lanes.
-template <class D> HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, uint8* at) {
+template <bool kStreams, class D>
+HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, uint8* at) {
   const hn::Repartition<uint16, D> d16;
   for (size_t i = 0; i < 2; ++i) {
-    storeLanes(
+    putLanes<kStreams>(
         d16,
         hn::ConcatEven(d16, hn::BitCast(d16, block.v[2 * i + 1]), hn::BitCast(d16, block.v[2 * i])),
         at + i * kBlockPixels<D>);
@@ -187,16 +190,18 @@ template <unsigned kBytes, class D> HWY_INLINE Block<D> loadBlock(D d, const uin
   }
 }
 
-template <unsigned kBytes, class D>
+/// With kStreams as putLanes does; pixels of one byte have no such way.
+template <unsigned kBytes, bool kStreams = false, class D>
 HWY_INLINE void storeBlock(D d, const Block<D>& block, uint8* at) {
   if constexpr (kBytes == sizeof(hn::TFromD<D>)) {
     for (size_t i = 0; i < Block<D>::kVectors; ++i)
-      storeLanes(d, block.v[i], at + i * kBlockPixels<D>);
+      putLanes<kStreams>(d, block.v[i], at + i * kBlockPixels<D>);
   } else if constexpr (kBytes == 3) {
-    storeTripleBlock(d, block, at);
+    storeTripleBlock<kStreams>(d, block, at);
   } else if constexpr (kBytes == 2) {
-    storeHalfBlock(d, block, at);
+    storeHalfBlock<kStreams>(d, block, at);
   } else {
+    static_assert(!kStreams);
     storeByteBlock(d, block, at);
   }
 }

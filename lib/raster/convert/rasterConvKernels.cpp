@@ -15,6 +15,7 @@
 #include "pixelLanes-inl.h"
 #include "rasterConvInternal.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -98,9 +99,9 @@ HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
   }
 }
 
-template <class From, class To, class D>
+template <class From, class To, bool kStreams = false, class D>
 HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
-  storeBlock<To::kBytes>(d, loadConvertedBlock<From, To>(d, src), dst);
+  storeBlock<To::kBytes, kStreams>(d, loadConvertedBlock<From, To>(d, src), dst);
 }
 
 /// Block after block; the last one ends with the row and may do some pixels again. Rows that are
@@ -129,6 +130,45 @@ template <class From, class To, class D> void convertRowsByBlocks(D d, const Row
   }
 }
 
+/// How many pixels after `at`, at least one, is an address that is a multiple of kAlignment, a
+/// power of two. `at` is a multiple of the pixel size where that is a power of two.
+template <unsigned kBytes, size_t kAlignment> HWY_INLINE size_t pixelsToAlignment(const uint8* at) {
+  constexpr size_t kThird = 43;  // times 3 it is 1, modulo the alignment
+  static_assert(kThird * 3 % kAlignment == 1);
+  const size_t missing = 0 - reinterpret_cast<uintptr_t>(at);
+  if constexpr (kBytes == 3) {
+    return (missing * kThird - 1) % kAlignment + 1;
+  } else {
+    return (missing - kBytes) % kAlignment / kBytes + 1;
+  }
+}
+
+/// Rows of some blocks, stored past the caches: the first block and the last one, which are not,
+/// may do some pixels again.
+template <class From, class To, class D> void streamRowsByBlocks(D d, const RowPair& rows) {
+  constexpr size_t kPixels = kBlockPixels<D>;
+  const size_t last = rows.bytes / To::kBytes - kPixels;
+  uint8* dst = rows.dst;
+  const uint8* src = rows.src;
+  for (uint32 y = rows.rows; y != 0; --y) {
+    convertBlock<From, To>(d, dst, src);
+    for (size_t x = pixelsToAlignment<To::kBytes, kPixels>(dst); x < last; x += kPixels)
+      convertBlock<From, To, true>(d, dst + x * To::kBytes, src + x * From::kBytes);
+    convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes);
+    dst = nextRow(dst, rows.dstStep);
+    src = nextRow(src, rows.srcStep);
+  }
+  endStreams();
+}
+
+/// Whether rows go past the caches. Pixels that do not lie at multiples of their size never meet a
+/// vector's boundary; their steps are such multiples (rowStep).
+template <class From, class To> HWY_INLINE bool areStreamed(const RowPair& rows) {
+  constexpr size_t kPart = To::kBytes == 3 ? 1 : To::kBytes;
+  return isStreamed(rows.bytes, rows.bytes / To::kBytes * (From::kBytes + To::kBytes), rows.rows) &&
+         reinterpret_cast<uintptr_t>(rows.dst) % kPart == 0;
+}
+
 template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
     convertPaletteRows<To>(rows, palette);
@@ -139,7 +179,11 @@ template <class From, class To> void convertRows(const RowPair& rows, const uint
     // was measured to be faster than a whole one.
     constexpr size_t kMaxLanes = From::kBytes + To::kBytes == 7 ? 8 : 64;
     using Lane = std::conditional_t<kShort, uint16, uint32>;
-    convertRowsByBlocks<From, To>(hn::CappedTag<Lane, kMaxLanes>(), rows);
+    const hn::CappedTag<Lane, kMaxLanes> d;
+    if constexpr (To::kBytes > 1) {
+      if (areStreamed<From, To>(rows)) return streamRowsByBlocks<From, To>(d, rows);
+    }
+    convertRowsByBlocks<From, To>(d, rows);
   }
 }
 

@@ -12,6 +12,7 @@
 #include "vector/pixelPattern-inl.h"
 #include "ops/rasteropsInternal.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -88,7 +89,34 @@ HWY_NOINLINE void fillWithPattern(const Rows& rows, const PixelWords& pixels) {
   });
 }
 
+/// Fills rows of more than three vectors past the caches.
+HWY_NOINLINE void fillFarRows(const Rows& rows, const PixelWords& pixels) {
+  const Bytes d;
+  constexpr size_t n = kLanes<Bytes>;
+  const size_t bytes = rows.bytes;
+  const PixelPattern pattern = patternOf(pixels);
+  const uint8* const lastPixels = pattern.bytes + (bytes - n) % sizeof pixels;
+  forRows(rows, [&](uint8* row) HWY_ATTR {
+    size_t i = n - reinterpret_cast<uintptr_t>(row) % n;
+    const uint8* const pixelsFromThere = pattern.bytes + i;
+    const auto first = loadLanes(d, pixelsFromThere);
+    const auto second = loadLanes(d, pixelsFromThere + n);
+    const auto third = loadLanes(d, pixelsFromThere + 2 * n);
+    storeLanes(d, loadLanes(d, pattern.bytes), row);
+    for (; bytes - i >= 3 * n; i += 3 * n) {
+      putLanes<true>(d, first, row + i);
+      putLanes<true>(d, second, row + i + n);
+      putLanes<true>(d, third, row + i + 2 * n);
+    }
+    if (bytes - i >= n) putLanes<true>(d, first, row + i);
+    if (bytes - i >= 2 * n) putLanes<true>(d, second, row + i + n);
+    storeLanes(d, loadLanes(d, lastPixels), row + bytes - n);
+  });
+  endStreams();
+}
+
 void fillRows(const Rows& rows, const PixelWords& pixels) {
+  if (isStreamed(rows.bytes, rows.bytes, rows.rows)) return fillFarRows(rows, pixels);
   const uint32* const word = pixels.word;
   if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(rows, pixels);
   fillWithWord(rows, word[0]);
@@ -112,8 +140,19 @@ void moveRow(uint8* dst, const uint8* src, size_t bytes) {
 // the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
 constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 32 * 1024;
 
+/// Whether no row shares bytes with any row of the source.
+bool areApart(const RowPair& rows) {
+  return RowSpan(rows.dst, rows.dstStep, rows.bytes, rows.rows)
+      .isApartFrom(RowSpan(rows.src, rows.srcStep, rows.bytes, rows.rows));
+}
+
 HWY_NOINLINE void copyLongRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
+  if (isStreamed(bytes, 2 * bytes, rows.rows) && areApart(rows)) {
+    forRows(rows, [&](uint8* dst, const uint8* src)
+                      HWY_ATTR { streamLongRow(dst, src, bytes, kCopied); });
+    return endStreams();
+  }
   forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
     if (bytes <= kMaxOwnBytes) {
       moveRow(dst, src, bytes);

@@ -13,6 +13,7 @@
 #include "ops/rasterpixInternal.h"
 #include "ops/rop-inl.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -21,12 +22,15 @@ namespace {
 using Bytes = hn::ScalableTag<uint8>;
 using Copy = std::remove_const_t<decltype(kCopy)>;
 
+/// Where a rectangle lies: in the inner caches, beyond them, or beyond all caches.
+enum class Reach { kNear, kFar, kBeyond };
+
 #if HWY_TARGET == HWY_SCALAR
 
 constexpr size_t kBlockBytes = 1024;
 
 /// Combines a row with a source of the same length.
-template <class Rop, bool kFar> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
+template <class Rop, Reach kReach> void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   combineInOrder<Rop, Walk::kToRight>(dst, src, bytes);
 }
 
@@ -37,7 +41,7 @@ void repeatShortRow(Bytes /*d*/, uint8* dst, const uint8* src, size_t period, si
 }
 
 /// Combines a row with a pattern that repeats after `period` bytes.
-template <class Rop, bool kFar>
+template <class Rop, Reach kReach>
 void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                     size_t /*lastPhase*/) {
   for (size_t i = 0; i != bytes; i += std::min(bytes - i, period))
@@ -50,18 +54,25 @@ void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t perio
 constexpr size_t kBlockBytes = 128;
 static_assert(kBlockBytes >= 2 * kLanes<Bytes>);
 
+/// What is beyond all caches and not read goes past them; what is far or read is fetched ahead.
+template <class Rop, Reach kReach>
+inline constexpr bool kStreams = kReach == Reach::kBeyond && !kReadsDst<Rop>;
+template <class Rop, Reach kReach>
+inline constexpr bool kFetches = kReach != Reach::kNear && !kStreams<Rop, kReach>;
+
 /// Combines whole blocks from `dst` to less than a block before `end` with one that repeats.
-/// Returns where it stopped. The block stays in registers. With kFar, memory is fetched ahead.
-template <class Rop, bool kFar>
+/// Returns where it stopped. The block stays in registers. Memory that is far is fetched ahead.
+template <class Rop, Reach kReach>
 HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* pattern) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   hn::Vec<Bytes> block[kBlockBytes / n];
   for (size_t k = 0; k < kBlockBytes; k += n) block[k / n] = loadLanes(d, pattern + k);
   for (; static_cast<size_t>(end - dst) >= kBlockBytes; dst += kBlockBytes) {
-    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(dst + k);
+    for (size_t k = 0; kFetches<Rop, kReach> && k < kBlockBytes; k += kCacheLine)
+      fetchAhead(dst + k);
     for (size_t k = 0; k < kBlockBytes; k += n)
-      storeLanes(d, combinedWith<Rop>(d, block[k / n], dst + k), dst + k);
+      putLanes<kStreams<Rop, kReach>>(d, combinedWith<Rop>(d, block[k / n], dst + k), dst + k);
   }
   return dst;
 }
@@ -69,7 +80,7 @@ HWY_INLINE uint8* combineBlocks(uint8* dst, const uint8* end, const uint8* patte
 /// Combines a row of at least a vector with a pattern that repeats after `period` bytes, at least
 /// a block, and is there for another block. The byte `lastPhase` of the pattern falls on the start
 /// of the row's last vector.
-template <class Rop, bool kFar>
+template <class Rop, Reach kReach>
 HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, size_t period,
                                size_t lastPhase) {
   const Bytes d;
@@ -82,10 +93,12 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
   const uint8* const wrap = pattern + period;
   const auto left = [&] { return static_cast<size_t>(end - at); };
   if (period == kBlockBytes && left() >= kBlockBytes + n)
-    at = combineBlocks<Rop, kFar>(at, end - n, source);
+    at = combineBlocks<Rop, kReach>(at, end - n, source);
   for (; left() > kBlockBytes + n; at += kBlockBytes) {
-    for (size_t k = 0; kFar && k < kBlockBytes; k += kCacheLine) fetchAhead(at + k);
-    for (size_t k = 0; k < kBlockBytes; k += n) combine<Rop>(d, source + k, at + k);
+    for (size_t k = 0; kFetches<Rop, kReach> && k < kBlockBytes; k += kCacheLine)
+      fetchAhead(at + k);
+    for (size_t k = 0; k < kBlockBytes; k += n)
+      putLanes<kStreams<Rop, kReach>>(d, combined<Rop>(d, source + k, at + k), at + k);
     source += kBlockBytes;
     if (source >= wrap) source -= period;
   }
@@ -96,10 +109,10 @@ HWY_INLINE void combinePeriods(uint8* dst, const uint8* pattern, size_t bytes, s
 }
 
 /// Combines a row with a source of the same length.
-template <class Rop, bool kFar>
+template <class Rop, Reach kReach>
 HWY_INLINE void combineRow(uint8* dst, const uint8* src, size_t bytes) {
   if (bytes > kLanes<Bytes>) {
-    combinePeriods<Rop, kFar>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
+    combinePeriods<Rop, kReach>(dst, src, bytes, bytes, bytes - kLanes<Bytes>);
   } else {
     withShortRow(Bytes(), bytes, CombinedAt<Rop>(),
                  [&](auto row) HWY_ATTR { row(dst, src, bytes); });
@@ -154,7 +167,7 @@ template <class Rop> void tileRows(const TileRows& t) {
   uint32 srcY = t.srcY;
   for (uint32 y = t.height; y != 0; --y, dst = nextRow(dst, t.dstStep)) {
     tileRow(dst, rowAt(t.src, t.srcStep, srcY, 0, 0), t.bytes, t.period, t.phase,
-            combineRow<Rop, true>);
+            combineRow<Rop, Reach::kFar>);
     srcY = srcY + 1 == t.srcRows ? 0 : srcY + 1;
   }
 }
@@ -215,7 +228,7 @@ HWY_NOINLINE void widenRows(const uint8* src, intptr_t srcStep, size_t period, u
 }
 
 /// Combines rows with `wideRows` widened ones, from the one with the number `y` on.
-template <class Rop, bool kFar>
+template <class Rop, Reach kReach>
 HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, uint32 height,
                                   const uint8* wide, size_t wideStep, uint32 wideRows, uint32 y,
                                   size_t period) {
@@ -225,13 +238,35 @@ HWY_NOINLINE void combineWideRows(uint8* dst, intptr_t dstStep, size_t bytes, ui
   const size_t lastPhase = bytes <= n ? 0 : period == bytes ? bytes - n : (bytes - n) % period;
   for (; height != 0; --height, dst = nextRow(dst, dstStep)) {
     if (bytes <= n) {
-      combineRow<Rop, kFar>(dst, pattern, bytes);
+      combineRow<Rop, kReach>(dst, pattern, bytes);
     } else {
-      combinePeriods<Rop, kFar>(dst, pattern, bytes, period, lastPhase);
+      combinePeriods<Rop, kReach>(dst, pattern, bytes, period, lastPhase);
     }
     pattern += wideStep;
     if (pattern == end) pattern = wide;
   }
+}
+
+#if HWY_TARGET != HWY_SCALAR
+
+template <class Rop>
+HWY_NOINLINE void streamWideRows(uint8* dst, intptr_t dstStep, size_t bytes, uint32 height,
+                                 const uint8* wide, size_t wideStep, uint32 wideRows, uint32 y,
+                                 size_t period) {
+  combineWideRows<Rop, Reach::kBeyond>(dst, dstStep, bytes, height, wide, wideStep, wideRows, y,
+                                       period);
+  endStreams();
+}
+
+#endif
+
+/// What combines rows, for the distance at which they lie.
+template <class Rop> HWY_INLINE auto combineWideRowsAt(const TileRows& t) {
+#if HWY_TARGET != HWY_SCALAR
+  if (!kReadsDst<Rop> && isStreamed(t.bytes, t.bytes, t.height)) return streamWideRows<Rop>;
+#endif
+  return isFar(t.bytes, t.height) ? combineWideRows<Rop, Reach::kFar>
+                                  : combineWideRows<Rop, Reach::kNear>;
 }
 
 /// Widens all pixmap rows, or as many as there is room for before they are used.
@@ -242,8 +277,7 @@ template <class Rop> void tileWidened(const TileRows& t) {
   const size_t bytes = t.height / 2 >= t.srcRows ? kBufferBytes : kBufferBytes / 4;
   const auto room = static_cast<uint32>((bytes - kLongestVector) / w.step);
   const bool all = t.srcRows <= room && t.srcRows <= t.height;
-  const auto combineRows =
-      isFar(t.bytes, t.height) ? combineWideRows<Rop, true> : combineWideRows<Rop, false>;
+  const auto combineRows = combineWideRowsAt<Rop>(t);
   uint8* dst = t.dst;
   uint32 srcY = t.srcY;
   uint32 height = t.height;

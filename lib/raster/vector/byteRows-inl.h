@@ -26,6 +26,7 @@
 #include "frame/frameBuffer.h"
 #include "hwy/highway.h"
 #include "rows-inl.h"
+#include "streams-inl.h"
 
 #if HWY_TARGET != HWY_SCALAR
 
@@ -91,6 +92,18 @@ HWY_INLINE void storeLongRow(uint8* dst, const uint8* src, size_t bytes, const M
   }
   storeAndMake(end);
   storeLanes(d, block, dst + at);
+}
+
+/// Stores a row of more than a vector past the caches.
+template <class Make>
+HWY_INLINE void streamLongRow(uint8* dst, const uint8* src, size_t bytes, const Make& make) {
+  const hn::ScalableTag<uint8> d;
+  constexpr size_t n = kLanes<decltype(d)>;
+  const size_t end = bytes - n;
+  storeLanes(d, make(d, src, dst, 0), dst);
+  for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < end; i += n)
+    putLanes<true>(d, make(d, src, dst, i), dst + i);
+  storeLanes(d, make(d, src, dst, end), dst + end);
 }
 
 }  // namespace

@@ -1,0 +1,186 @@
+// SPDX-License-Identifier: MIT
+//
+// Rectangles that no cache holds, which may be stored past the caches, against the naive models:
+// whole buffers, at every alignment of a vector's store.
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <string>
+
+#include "raster.h"
+#include "reference/rasterConvReference.h"
+#include "reference/rasteropsReference.h"
+#include "reference/rasterpixReference.h"
+#include "support/guardedBuffer.h"
+#include "support/random.h"
+
+namespace {
+
+using reference::Bytes;
+using tests::GuardedBuffer;
+using tests::Random;
+
+/// What a call must read and write to be far: at least what is taken for the largest cache.
+constexpr size_t kFar = size_t{33} << 20;
+
+/// A destination that lies anywhere, with gaps between its rows or without.
+struct FarRows {
+  size_t base;
+  uint32 bytesPerPixel;
+  uint32 pitch;
+  uint32 width;
+  uint32 height;
+
+  size_t end() const { return base + size_t{pitch} * (height - 1) + size_t{width} * bytesPerPixel; }
+};
+
+/// Rows for which `touched` bytes a pixel are read and written.
+FarRows someFarRows(Random& random, uint32 bytesPerPixel, uint32 touched) {
+  FarRows rows{};
+  const uint32 gap = random.below(2) * bytesPerPixel * (1 + random.below(7));
+  rows.base = size_t{random.below(64)} * bytesPerPixel;
+  rows.bytesPerPixel = bytesPerPixel;
+  rows.width = 2048 + random.below(3000);
+  rows.pitch = rows.width * bytesPerPixel + gap;
+  rows.height = static_cast<uint32>(kFar / (size_t{rows.width} * touched)) + 1;
+  return rows;
+}
+
+std::string describe(const FarRows& r) {
+  return "base " + std::to_string(r.base) + " pitch " + std::to_string(r.pitch) + " size " +
+         std::to_string(r.width) + "x" + std::to_string(r.height) + " bytes " +
+         std::to_string(r.bytesPerPixel);
+}
+
+/// Noise that is made fast.
+Bytes noise(Random& random, size_t size) {
+  Bytes bytes = random.bytes(65521);
+  bytes.reserve(size + bytes.size());
+  while (bytes.size() < size) bytes.insert(bytes.end(), bytes.begin(), bytes.begin() + 65521);
+  bytes.resize(size);
+  return bytes;
+}
+
+/// Whether two buffers are equal; tells where they are not, in place of all their bytes.
+testing::AssertionResult areEqual(const GuardedBuffer& actual, const Bytes& expected) {
+  for (size_t i = 0; i < expected.size(); ++i) {
+    if (actual.data()[i] != expected[i])
+      return testing::AssertionFailure() << "byte " << i << " of " << expected.size() << " differs";
+  }
+  return testing::AssertionSuccess();
+}
+
+TEST(FarRectangles, AreFilled) {
+  Random random(1);
+  for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
+    const FarRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
+    const uint32 pixel = random.word();
+    Bytes expected(r.end(), 0x5A);
+    GuardedBuffer actual(expected.size());
+    actual.assign(expected);
+    reference::rectFill(expected, r.base, r.pitch, bytesPerPixel, pixel, 0, 0, r.width, r.height);
+    Raster_RectFill(actual.data() + r.base, r.pitch, bytesPerPixel, pixel, 0, 0, r.width, r.height);
+    ASSERT_TRUE(areEqual(actual, expected)) << describe(r);
+  }
+}
+
+TEST(FarRectangles, AreCopied) {
+  Random random(2);
+  for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
+    const FarRows r = someFarRows(random, bytesPerPixel, 2 * bytesPerPixel);
+    const Bytes source = noise(random, r.end());
+    Bytes expected(r.end(), 0x5A);
+    GuardedBuffer actual(expected.size());
+    actual.assign(expected);
+    const size_t rowBytes = size_t{r.width} * bytesPerPixel;
+    for (size_t at = 0; at < r.height * size_t{r.pitch}; at += r.pitch)
+      std::copy_n(source.begin() + static_cast<ptrdiff_t>(at), rowBytes,
+                  expected.begin() + static_cast<ptrdiff_t>(r.base + at));
+    Raster_RectCopy(actual.data() + r.base, r.pitch, source.data(), r.pitch, bytesPerPixel, 0, 0, 0,
+                    0, r.width, r.height);
+    ASSERT_TRUE(areEqual(actual, expected)) << describe(r);
+  }
+}
+
+TEST(FarRectangles, AreMovedWhereTheyOverlap) {
+  constexpr uint32 kWidth = 2100;
+  constexpr uint32 kPitch = 2110;
+  constexpr uint32 kHeight = kFar / (2 * kWidth) + 1;
+  struct Move {
+    uint32 srcX, srcY, dstX, dstY;
+  };
+  Random random(3);
+  for (const Move& m : {Move{0, 0, 1, 0}, Move{3, 0, 0, 0}, Move{0, 0, 0, 1}, Move{0, 2, 5, 0}}) {
+    Bytes expected = noise(random, size_t{kPitch} * (kHeight + 2));
+    GuardedBuffer actual(expected.size());
+    actual.assign(expected);
+    reference::rectCopy(expected, 0, kPitch, 0, kPitch, 1, m.srcX, m.srcY, m.dstX, m.dstY, kWidth,
+                        kHeight);
+    Raster_RectCopy(actual.data(), kPitch, actual.data(), kPitch, 1, m.srcX, m.srcY, m.dstX, m.dstY,
+                    kWidth, kHeight);
+    ASSERT_TRUE(areEqual(actual, expected))
+        << m.srcX << "," << m.srcY << " to " << m.dstX << "," << m.dstY;
+  }
+}
+
+void checkTiling(Random& random, uint32 bytesPerPixel, uint32 rop) {
+  const FarRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
+  const uint32 tileWidth = 1 + random.below(100);
+  const uint32 tileHeight = 1 + random.below(20);
+  const uint32 tilePitch = tileWidth * bytesPerPixel;
+  // The pixmap lies behind the rectangle.
+  Bytes expected = noise(random, r.end() + size_t{tilePitch} * tileHeight);
+  GuardedBuffer actual(expected.size());
+  actual.assign(expected);
+  reference::rectPixmapRopCopy(expected, static_cast<int64>(r.base), r.pitch,
+                               static_cast<int64>(r.end()), tilePitch, bytesPerPixel, 3, 5,
+                               tileWidth, tileHeight, rop, 0, 0, r.width, r.height);
+  Raster_RectPixmapROPcopy(actual.data() + r.base, r.pitch, actual.data() + r.end(), tilePitch,
+                           static_cast<int32>(bytesPerPixel), 3, 5, tileWidth, tileHeight, rop, 0,
+                           0, r.width, r.height);
+  ASSERT_TRUE(areEqual(actual, expected)) << describe(r) << " operation " << rop;
+}
+
+TEST(FarRectangles, AreTiled) {
+  Random random(4);
+  checkTiling(random, 3, RASTER_ROP_COPY);
+  checkTiling(random, 4, RASTER_ROP_COPY_INVERTED);
+}
+
+/// `shift` is what the destination lies beside a multiple of its pixel size.
+void checkConversion(Random& random, int32 srcDepth, int32 dstDepth, size_t shift) {
+  const auto bytesOf = [](int32 depth) { return static_cast<uint32>(depth + 7) / 8; };
+  FarRows r = someFarRows(random, bytesOf(dstDepth), bytesOf(srcDepth) + bytesOf(dstDepth));
+  r.base += shift;
+  const uint32 srcPitch = r.width * bytesOf(srcDepth);
+  const Bytes source = noise(random, size_t{srcPitch} * r.height);
+  Bytes expected(r.end() + 16, 0x5A);
+  GuardedBuffer actual(expected.size() - expected.size() % 16);
+  expected.resize(actual.size());
+  actual.assign(expected);
+  reference::convertPixels(expected, {r.base, r.pitch, 0, 0}, dstDepth, source, {0, srcPitch, 0, 0},
+                           srcDepth, false, {}, r.width, r.height);
+  Raster_ConvertPixels(actual.data() + r.base, r.pitch, dstDepth, source.data(), srcPitch, srcDepth,
+                       false, nullptr, 0, 0, 0, 0, r.width, r.height);
+  ASSERT_TRUE(areEqual(actual, expected)) << srcDepth << " to " << dstDepth << ": " << describe(r);
+}
+
+TEST(FarRectangles, AreConverted) {
+  struct Pair {
+    int32 src, dst;
+  };
+  Random random(5);
+  for (const Pair& p : {Pair{15, 16}, Pair{16, 24}, Pair{16, 32}, Pair{24, 15}, Pair{24, 32},
+                        Pair{32, 16}, Pair{32, 24}})
+    checkConversion(random, p.src, p.dst, 0);
+}
+
+TEST(FarRectangles, AreConvertedToPixelsBesideTheirBoundaries) {
+  Random random(6);
+  checkConversion(random, 16, 32, 1);
+  checkConversion(random, 24, 32, 2);
+  checkConversion(random, 32, 16, 1);
+}
+
+}  // namespace
