@@ -4,7 +4,9 @@
 add_library(raster_settings INTERFACE)
 target_compile_features(raster_settings INTERFACE cxx_std_20 c_std_11)
 target_compile_options(raster_settings INTERFACE
-  -Wall -Wextra -Wconversion -Wshadow -Wcast-align=strict -Wvla -Wundef -Wpointer-arith
+  -Wall -Wextra -Wconversion -Wshadow -Wcast-align$<$<CXX_COMPILER_ID:GNU>:=strict> -Wvla -Wundef
+  -Wpointer-arith
+  $<$<CXX_COMPILER_ID:Clang>:-Wno-sign-conversion>  # which -Wconversion has there only
   $<$<COMPILE_LANGUAGE:CXX>:-Wnon-virtual-dtor -Wold-style-cast>
   -ffp-contract=off -fno-common)
 if(RASTER_WERROR)
@@ -19,8 +21,14 @@ endif()
 if(RASTER_SANITIZE)
   # Reports need line numbers only, which take a third less time to compile.
   target_compile_options(raster_settings INTERFACE
-    -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)
-  target_link_options(raster_settings INTERFACE -fsanitize=address,undefined)
+    -fsanitize=${RASTER_SANITIZERS} -fno-sanitize-recover=all -fno-omit-frame-pointer -g1)
+  target_link_options(raster_settings INTERFACE -fsanitize=${RASTER_SANITIZERS})
+endif()
+
+if(RASTER_HARDENED)
+  target_compile_options(raster_settings INTERFACE
+    -fstack-protector-strong -fstack-clash-protection -fcf-protection=full -U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2)
+  target_link_options(raster_settings INTERFACE -Wl,-z,relro -Wl,-z,now)
 endif()
 
 if(RASTER_BUILD_FUZZ)
