@@ -33,9 +33,7 @@ template <class To> class ColorTable {
   using Lanes = hn::ScalableTag<std::conditional_t<kHalves == 1, uint16, uint32>>;
   using Halves = hn::ScalableTag<uint16>;
   static constexpr size_t kMinRow = kBlockPixels<Lanes>;
-  static constexpr bool kPays = true;
 #else
-  static constexpr size_t kMinRow = 1;
   /// Without vectors that hold the table, palette entries that need no conversion are best read
   /// where they are.
   static constexpr bool kPays = kHalves == 1;

@@ -62,31 +62,46 @@ template <class To> void convertRowsByTable(const RowPair& rows, const uint8* pa
   forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { table.convertRow(dst, src, pixels); });
 }
 
-template <class To> void convertPaletteRows(const RowPair& rows, const uint8* palette) {
-  if constexpr (ColorTable<To>::kPays) {
-    const size_t pixels = rows.bytes / To::kBytes;
-    if (pixels >= ColorTable<To>::kMinRow && pixels * rows.rows >= kMinPixelsForTable)
-      return convertRowsByTable<To>(rows, palette);
-  }
-  convertRowsPlainly<Palette, To>(rows, palette);
-}
-
 #if HWY_TARGET == HWY_SCALAR
 
 template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
-  if constexpr (std::is_same_v<From, Palette>) {
-    convertPaletteRows<To>(rows, palette);
-  } else {
-    convertRowsPlainly<From, To>(rows, palette);
+  if constexpr (std::is_same_v<From, Palette> && ColorTable<To>::kPays) {
+    const size_t pixels = rows.bytes / To::kBytes;
+    if (pixels * rows.rows >= kMinPixelsForTable) return convertRowsByTable<To>(rows, palette);
   }
+  convertRowsPlainly<From, To>(rows, palette);
 }
 
 #else
 
+/// The palette's entries for a block of indices. They are loaded one by one, which takes no longer
+/// than the instructions that gather them.
+template <class D> HWY_INLINE Block<D> loadEntries(D d, const uint8* src, const uint8* palette) {
+  static_assert(kLanes<D> == 4);
+  const auto entry = [&](uint32 index) HWY_ATTR {
+    return hn::Vec<D>{loadLanes(hn::CappedTag<uint32, 1>(), entryAt(palette, index & 0xFF)).raw};
+  };
+  Block<D> block;
+  for (auto& lanes : block.v) {
+    const uint32 indices = loadPixel<4>(src);
+    const auto low = hn::InterleaveLower(d, entry(indices), entry(indices >> 8));
+    const auto high = hn::InterleaveLower(d, entry(indices >> 16), entry(indices >> 24));
+    lanes = hn::ConcatLowerLower(d, high, low);
+    src += 4;
+  }
+  return block;
+}
+
 /// Loads a block in the format To.
 template <class From, class To, class D>
-HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
-  if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
+HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src, const uint8* palette) {
+  if constexpr (std::is_same_v<From, Palette>) {
+    Block<D> block = loadEntries(d, src, palette);
+    if constexpr (!kSameFields<Code32, To>) {
+      for (auto& lanes : block.v) lanes = convertLanes<Code32, To>(d, lanes);
+    }
+    return block;
+  } else if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
     static_assert(kSameFields<To, Code32>, "16-bit pixels are widened to codes 24 and 32 only");
     return loadWidened<From>(d, src);
   } else {
@@ -100,20 +115,21 @@ HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src) {
 }
 
 template <class From, class To, bool kStreams = false, class D>
-HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src) {
-  storeBlock<To::kBytes, kStreams>(d, loadConvertedBlock<From, To>(d, src), dst);
+HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src, const uint8* palette = nullptr) {
+  storeBlock<To::kBytes, kStreams>(d, loadConvertedBlock<From, To>(d, src, palette), dst);
 }
 
 /// Block after block; the last one ends with the row and may do some pixels again. Rows that are
 /// shorter than a block take smaller ones.
-template <class From, class To, class D> void convertRowsByBlocks(D d, const RowPair& rows) {
+template <class From, class To, class D>
+void convertRowsByBlocks(D d, const RowPair& rows, const uint8* palette) {
   constexpr size_t kPixels = kBlockPixels<D>;
   const size_t pixels = rows.bytes / To::kBytes;
   if (pixels < kPixels) {
     if constexpr (kPixels > 16) {
-      convertRowsByBlocks<From, To>(hn::Half<D>(), rows);
+      convertRowsByBlocks<From, To>(hn::Half<D>(), rows, palette);
     } else {
-      convertRowsPlainly<From, To>(rows, nullptr);
+      convertRowsPlainly<From, To>(rows, palette);
     }
     return;
   }
@@ -123,8 +139,8 @@ template <class From, class To, class D> void convertRowsByBlocks(D d, const Row
   const uint8* src = rows.src;
   for (uint32 y = rows.rows; y != 0; --y) {
     for (size_t x = 0; x < last; x += kPixels)
-      convertBlock<From, To>(d, dst + x * To::kBytes, src + x * From::kBytes);
-    convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes);
+      convertBlock<From, To>(d, dst + x * To::kBytes, src + x * From::kBytes, palette);
+    convertBlock<From, To>(d, dst + last * To::kBytes, src + last * From::kBytes, palette);
     dst = nextRow(dst, rows.dstStep);
     src = nextRow(src, rows.srcStep);
   }
@@ -169,11 +185,20 @@ template <class From, class To> HWY_INLINE bool areStreamed(const RowPair& rows)
          reinterpret_cast<uintptr_t>(rows.dst) % kPart == 0;
 }
 
+/// Rows of palette indices: large ones through a table where vectors hold it.
+template <class To> void convertPaletteRows(const RowPair& rows, const uint8* palette) {
+#if HWY_TARGET == HWY_AVX3
+  const size_t pixels = rows.bytes / To::kBytes;
+  if (pixels >= ColorTable<To>::kMinRow && pixels * rows.rows >= kMinPixelsForTable)
+    return convertRowsByTable<To>(rows, palette);
+#endif
+  convertRowsByBlocks<Palette, To>(hn::CappedTag<uint32, 4>(), rows, palette);
+}
+
 template <class From, class To> void convertRows(const RowPair& rows, const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
     convertPaletteRows<To>(rows, palette);
   } else {
-    (void)palette;
     constexpr bool kShort = From::kBytes <= 2 && To::kBytes <= 2;
     // Between 3 and 4 bytes a pixel there is nothing to compute, and half a cache line at a time
     // was measured to be faster than a whole one.
@@ -183,7 +208,7 @@ template <class From, class To> void convertRows(const RowPair& rows, const uint
     if constexpr (To::kBytes > 1) {
       if (areStreamed<From, To>(rows)) return streamRowsByBlocks<From, To>(d, rows);
     }
-    convertRowsByBlocks<From, To>(d, rows);
+    convertRowsByBlocks<From, To>(d, rows, palette);
   }
 }
 
