@@ -8,6 +8,8 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
+#include <algorithm>
+
 #include "vector/pixelPattern-inl.h"
 #include "plane/rasterBitsInternal.h"
 #include "vector/rows-inl.h"
@@ -16,14 +18,13 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
-/// The last pixels of a row, or all of them: each from its own bit, without a branch. Pixels that a
-/// stencil leaves out are written elsewhere.
+/// The first `count` pixels of a byte of the plane, each from its own bit, without a branch. Pixels
+/// that a stencil leaves out are written elsewhere.
 template <unsigned kBytes, bool kStencil>
-HWY_INLINE void expandOneByOne(const uint8* bits, uint8* dst, size_t first, size_t width,
-                               const BitColors& colors) {
+HWY_INLINE void expandOneByOne(uint32 byte, uint8* dst, size_t count, const BitColors& colors) {
   uint8 elsewhere[kBytes];
-  for (size_t x = first; x < width; ++x) {
-    const uint32 set = uint32{bits[x / 8]} >> (7 - x % 8) & 1;
+  for (size_t x = 0; x < count; ++x) {
+    const uint32 set = byte >> (7 - x) & 1;
     uint8* const at = dst + x * kBytes;
     if constexpr (kStencil) {
       const intptr_t away = reinterpret_cast<intptr_t>(at) - reinterpret_cast<intptr_t>(elsewhere);
@@ -42,13 +43,65 @@ void expandRows(const Expansion& e, const BitColors& colors) {
   const uint8* bits = e.bits;
   uint8* dst = e.dst;
   for (uint32 y = e.height; y != 0;
-       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch))
-    expandOneByOne<kBytes, kStencil>(bits, dst, 0, e.width, colors);
+       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch)) {
+    for (size_t x = 0; x < e.width; x += 8)
+      expandOneByOne<kBytes, kStencil>(bits[x / 8], dst + x * kBytes,
+                                       std::min(e.width - x, size_t{8}), colors);
+  }
 }
 
 #else
 
 using Bytes = hn::ScalableTag<uint8>;
+
+/// For every four bits, the first pixel's the highest, the words of four pixels: all ones where a
+/// pixel's bit is set.
+template <unsigned kBytes> struct FourPixelMasks {
+  uint32 word[16][kBytes];
+
+  constexpr FourPixelMasks() : word() {
+    for (uint32 bits = 0; bits < 16; ++bits) {
+      for (uint32 i = 0; i < 4 * kBytes; ++i) {
+        const uint32 set = bits >> (3 - i / kBytes) & 1;
+        word[bits][i / 4] |= set * 0xFF << i % 4 * 8;
+      }
+    }
+  }
+};
+template <unsigned kBytes> inline constexpr FourPixelMasks<kBytes> kFourPixelMasks;
+
+/// The constant pixels of a call as the words of any four.
+struct ColorWords {
+  PixelWords foreground;
+  PixelWords background;
+};
+
+/// Four pixels from the low four bits of `bits`. Those that a stencil leaves out are written back.
+template <unsigned kBytes, bool kStencil>
+HWY_INLINE void expandFour(uint32 bits, uint8* dst, const ColorWords& words) {
+  if (kStencil && bits == 0) return;
+  for (unsigned i = 0; i < kBytes; ++i) {
+    uint8* const at = dst + 4 * i;
+    const uint32 clear = kStencil ? loadPixel<4>(at) : words.background.word[i % 3];
+    const uint32 difference = words.foreground.word[i % 3] ^ clear;
+    storePixel<4>(at, clear ^ (difference & kFourPixelMasks<kBytes>.word[bits][i]));
+  }
+}
+
+/// Less than eight pixels, from the first bit of a byte of the plane on.
+template <unsigned kBytes, bool kStencil>
+HWY_INLINE void expandFew(const uint8* bits, uint8* dst, size_t count, const BitColors& colors,
+                          const ColorWords& words) {
+  constexpr bool kMasked = kStencil && HWY_TARGET == HWY_AVX3;  // what is left out is not touched
+  uint32 byte = *bits;
+  if (!kMasked && count >= 4) {
+    expandFour<kBytes, kStencil>(byte >> 4, dst, words);
+    dst += size_t{4} * kBytes;
+    byte <<= 4;
+    count -= 4;
+  }
+  expandOneByOne<kBytes, kStencil>(byte, dst, count, colors);
+}
 
 /// For every byte of a run of pixels: which byte of the plane, and which bit there, decides on it.
 template <unsigned kBytes> struct BitOfByte {
@@ -181,8 +234,23 @@ HWY_INLINE void expandRowsFrom(const Expansion& e, const BitColors& colors) {
     size_t x = 0;
     if constexpr (kRuns) x = expandRuns<kBytes, kFar>(bits, dst, e.width, patterns);
     x = expandGroups<kBytes, kStencil, kFar>(Bytes(), bits, dst, x, e.width, patterns);
-    expandOneByOne<kBytes, kStencil>(bits, dst, x, e.width, colors);
+    if (x != e.width)
+      expandOneByOne<kBytes, kStencil>(bits[x / 8], dst + x * kBytes, e.width - x, colors);
   }
+}
+
+/// Rows of less than eight pixels have no use for vectors.
+template <unsigned kBytes, bool kStencil>
+HWY_NOINLINE void expandNarrowRows(const Expansion& e, const BitColors& colors) {
+  const ColorWords words = {repeatPixel(colors.foreground, kBytes),
+                            repeatPixel(colors.background, kBytes)};
+  const BitColors pixels = colors;  // read here, as a store to a pixel might change it
+  const size_t width = e.width;
+  const uint8* bits = e.bits;
+  uint8* dst = e.dst;
+  for (uint32 y = e.height; y != 0;
+       --y, bits = nextRow(bits, e.bitsPitch), dst = nextRow(dst, e.dstPitch))
+    expandFew<kBytes, kStencil>(bits, dst, width, pixels, words);
 }
 
 /// Not in line, so that it takes no registers from the rows that are too short for it.
@@ -193,6 +261,7 @@ HWY_NOINLINE void expandRowsByRuns(const Expansion& e, const BitColors& colors) 
 
 template <unsigned kBytes, bool kStencil>
 void expandRows(const Expansion& e, const BitColors& colors) {
+  if (e.width < 8) return expandNarrowRows<kBytes, kStencil>(e, colors);
   constexpr bool kMayBeFar = kBytes > 1;  // pixels of one byte come slowly enough as it is
   const bool far = kMayBeFar && isFar(e.width * kBytes, e.height);
   if constexpr (kStencil && kBytes <= 2) {  // of larger pixels, a group is a run
