@@ -9,9 +9,11 @@
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
 
-#include "rasterScaleColumns-inl.h"
+#include "rasterScaleAverage-inl.h"
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
+#include "rasterScaleMix-inl.h"
+#include "rasterScaleNearest-inl.h"
 #include "rasterScaleRows-inl.h"
 #include "rasterScaleShort-inl.h"
 #include "rasterScaleWhole-inl.h"
@@ -25,28 +27,27 @@ constexpr uint32 kNoRow = ~0u;
 
 /// Source rows resampled to the width of the destination, as 4-byte pixels. There are slots for the
 /// rows that one destination row needs; a row's number, modulo theirs, tells its slot.
-class RowCache {
+template <class Sampler> class RowCache {
  public:
   static size_t memoryFor(const ScaleJob& job) {
-    return slotsOf(job) * ScaleMemory::sizeOf<uint32>(Columns::rowPixels(job));
+    return slotsOf(job) * ScaleMemory::sizeOf<uint32>(blockPixels(job));
   }
 
-  RowCache(const ScaleJob& job, const Columns& columns, ScaleMemory& memory)
-      : job_(job), columns_(columns), slots_(slotsOf(job)) {
-    const size_t pitch = Columns::rowPixels(job);
+  RowCache(const ScaleJob& job, const Sampler& sampler, ScaleMemory& memory)
+      : job_(job), sampler_(sampler), slots_(slotsOf(job)) {
+    const size_t pitch = blockPixels(job);
     for (uint32 slot = 0; slot < slots_; ++slot) {
       slot_[slot] = {memory.take<uint32>(pitch), kNoRow};
     }
   }
 
   /// The row at a vertical position.
-  const uint32* at(uint32 position) {
+  HWY_INLINE const uint32* at(uint32 position) {
     const uint32 row = job_.rowOf(position);
-    Slot& slot = slot_[row % slots_];
-    if (slot.row != row) {
-      slot.row = row;
-      columns_.resample(job_.srcRow(row), slot.pixels);
-    }
+    // Slots are mostly a power of two, whose remainder needs no division.
+    const uint32 mask = slots_ - 1;
+    Slot& slot = slot_[(slots_ & mask) == 0 ? row & mask : row % slots_];
+    if (slot.row != row) fill(slot, row);
     return slot.pixels;
   }
 
@@ -56,20 +57,25 @@ class RowCache {
     uint32 row;
   };
 
+  HWY_NOINLINE void fill(Slot& slot, uint32 row) {
+    slot.row = row;
+    sampler_.resample(job_.srcRow(row), slot.pixels);
+  }
+
   static uint32 slotsOf(const ScaleJob& job) {
     if (!job.smooth) return 1;
     return std::min(((job.stepY + kOnePixel - 1) >> 16) + 1, kMaxRows);
   }
 
   const ScaleJob& job_;
-  const Columns& columns_;
+  const Sampler& sampler_;
   const uint32 slots_;
   Slot slot_[kMaxRows];
 };
 
 /// The rows that the destination row at `y` averages: at most kMaxRows, a partial first one
 /// included.
-WeightedRows rowsOfStep(RowCache& cache, uint32 y, uint32 step) {
+template <class Cache> WeightedRows rowsOfStep(Cache& cache, uint32 y, uint32 step) {
   WeightedRows rows;
   rows.count = 0;
   const auto add = [&](uint32 weight) {
@@ -90,7 +96,7 @@ WeightedRows rowsOfStep(RowCache& cache, uint32 y, uint32 step) {
 }
 
 /// Mixed or averaged rows.
-template <unsigned kBytes> void drawSmoothRows(const ScaleJob& job, RowCache& cache) {
+template <unsigned kBytes, class Cache> void drawSmoothRows(const ScaleJob& job, Cache& cache) {
   const bool enlarges = job.stepY < kOnePixel;
   uint32 y = job.startY - (enlarges ? kHalfPixel : 0);
   uint8* dst = job.dst;
@@ -185,6 +191,26 @@ void drawWidePixels(const ScaleJob& job) {
   });
 }
 
+/// Nearest sampling of 4-byte pixels that are written where they belong at once.
+void drawNearest(const ScaleJob& job) {
+  ScaleMemory memory(Nearest::memoryFor(job));
+  Nearest(job, memory).draw();
+}
+
+/// Everything else: source rows are resampled and kept, and made into destination rows.
+template <class Sampler> void drawWith(const ScaleJob& job, bool apart) {
+  ScaleMemory memory(Sampler::memoryFor(job) + RowCache<Sampler>::memoryFor(job));
+  const Sampler sampler(job, memory);
+  RowCache<Sampler> cache(job, sampler, memory);
+  if (job.smoothRows()) {
+    job.dstBytesPerPixel == 4 ? drawSmoothRows<4>(job, cache) : drawSmoothRows<3>(job, cache);
+  } else {
+    const bool wholePixels = !job.converts() || (job.depthsDiffer && job.dstBytesPerPixel == 2);
+    drawPlainRows(job, apart && wholePixels,
+                  [&](uint8* dst, uint32, uint32 y) { storePlainRow(job, dst, cache.at(y)); });
+  }
+}
+
 void drawScaled(const ScaleJob& job) {
   if (job.srcBytesPerPixel == 0) return;
   if (job.srcBytesPerPixel > 4) return drawWidePixels(job);
@@ -192,20 +218,10 @@ void drawScaled(const ScaleJob& job) {
   if (job.srcBytesPerPixel == 2) return drawShortPixels<2>(job);
   const bool apart = job.isApart();
   if (apart && drawWholeSteps(job)) return;
-  ScaleMemory memory(Columns::memoryFor(job) + RowCache::memoryFor(job));
-  const Columns columns(job, memory);
-  RowCache cache(job, columns, memory);
-  const bool converts = job.depthsDiffer || job.sizesDiffer;
-  if (job.smoothRows()) {
-    job.dstBytesPerPixel == 4 ? drawSmoothRows<4>(job, cache) : drawSmoothRows<3>(job, cache);
-  } else if (apart && !converts && !job.smoothColumns() && job.dstBytesPerPixel == 4) {
-    drawPlainRows(job, true,
-                  [&](uint8* dst, uint32 row, uint32) { columns.sample(job.srcRow(row), dst); });
-  } else {
-    const bool wholePixels = !converts || (job.depthsDiffer && job.dstBytesPerPixel == 2);
-    drawPlainRows(job, apart && wholePixels,
-                  [&](uint8* dst, uint32, uint32 y) { storePlainRow(job, dst, cache.at(y)); });
-  }
+  if (apart && !job.smooth && !job.converts() && job.dstBytesPerPixel == 4) return drawNearest(job);
+  if (!job.smoothColumns()) return drawWith<Nearest>(job, apart);
+  if (job.stepX < kOnePixel) return drawWith<Mix>(job, apart);
+  drawWith<Average>(job, apart);
 }
 
 constexpr ScaleKernels kKernels = {drawScaled};

@@ -16,21 +16,13 @@
 #include <bit>
 
 #include "rasterScaleInternal.h"
-#include "vector/rows-inl.h"
+#include "rasterScaleLanes-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
 #if HWY_TARGET != HWY_SCALAR
-
-using Pixels = hn::ScalableTag<uint32>;          // one pixel a lane
-using Halves = hn::Repartition<uint16, Pixels>;  // two channels of a pixel, 16 bits each
-using Pairs = hn::Repartition<uint64, Pixels>;   // two pixels
-using PixelVec = hn::Vec<Pixels>;
-using HalvesVec = hn::Vec<Halves>;
-
-inline constexpr size_t kBlock = kLanes<Pixels>;
 
 /// More weighted pixels than this are not summed in 16-bit lanes.
 inline constexpr uint32 kMaxTerms = 64;
@@ -86,8 +78,8 @@ class AnyStep {
 /// adds to the dividend does not reach the divisor's last bit. With 2^e the largest power of two
 /// below the divisor and m = 2^(16 + e) / divisor rounded up, m fits 16 bits and the quotient is
 /// n * m >> (16 + e): n < 256 * divisor, and m * divisor exceeds 2^(16 + e) by less than the
-/// divisor, so the product is off by less than 2^(16 + e) / divisor while divisor^2 * 256 <= 2^(16
-/// + e).
+/// divisor, so the product is off by less than 2^(16 + e) / divisor while
+/// divisor^2 * 256 <= 2^(16 + e).
 class ShortStep {
  public:
   /// Whether the step qualifies when that many bytes are summed.
@@ -129,26 +121,6 @@ template <class Body> HWY_INLINE void withDivider(uint32 step, uint32 terms, con
     body(AnyStep(step));
   }
 }
-
-/// Channel sums of a vector of pixels in 16-bit lanes.
-struct LaneSums {
-  HalvesVec br;
-  HalvesVec ga;
-
-  HWY_INLINE void add(PixelVec pixels) {
-    const HalvesVec v = hn::BitCast(Halves(), pixels);
-    br = hn::Add(br, hn::And(v, hn::Set(Halves(), uint16{255})));
-    ga = hn::Add(ga, hn::ShiftRight<8>(v));
-  }
-  /// Adds channel * weight / 256, truncated. A weight fills both halves of its pixel.
-  HWY_INLINE void add(PixelVec pixels, HalvesVec weight) {
-    const HalvesVec v = hn::BitCast(Halves(), pixels);
-    br = hn::Add(br, hn::MulHigh(hn::ShiftLeft<8>(v), weight));
-    ga = hn::Add(ga, hn::MulHigh(hn::And(v, hn::Set(Halves(), uint16{0xFF00})), weight));
-  }
-};
-
-HWY_INLINE LaneSums noSums() { return {hn::Zero(Halves()), hn::Zero(Halves())}; }
 
 #endif
 

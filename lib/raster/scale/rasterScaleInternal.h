@@ -49,6 +49,7 @@ struct ScaleJob {
 
   bool smoothColumns() const { return smooth && stepX != kOnePixel; }
   bool smoothRows() const { return smooth && stepY != kOnePixel; }
+  bool converts() const { return depthsDiffer || sizesDiffer; }
 
   /// The row that holds a vertical position. Deliberate: positions count as signed, so one that
   /// wrapped past 2^31 means row 0.

@@ -19,7 +19,9 @@ class ScaleMemory {
   explicit ScaleMemory(size_t bytes)
       : heap_(bytes > sizeof local_ ? UtilSafeMalloc0(bytes) : nullptr),
         next_(heap_ != nullptr ? static_cast<uint8*>(heap_) : local_) {}
-  ~ScaleMemory() { free(heap_); }
+  ~ScaleMemory() {
+    if (heap_ != nullptr) free(heap_);  // a call of free, even of nothing, is a part of a small job
+  }
   ScaleMemory(const ScaleMemory&) = delete;
   ScaleMemory& operator=(const ScaleMemory&) = delete;
 

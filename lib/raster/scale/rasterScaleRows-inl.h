@@ -10,7 +10,7 @@
 #define RASTER_SCALE_ROWS_INL_H
 #endif
 
-#include "rasterScaleColumns-inl.h"
+#include "rasterScaleDivide-inl.h"
 #include "rasterScaleInternal.h"
 #include "vector/fields-inl.h"
 
@@ -50,7 +50,7 @@ void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width
 
 #else
 
-/// Calls block(i) for each block of a row and stores the `width` results in pixels of kBytes.
+/// Makes block(i) for each block of a row and stores the `width` results in pixels of kBytes.
 template <unsigned kBytes, class Block>
 HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
   static_assert(kBytes == 3 || kBytes == 4);
@@ -58,16 +58,13 @@ HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
   size_t i = 0;
   if constexpr (kBytes == 4) {
     for (; width - i >= kBlock; i += kBlock) storeLanes(d, block(i), dst + 4 * i);
-    if (i != width) storeSome(block(i), width - i, dst + 4 * i);
+    if (i != width) storeFirst(d, block(i), width - i, dst + 4 * i);
   } else {
     // A whole vector is stored while its excess lies within the row, and is then overwritten.
     for (; width - i >= 2 * kBlock; i += kBlock)
       storeLanes(d, gatherTriples(d, block(i)), dst + 3 * i);
-    for (; i < width; i += kBlock) {
-      uint8 packed[4 * kBlock];
-      storeLanes(d, gatherTriples(d, block(i)), packed);
-      copyShort(dst + 3 * i, packed, 3 * std::min(width - i, kBlock));
-    }
+    for (; i < width; i += kBlock)
+      storeFirstTriples(block(i), std::min(width - i, kBlock), dst + 3 * i);
   }
 }
 

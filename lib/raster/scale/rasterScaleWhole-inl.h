@@ -13,7 +13,7 @@
 #define RASTER_SCALE_WHOLE_INL_H
 #endif
 
-#include "rasterScaleColumns-inl.h"
+#include "rasterScaleAverage-inl.h"
 #include "rasterScaleInternal.h"
 #include "rasterScaleRows-inl.h"
 
@@ -26,44 +26,64 @@ namespace {
 /// The rows of one square of kSide x kSide source pixels.
 template <unsigned kSide> using SquareRows = const uint8* [kSide];
 
+/// Sums of neighbouring bytes, and of neighbouring 16-bit lanes. Highway names the first one only
+/// from a later version on.
+HWY_INLINE __m128i pairSums(__m128i bytes) {
+  return _mm_madd_epi16(_mm_maddubs_epi16(bytes, _mm_set1_epi8(1)), _mm_set1_epi16(1));
+}
+HWY_INLINE __m128i packSums(__m128i a, __m128i b) { return _mm_packs_epi32(a, b); }
+HWY_INLINE __m128i packBytes(__m128i a, __m128i b) { return _mm_packus_epi16(a, b); }
+#if HWY_TARGET <= HWY_AVX2
+HWY_INLINE __m256i pairSums(__m256i bytes) {
+  return _mm256_madd_epi16(_mm256_maddubs_epi16(bytes, _mm256_set1_epi8(1)), _mm256_set1_epi16(1));
+}
+HWY_INLINE __m256i packSums(__m256i a, __m256i b) { return _mm256_packs_epi32(a, b); }
+HWY_INLINE __m256i packBytes(__m256i a, __m256i b) { return _mm256_packus_epi16(a, b); }
+#endif
+#if HWY_TARGET <= HWY_AVX3
+HWY_INLINE __m512i pairSums(__m512i bytes) {
+  return _mm512_madd_epi16(_mm512_maddubs_epi16(bytes, _mm512_set1_epi8(1)), _mm512_set1_epi16(1));
+}
+HWY_INLINE __m512i packSums(__m512i a, __m512i b) { return _mm512_packs_epi32(a, b); }
+HWY_INLINE __m512i packBytes(__m512i a, __m512i b) { return _mm512_packus_epi16(a, b); }
+#endif
+
 /// Half size: truncated means of bytes. The instruction rounds up, so it works on complements.
 template <class D, class Load>
 HWY_INLINE hn::Vec<D> averageSquares(D d, std::integral_constant<unsigned, 2>, const Load& load) {
   const hn::Repartition<uint8, D> d8;
-  const auto rowMean = [&](unsigned row) {  // the complement of the weighted row
+  const auto rowMean = [&](unsigned row) HWY_ATTR {  // the complement of the weighted row
     const auto left = load(row, 0);
     const auto right = load(row, 1);
-    const auto even = hn::BitCast(d8, hn::Not(hn::ConcatEven(d, right, left)));
-    const auto odd = hn::BitCast(d8, hn::Not(hn::ConcatOdd(d, right, left)));
+    const auto even = hn::BitCast(d8, hn::Not(everyOther<0>(left, right)));
+    const auto odd = hn::BitCast(d8, hn::Not(everyOther<1>(left, right)));
     return hn::SaturatedAdd(hn::AverageRound(even, odd), hn::Set(d8, uint8{1}));
   };
-  return hn::BitCast(d, hn::Not(hn::AverageRound(rowMean(0), rowMean(1))));
+  return inOrder<2>(d, hn::BitCast(d, hn::Not(hn::AverageRound(rowMean(0), rowMean(1)))));
 }
 
-/// Quarter size: sums in 16-bit lanes.
+/// Quarter size: a part's four pixels are put channel by channel, and the sums of bytes are then
+/// sums of channels.
 template <class D, class Load>
 HWY_INLINE hn::Vec<D> averageSquares(D d, std::integral_constant<unsigned, 4>, const Load& load) {
-  const hn::Repartition<uint16, D> d16;
-  const auto even = hn::Set(d16, uint16{255});
+  static constexpr BytesOfPart kByChannel = {0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
+  using Words = hn::Repartition<uint16, D>;
+  const Words d16;
   const auto one = hn::Set(d16, uint16{1});
-  auto br = hn::Zero(d16);
-  auto ga = hn::Zero(d16);
+  const auto sums = [&](unsigned row, unsigned part) HWY_ATTR {
+    return pairSums(chooseBytes(d, load(row, part), kByChannel).raw);
+  };
+  const auto rowMean = [&](unsigned row, unsigned half) HWY_ATTR {
+    const hn::Vec<Words> sum{packSums(sums(row, 2 * half), sums(row, 2 * half + 1))};
+    return hn::SaturatedSub(hn::ShiftRight<2>(sum), one);
+  };
+  auto first = hn::Zero(d16), second = hn::Zero(d16);
   for (unsigned row = 0; row < 4; ++row) {
-    const auto p0 = load(row, 0), p1 = load(row, 1), p2 = load(row, 2), p3 = load(row, 3);
-    const auto even01 = hn::ConcatEven(d, p1, p0), even23 = hn::ConcatEven(d, p3, p2);
-    const auto odd01 = hn::ConcatOdd(d, p1, p0), odd23 = hn::ConcatOdd(d, p3, p2);
-    const auto a = hn::BitCast(d16, hn::ConcatEven(d, even23, even01));
-    const auto b = hn::BitCast(d16, hn::ConcatOdd(d, even23, even01));
-    const auto c = hn::BitCast(d16, hn::ConcatEven(d, odd23, odd01));
-    const auto e = hn::BitCast(d16, hn::ConcatOdd(d, odd23, odd01));
-    const auto rowBR = hn::Add(hn::Add(hn::And(a, even), hn::And(b, even)),
-                               hn::Add(hn::And(c, even), hn::And(e, even)));
-    const auto rowGA = hn::Add(hn::Add(hn::ShiftRight<8>(a), hn::ShiftRight<8>(b)),
-                               hn::Add(hn::ShiftRight<8>(c), hn::ShiftRight<8>(e)));
-    br = hn::Add(br, hn::SaturatedSub(hn::ShiftRight<2>(rowBR), one));
-    ga = hn::Add(ga, hn::SaturatedSub(hn::ShiftRight<2>(rowGA), one));
+    first = hn::Add(first, rowMean(row, 0));
+    second = hn::Add(second, rowMean(row, 1));
   }
-  return hn::BitCast(d, hn::Or(hn::ShiftRight<2>(br), hn::ShiftLeft<8>(hn::ShiftRight<2>(ga))));
+  return inOrder<1>(
+      d, hn::Vec<D>{packBytes(hn::ShiftRight<2>(first).raw, hn::ShiftRight<2>(second).raw)});
 }
 
 /// Pixels of source columns, `first` and following, without those from `end` on.
@@ -96,39 +116,55 @@ HWY_INLINE void averageRun(D d, const SquareRows<kSide>& rows, const Run& run, u
     storeLanes(d, averageSquares(d, side, squares), dst + 4 * i);
   }
   const size_t last = run.count - lanes;
-  const auto squares = [&](unsigned row, size_t part) {
-    return columnsBelow(d, load(last, row, part), run.column + kSide * last + part * lanes,
-                        run.end);
+  const auto squares = [&](unsigned row, size_t part) HWY_ATTR {
+    const auto pixels = load(last, row, part);
+    if (part != kSide - 1) return pixels;  // the last column is the last one of all
+    return columnsBelow(d, pixels, run.column + kSide * last + part * lanes, run.end);
   };
   storeLanes(d, averageSquares(d, side, squares), dst + 4 * last);
 }
 
-/// The same for pixels of 3 bytes and any number of squares. The end of the run is averaged from a
-/// copy, because loads reach past its pixels.
+#if HWY_TARGET <= HWY_AVX2
+
+/// The same for a run of less than a vector of squares.
+template <unsigned kSide, class D>
+HWY_INLINE void averageFew(D d, const SquareRows<kSide>& rows, const Run& run, uint8* dst) {
+  const std::integral_constant<unsigned, kSide> side;
+  const size_t end = std::min(run.end, run.column + kSide * run.count);
+  const auto squares = [&](unsigned row, size_t part) HWY_ATTR {
+    const size_t first = run.column + part * kLanes<D>;
+    if (first >= end) return hn::Zero(d);
+    return loadFirst(d, rows[row] + 4 * first, std::min(end - first, kLanes<D>));
+  };
+  storeFirst(d, averageSquares(d, side, squares), run.count, dst);
+}
+
+#endif
+
+/// The same for pixels of 3 bytes and any number of squares.
 template <unsigned kSide>
 HWY_INLINE void averageRun24(const SquareRows<kSide>& rows, const Run& run, uint8* dst) {
   const Pixels d;
   const std::integral_constant<unsigned, kSide> side;
   size_t i = 0;
+  // A whole vector is stored while its excess lies within the run, and is then overwritten.
   for (; run.count - i >= 2 * kBlock; i += kBlock) {
-    const auto squares = [&](unsigned row, size_t part) {
-      return widenPixels(rows[row] + 3 * (run.column + kSide * i + part * kBlock));
+    const auto squares = [&](unsigned row, size_t part) HWY_ATTR {
+      return widenWithin(rows[row] + 3 * (run.column + kSide * i + part * kBlock));
     };
     storeLanes(d, gatherTriples(d, averageSquares(d, side, squares)), dst + 3 * i);
   }
   for (; i < run.count; i += kBlock) {
     const size_t count = std::min(run.count - i, kBlock);
+    const size_t columns = kSide * count;
     const size_t column = run.column + kSide * i;
-    uint8 copies[kSide][(3 * kSide + 1) * kBlock] = {};
-    for (unsigned row = 0; row < kSide; ++row)
-      copyShort(copies[row], rows[row] + 3 * column, 3 * kSide * count);
-    const auto squares = [&](unsigned row, size_t part) {
-      return columnsBelow(d, widenPixels(copies[row] + 3 * part * kBlock), column + part * kBlock,
-                          run.end);
+    const auto squares = [&](unsigned row, size_t part) HWY_ATTR {
+      const size_t before = std::min(part * kBlock, columns);
+      const size_t first = column + before;
+      return columnsBelow(d, widenFirst(rows[row] + 3 * first, std::min(columns - before, kBlock)),
+                          first, run.end);
     };
-    uint8 packed[4 * kBlock];
-    storeLanes(d, gatherTriples(d, averageSquares(d, side, squares)), packed);
-    copyShort(dst + 3 * i, packed, 3 * count);
+    storeFirstTriples(averageSquares(d, side, squares), count, dst + 3 * i);
   }
 }
 
@@ -145,7 +181,7 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
     const uint32 column = std::min(job.startX >> 16, job.srcWidth);
     squares_ = std::min(positionsBelow(job.xLimit(), job.startX, kStep, job.width),
                         (job.srcWidth - column) / kSide);
-    if (kBytes == 4 && squares_ < 4) squares_ = 0;
+    if (kBytes == 4 && !kLoadsParts && squares_ < 4) squares_ = 0;
   }
 
   void draw() const {
@@ -178,6 +214,10 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
       averageRun<kSide>(d, rows, run, dst);
     } else if constexpr (kLanes<D> > 4) {
       averageRunOf(hn::Half<D>(), rows, run, dst);
+#if HWY_TARGET <= HWY_AVX2
+    } else if (run.count != 0) {
+      averageFew<kSide>(d, rows, run, dst);
+#endif
     }
   }
 
@@ -215,17 +255,16 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
   uint32 squares_;
 };
 
+template <unsigned kSide, unsigned kBytes> bool drawIfWhole(const ScaleJob& job) {
+  if (!WholeSteps<kSide, kBytes>::fits(job)) return false;
+  WholeSteps<kSide, kBytes>(job).draw();
+  return true;
+}
+
 /// Draws the job and returns true if it is one for WholeSteps.
 inline bool drawWholeSteps(const ScaleJob& job) {
-  const auto drawAs = [&]<unsigned kSide, unsigned kBytes>(WholeSteps<kSide, kBytes>*) {
-    if (!WholeSteps<kSide, kBytes>::fits(job)) return false;
-    WholeSteps<kSide, kBytes>(job).draw();
-    return true;
-  };
-  return drawAs(static_cast<WholeSteps<2, 4>*>(nullptr)) ||
-         drawAs(static_cast<WholeSteps<4, 4>*>(nullptr)) ||
-         drawAs(static_cast<WholeSteps<2, 3>*>(nullptr)) ||
-         drawAs(static_cast<WholeSteps<4, 3>*>(nullptr));
+  return drawIfWhole<2, 4>(job) || drawIfWhole<4, 4>(job) || drawIfWhole<2, 3>(job) ||
+         drawIfWhole<4, 3>(job);
 }
 
 #else
