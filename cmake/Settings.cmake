@@ -48,7 +48,8 @@ if(NOT RASTER_SANITIZE)
 endif()
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)
   # Callers built for the old i386 ABI enter with a stack aligned to 4 bytes only.
-  target_compile_options(raster_library_settings INTERFACE -mincoming-stack-boundary=2)
+  target_compile_options(raster_library_settings INTERFACE
+    $<IF:$<CXX_COMPILER_ID:Clang>,-mstackrealign,-mincoming-stack-boundary=2>)
 endif()
 
 # Sources with vector code: all of SSSE3, SSE4, AVX2 and AVX3 on both word sizes, and one-lane
