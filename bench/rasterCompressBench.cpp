@@ -51,11 +51,11 @@ struct Box {
   uint32 left, top, right, bottom;
 };
 
-/// Draws over a box of the image: `colourAt` gives each pixel.
-template <class ColourAt> void paint(Pixels& pixels, Extent e, Box box, ColourAt colourAt) {
+/// Draws over a box of the image: `colorAt` gives each pixel.
+template <class ColorAt> void paint(Pixels& pixels, Extent e, Box box, ColorAt colorAt) {
   for (uint32 y = box.top; y < box.bottom && y < e.height; ++y) {
     for (uint32 x = box.left; x < box.right && x < e.width; ++x)
-      pixels[size_t{y} * e.width + x] = colourAt(x, y);
+      pixels[size_t{y} * e.width + x] = colorAt(x, y);
   }
 }
 

@@ -11,15 +11,15 @@
 enum { kWidth = 640, kHeight = 400, kBytesPerPixel = 2, kPitch = kWidth * kBytesPerPixel };
 
 /// Pixels of 16 bits: five of red, six of green, five of blue.
-static uint32 colour(uint32 rgb) { return Raster_ConvertOnePixel(rgb, 32, 16, false, NULL); }
+static uint32 color(uint32 rgb) { return Raster_ConvertOnePixel(rgb, 32, 16, false, NULL); }
 
 static void draw(uint8* frame) {
-  Raster_RectFill(frame, kPitch, kBytesPerPixel, colour(0x204060), 0, 0, kWidth, kHeight);
+  Raster_RectFill(frame, kPitch, kBytesPerPixel, color(0x204060), 0, 0, kWidth, kHeight);
   for (uint32 i = 0; i < 8; ++i)
-    Raster_RectFill(frame, kPitch, kBytesPerPixel, colour(0x2020FF + i * 0x1A1A00), 40 + 60 * i,
+    Raster_RectFill(frame, kPitch, kBytesPerPixel, color(0x2020FF + i * 0x1A1A00), 40 + 60 * i,
                     40 + 30 * i, 100, 70);
   // Inverted by exclusive or with white: drawing it twice would take it away again.
-  Raster_RectROPfill(frame, kPitch, kBytesPerPixel, colour(0xFFFFFF), 6, 160, 100, 320, 200);
+  Raster_RectROPfill(frame, kPitch, kBytesPerPixel, color(0xFFFFFF), 6, 160, 100, 320, 200);
 }
 
 int main(int argc, char** argv) {

@@ -92,7 +92,7 @@ void look() {
   const Rect all = display.bounds();
   const Rect part = {0, 0, std::min(all.right, 48), std::min(all.bottom, 32)};
   display.capture(part);
-  if (display.isIndexed()) display.refreshColours();
+  if (display.isIndexed()) display.refreshColors();
   if (const auto cursor = display.cursor()) fuzz::require(cursor->pixels.size() != 0);
 }
 

@@ -52,7 +52,7 @@ bool start(Decoding& decoding) {
 }
 
 /// Asks for four bytes a pixel: blue, green, red, alpha.
-void askForColours(png_structp png) {
+void askForColors(png_structp png) {
   png_set_expand(png);
   png_set_scale_16(png);
   png_set_gray_to_rgb(png);
@@ -65,7 +65,7 @@ bool decodeRows(Decoding& decoding, png_bytep* rows) {
   if (setjmp(png_jmpbuf(decoding.png)) != 0) return false;  // NOLINT(cert-err52-cpp)
   png_set_read_fn(decoding.png, &decoding, readBytes);
   png_read_info(decoding.png, decoding.info);
-  askForColours(decoding.png);
+  askForColors(decoding.png);
   png_read_update_info(decoding.png, decoding.info);
   png_read_image(decoding.png, rows);
   png_read_end(decoding.png, nullptr);

@@ -107,7 +107,7 @@ std::string Display::description() const {
          std::to_string(format.bitsPerPixel) + " bits per pixel";
 }
 
-bool Display::refreshColours() {
+bool Display::refreshColors() {
   ImageUtilColor before[256];
   std::copy(std::begin(palette), std::end(palette), before);
   readPalette();
@@ -122,14 +122,13 @@ void Display::readPalette() {
       needReply(connection.get(),
                 xcb_query_colors(connection.get(), format.screen->default_colormap, count, pixels),
                 xcb_query_colors_reply, "the colours of the screen");
-  const xcb_rgb_t* colours = xcb_query_colors_colors(reply.get());
+  const xcb_rgb_t* colors = xcb_query_colors_colors(reply.get());
   const uint32 length = reply->colors_len;
-  if (length > count || !carries(reply->length, uint64{length} * sizeof *colours))
+  if (length > count || !carries(reply->length, uint64{length} * sizeof *colors))
     throw Failure("the display sent other colours than it was asked for");
   for (uint32 i = 0; i < length; ++i)
-    palette[i] = {static_cast<uint8>(colours[i].blue >> 8),
-                  static_cast<uint8>(colours[i].green >> 8),
-                  static_cast<uint8>(colours[i].red >> 8), 0};
+    palette[i] = {static_cast<uint8>(colors[i].blue >> 8), static_cast<uint8>(colors[i].green >> 8),
+                  static_cast<uint8>(colors[i].red >> 8), 0};
 }
 
 bool Display::captureShared(Picture& picture, const Rect& region) {

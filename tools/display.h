@@ -46,9 +46,9 @@ class Display {
   /// The library's code of the screen's format; with 8, pixels are indices into colours().
   uint32 code() const;
   bool isIndexed() const { return format.screen->root_depth == 8; }
-  const ImageUtilColor* colours() const { return palette; }
+  const ImageUtilColor* colors() const { return palette; }
   /// Asks for the palette again, of whose changes no display tells; whether it is another one now.
-  bool refreshColours();
+  bool refreshColors();
   uint32 bytesPerPixel() const { return format.bitsPerPixel / 8; }
   /// The bytes from one row of the server's pixels to the next.
   uint32 rowBytes(uint32 width) const;

@@ -26,7 +26,7 @@ Placement place(const Picture& source, const Point& at, const Picture& target) {
 namespace {
 
 /// Applies `change(channel, alpha)` to the colours of 32-bit pixels.
-template <class Change> void changeColours(Picture& picture, Change change) {
+template <class Change> void changeColors(Picture& picture, Change change) {
   for (uint32 y = 0; y < picture.height(); ++y) {
     uint8* pixel = picture.data() + size_t{picture.pitch()} * y;
     for (uint32 x = 0; x < picture.width(); ++x, pixel += 4) {
@@ -39,11 +39,11 @@ template <class Change> void changeColours(Picture& picture, Change change) {
 }  // namespace
 
 void premultiply(Picture& picture) {
-  changeColours(picture, [](uint32 channel, uint32 alpha) { return channel * alpha / 255; });
+  changeColors(picture, [](uint32 channel, uint32 alpha) { return channel * alpha / 255; });
 }
 
 void unpremultiply(Picture& picture) {
-  changeColours(picture, [](uint32 channel, uint32 alpha) {
+  changeColors(picture, [](uint32 channel, uint32 alpha) {
     return alpha == 0 ? 0 : std::min(255u, (channel * 255 + alpha / 2) / alpha);
   });
 }

@@ -84,7 +84,7 @@ Rect parseRegion(const std::string& text) {
   return {x, y, x + width, y + height};
 }
 
-uint32 parseColour(const std::string& text) {
+uint32 parseColor(const std::string& text) {
   const bool isShort = text.size() == 4 && text[0] == '#';
   const size_t prefix = text.rfind("0x", 0) == 0 ? 2 : text.rfind('#', 0) == 0 ? 1 : 0;
   uint32 value = 0;

@@ -33,11 +33,11 @@ struct SizeRequest {
 SizeRequest parseSizeRequest(const std::string& text);  // WxH, Wx, xH, FACTOR, PERCENT%
 
 // Each parser throws a usage error that quotes the text and shows the form.
-Size parseSize(const std::string& text);      // WxH
-Point parsePoint(const std::string& text);    // X,Y
-Rect parseRegion(const std::string& text);    // WxH+X+Y, or WxH at 0,0
-uint32 parseColour(const std::string& text);  // RRGGBB, #RRGGBB, #RGB, 0xRRGGBB
-std::string regionText(const Rect& rect);     // WxH+X+Y
+Size parseSize(const std::string& text);     // WxH
+Point parsePoint(const std::string& text);   // X,Y
+Rect parseRegion(const std::string& text);   // WxH+X+Y, or WxH at 0,0
+uint32 parseColor(const std::string& text);  // RRGGBB, #RRGGBB, #RGB, 0xRRGGBB
+std::string regionText(const Rect& rect);    // WxH+X+Y
 
 /// An option whose text goes through one of the parsers. A target may be a std::optional.
 template <class Target, class Value>

@@ -46,7 +46,7 @@ void describePng(File& file) {
     if (record.numColors != 0) inMemory += ", " + counted(record.numColors, "colour");
   }
   printf("%s: PNG, %ux%u pixels, %s, %s per sample%s%s\n", file.shown.c_str(), png.width,
-         png.height, colourTypeName(png.colourType), counted(png.bitDepth, "bit").c_str(),
+         png.height, colorTypeName(png.colorType), counted(png.bitDepth, "bit").c_str(),
          png.hasTransparency ? ", transparency" : "", png.isInterlaced ? ", interlaced" : "");
   printf("in memory: %s\n", inMemory.c_str());
 }
@@ -69,7 +69,7 @@ struct BmpHeader {
   uint32 width;
   int32 height;  // below zero: the rows go from the top down
   uint32 bits;
-  uint32 colours = 0;
+  uint32 colors = 0;
   bool isCompressed = false;
 };
 
@@ -86,7 +86,7 @@ void describeBmp(const File& file) {
          static_cast<uint32>(std::abs(int64{bmp.height})), counted(bmp.bits, "bit").c_str());
   printf(" per pixel");
   if (bmp.bits != 0 && bmp.bits <= 8)
-    printf(", %s", counted(bmp.colours != 0 ? bmp.colours : 1u << bmp.bits, "colour").c_str());
+    printf(", %s", counted(bmp.colors != 0 ? bmp.colors : 1u << bmp.bits, "colour").c_str());
   if (bmp.isCompressed) printf(", compressed");
   if (bmp.height < 0) printf(", top row first");
   printf("\n");

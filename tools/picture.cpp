@@ -60,9 +60,9 @@ struct Field {
 std::array<uint32, 256> paletteWords(const ImageUtilImage& image) {
   std::array<uint32, 256> words;
   std::transform(std::begin(image.palette), std::end(image.palette), words.begin(),
-                 [](const ImageUtilColor& colour) {
-                   return 0xFF000000u | uint32{colour.red} << 16 | uint32{colour.green} << 8 |
-                          colour.blue;
+                 [](const ImageUtilColor& color) {
+                   return 0xFF000000u | uint32{color.red} << 16 | uint32{color.green} << 8 |
+                          color.blue;
                  });
   return words;
 }
@@ -123,8 +123,8 @@ namespace {
 /// The library reads colour and palettes at 8 bits and fewer. Of what stands beside the pixels it
 /// keeps the palette, not its transparency.
 bool isForLibrary(const PngFile& png, bool keepAlpha) {
-  const bool isColour = png.colourType == kRgb || png.colourType == kRgba;
-  return png.bitDepth <= 8 && (isColour || png.colourType == kPalette) &&
+  const bool isColor = png.colorType == kRgb || png.colorType == kRgba;
+  return png.bitDepth <= 8 && (isColor || png.colorType == kPalette) &&
          !(keepAlpha && png.hasTransparency);
 }
 

@@ -56,7 +56,7 @@ PngFile readPng(InputStream& input, std::vector<uint8> start) {
   png.width = bigEndian(fields);
   png.height = bigEndian(fields + 4);
   png.bitDepth = fields[8];
-  png.colourType = fields[9];
+  png.colorType = fields[9];
   png.isInterlaced = fields[12] != 0;
   input.append(png.bytes, kLargestFile);
   const bool whole =
@@ -65,8 +65,8 @@ PngFile readPng(InputStream& input, std::vector<uint8> start) {
   return png;
 }
 
-const char* colourTypeName(uint32 colourType) {
-  switch (colourType) {
+const char* colorTypeName(uint32 colorType) {
+  switch (colorType) {
     case kGrey:
       return "grey";
     case kRgb:

@@ -12,18 +12,18 @@
 
 namespace tool {
 
-enum PngColourType : uint32 { kGrey = 0, kRgb = 2, kPalette = 3, kGreyAlpha = 4, kRgba = 6 };
+enum PngColorType : uint32 { kGrey = 0, kRgb = 2, kPalette = 3, kGreyAlpha = 4, kRgba = 6 };
 
 struct PngFile {
   uint32 width;
   uint32 height;
   uint32 bitDepth;
-  uint32 colourType;
+  uint32 colorType;
   bool isInterlaced;
   bool hasTransparency;  ///< a transparent colour, or palette entries with alpha
   std::vector<uint8> bytes;
 
-  bool hasAlpha() const { return (colourType & 4) != 0 || hasTransparency; }
+  bool hasAlpha() const { return (colorType & 4) != 0 || hasTransparency; }
 };
 
 constexpr size_t kPngStart = 8;
@@ -34,7 +34,7 @@ bool beginsPng(const std::vector<uint8>& bytes);
 /// Reads a PNG file, of which `start` has been read already. Fails when it is none, or is cut off.
 PngFile readPng(InputStream& input, std::vector<uint8> start = {});
 
-const char* colourTypeName(uint32 colourType);
+const char* colorTypeName(uint32 colorType);
 
 }  // namespace tool
 

@@ -40,7 +40,7 @@ struct RopOptions {
   uint32 rop = RASTER_ROP_CLEAR;
   std::string source;
   Point at = {0, 0};
-  std::optional<uint32> colour;
+  std::optional<uint32> color;
   std::string tile;
   Point phase = {0, 0};
   uint32 code = 24;
@@ -56,9 +56,9 @@ void ropWithSource(Picture& picture, const RopOptions& options) {
                      heightOf(placed.onTarget));
 }
 
-void ropWithColour(Picture& picture, const RopOptions& options) {
+void ropWithColor(Picture& picture, const RopOptions& options) {
   const uint32 pixel =
-      Raster_ConvertOnePixel(*options.colour, 24, static_cast<int32>(options.code), false, nullptr);
+      Raster_ConvertOnePixel(*options.color, 24, static_cast<int32>(options.code), false, nullptr);
   Raster_RectROPfill(picture.data(), static_cast<int32>(picture.pitch()), picture.bytesPerPixel(),
                      pixel, options.rop, 0, 0, picture.width(), picture.height());
 }
@@ -76,7 +76,7 @@ int rop(const RopOptions& options) {
   const SaveOptions saving = options.output.forSave();
   Picture picture = Picture::loadAs(options.code, options.destination);
   if (!options.source.empty()) ropWithSource(picture, options);
-  if (options.colour) ropWithColour(picture, options);
+  if (options.color) ropWithColor(picture, options);
   if (!options.tile.empty()) ropWithTile(picture, options);
   save(picture, options.output.path, saving);
   return kSuccess;
@@ -105,7 +105,7 @@ void addRopCommand(Commands& commands) {
   CLI::Option_group* from = command->add_option_group("source", "What is combined with it, one of");
   CLI::Option* source =
       from->add_option("--source", options->source, "a PNG picture")->type_name("FILE");
-  addParsed(from, "--color,--colour", options->colour, parseColour, "COLOUR",
+  addParsed(from, "--color,--colour", options->color, parseColor, "COLOUR",
             "one colour: RRGGBB, #RGB, 0xRRGGBB");
   CLI::Option* tile = from->add_option("--tile", options->tile, "a PNG picture that is repeated")
                           ->type_name("FILE");

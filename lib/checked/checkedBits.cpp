@@ -8,7 +8,7 @@ namespace raster::checked {
 namespace {
 
 /// What the pixels become.
-struct Colours {
+struct Colors {
   bool stencil;
   uint32 foreground;
   uint32 background;
@@ -24,15 +24,15 @@ struct Job {
   uint32 width, height;
 };
 
-void draw(const Job& job, const Colours& colours) {
+void draw(const Job& job, const Colors& colors) {
   const auto width = static_cast<int32>(job.width);
   const auto height = static_cast<int32>(job.height);
-  if (colours.stencil) {
+  if (colors.stencil) {
     Raster_BitsToPixelsStencil(job.bits, job.bitsPitch, job.dst, job.dstPitch, job.bytesPerPixel,
-                               width, height, colours.foreground);
+                               width, height, colors.foreground);
   } else {
     Raster_BitsToPixels(job.bits, job.bitsPitch, job.dst, job.dstPitch, job.bytesPerPixel, width,
-                        height, colours.foreground, colours.background);
+                        height, colors.foreground, colors.background);
   }
 }
 
@@ -49,7 +49,7 @@ void shiftBits(const uint8* bits, uint32 shift, uint32 count, uint8* out) {
 }
 
 /// Rows that begin within a byte are drawn in shifted pieces.
-void drawShifted(const Job& job, uint32 shift, const Colours& colours) {
+void drawShifted(const Job& job, uint32 shift, const Colors& colors) {
   uint8 piece[kPieceBits / 8];
   Job part = job;
   part.bits = piece;
@@ -59,13 +59,13 @@ void drawShifted(const Job& job, uint32 shift, const Colours& colours) {
       part.width = std::min(kPieceBits, job.width - x);
       part.dst = job.dst + y * job.dstPitch + size_t{x} * static_cast<uint32>(job.bytesPerPixel);
       shiftBits(job.bits + y * job.bitsPitch + x / 8, shift, part.width, piece);
-      draw(part, colours);
+      draw(part, colors);
     }
   }
 }
 
 RasterStatus drawPlane(const RasterView* dst, const Rect* rect, const RasterView* plane, int32 srcX,
-                       int32 srcY, const Colours& colours, uint32 flags) {
+                       int32 srcY, const Colors& colors, uint32 flags) {
   Area area;
   const RasterStatus status = placeBoth(dst, rect, plane, srcX, srcY, flags, &area);
   if (status != RASTER_STATUS_OK) return status;
@@ -82,9 +82,9 @@ RasterStatus drawPlane(const RasterView* dst, const Rect* rect, const RasterView
                    area.width,
                    area.height};
   if (area.srcX % 8 == 0) {
-    draw(job, colours);
+    draw(job, colors);
   } else {
-    drawShifted(job, area.srcX % 8, colours);
+    drawShifted(job, area.srcX % 8, colors);
   }
   return RASTER_STATUS_OK;
 }

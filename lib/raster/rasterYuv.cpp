@@ -10,7 +10,7 @@
 #include "raster.h"
 #include "video/videoAttributes.h"
 #include "video/rasterYuvInternal.h"
-#include "video/videoColour.h"
+#include "video/videoColor.h"
 
 namespace raster {
 namespace {
@@ -94,7 +94,7 @@ void Raster_YUVtoRGB(const uint8* src, uint8* dst, uint32 width, uint32 height, 
 }
 
 uint32 RasterRGB_YUVtoBGRX(uint8 y, uint8 u, uint8 v) {
-  const raster::Rgb c = raster::colourOf(y, u, v, 0);
+  const raster::Rgb c = raster::colorOf(y, u, v, 0);
   return c.r << 16 | c.g << 8 | c.b;
 }
 

@@ -215,12 +215,12 @@ ImageUtilImage decode(const Bytes& out) {
 TEST(PngEncoder, KeepsEveryPixel) {
   Random random(5);
   PngEncoder encoder;
-  for (const uint32 colours : {1u, 2u, 255u, 256u, 257u, 6000u}) {
-    std::vector<uint32> palette(colours);
-    for (uint32& colour : palette) colour = random.word();
+  for (const uint32 colors : {1u, 2u, 255u, 256u, 257u, 6000u}) {
+    std::vector<uint32> palette(colors);
+    for (uint32& color : palette) color = random.word();
     std::vector<uint32> pixels(kWidth * kHeight);
     for (size_t i = 0; i < pixels.size(); ++i)
-      pixels[i] = palette[i < colours ? i : random.below(colours)];
+      pixels[i] = palette[i < colors ? i : random.below(colors)];
     const PixelView view = {reinterpret_cast<const uint8*>(pixels.data()), 4 * kWidth, kWidth,
                             kHeight};
     for (const Rect rect : {view.bounds(), Rect{3, 5, 60, 50}, Rect{89, 69, 90, 70}}) {
@@ -233,18 +233,18 @@ TEST(PngEncoder, KeepsEveryPixel) {
       for (uint32 y = 0; y < image.height; ++y) {
         for (uint32 x = 0; x < image.width; ++x) {
           const uint8* pixel = image.data + size_t{y} * image.bytesPerLine + x * (image.bpp / 8);
-          uint32 colour = pixel[0];
+          uint32 color = pixel[0];
           if (image.bpp == 8) {
             const ImageUtilColor& entry = image.palette[*pixel];
-            colour = uint32{entry.red} << 16 | uint32{entry.green} << 8 | entry.blue;
+            color = uint32{entry.red} << 16 | uint32{entry.green} << 8 | entry.blue;
           } else {
-            colour = uint32{pixel[2]} << 16 | uint32{pixel[1]} << 8 | pixel[0];
+            color = uint32{pixel[2]} << 16 | uint32{pixel[1]} << 8 | pixel[0];
           }
           uint32 expected;
           memcpy(&expected,
                  view.at(rect.left + static_cast<int32>(x), rect.top + static_cast<int32>(y)),
                  sizeof expected);
-          ASSERT_EQ(colour, expected & 0xFFFFFF);
+          ASSERT_EQ(color, expected & 0xFFFFFF);
         }
       }
       ImageUtil_FreeImageData(&image);

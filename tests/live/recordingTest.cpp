@@ -38,11 +38,11 @@ struct Sample {
 
 /// Half of it in runs of one colour, so that blocks of both kinds occur.
 void repaint(Random& random, std::vector<uint8>& picture, const Rect& rect) {
-  const uint32 colour = random.word() & 0xFFFFFF;
+  const uint32 color = random.word() & 0xFFFFFF;
   const bool isPlain = random.below(2) == 0;
   for (int32 y = rect.top; y < rect.bottom; ++y) {
     for (int32 x = rect.left; x < rect.right; ++x) {
-      const uint32 pixel = isPlain ? colour : random.word() & 0xFFFFFF;
+      const uint32 pixel = isPlain ? color : random.word() & 0xFFFFFF;
       memcpy(picture.data() + 4 * (static_cast<size_t>(y) * kWidth + static_cast<size_t>(x)),
              &pixel, sizeof pixel);
     }

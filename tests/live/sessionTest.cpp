@@ -102,13 +102,13 @@ class Viewer {
   std::vector<uint8> picture;
   std::vector<Rect> drawn;
   std::vector<int32> others;
-  bool gotColourMap = false;
+  bool gotColorMap = false;
 
  private:
   void take(const Bytes& out) {
     const uint8* at = out.data();
     if (*at == 1) {
-      gotColourMap = true;
+      gotColorMap = true;
       at += 6 + 256 * 6;
     }
     ASSERT_EQ(*at, 0);
@@ -331,14 +331,14 @@ TEST(Session, TellsWhereThePointerIs) {
   EXPECT_TRUE(viewer.update(scene));
 }
 
-TEST(Session, SendsAColourMapBeforeIndices) {
+TEST(Session, SendsAColorMapBeforeIndices) {
   Screen screen(9);
   Viewer viewer;
   PixelFormat indexed = kEight;
-  indexed.trueColour = false;
+  indexed.trueColor = false;
   ASSERT_TRUE(viewer.say(Messages().format(indexed).request(false, kWhole), kEight));
   ASSERT_TRUE(viewer.update(screen.scene()));
-  EXPECT_TRUE(viewer.gotColourMap);
+  EXPECT_TRUE(viewer.gotColorMap);
   expectSeesScreen(viewer, screen);
 }
 

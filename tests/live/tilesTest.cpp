@@ -33,7 +33,7 @@ bool isInside(const std::vector<Rect>& rects, int32 x, int32 y) {
                      [&](const Rect& rect) { return Rect_ContainsPoint(&rect, &point); });
 }
 
-bool sameColour(const uint8* a, const uint8* b) { return memcmp(a, b, 3) == 0; }
+bool sameColor(const uint8* a, const uint8* b) { return memcmp(a, b, 3) == 0; }
 
 TEST(Tiles, TakesOverWhatDiffersWithinTheDamage) {
   Random random(1);
@@ -60,9 +60,9 @@ TEST(Tiles, TakesOverWhatDiffersWithinTheDamage) {
         const size_t at = (static_cast<size_t>(y) * kWidth + static_cast<size_t>(x)) * 4;
         const bool wasDamaged = isInside(damaged, x, y);
         const uint8* pixel = seen.data() + at;
-        ASSERT_TRUE(wasDamaged ? sameColour(pixel, now.data() + at)
+        ASSERT_TRUE(wasDamaged ? sameColor(pixel, now.data() + at)
                                : memcmp(pixel, before.data() + at, 4) == 0);
-        ASSERT_TRUE(sameColour(pixel, before.data() + at) || isInside(told, x, y));
+        ASSERT_TRUE(sameColor(pixel, before.data() + at) || isInside(told, x, y));
       }
     }
   }

@@ -56,10 +56,10 @@ uint32 field(uint32 channel, uint32 max, uint32 shift) {
   return (repeated >> (16 - bits)) << shift;
 }
 
-std::vector<uint8> modelPixel(const PixelFormat& format, uint32 colour) {
-  const uint32 value = field(colour >> 16 & 255, format.redMax, format.redShift) |
-                       field(colour >> 8 & 255, format.greenMax, format.greenShift) |
-                       field(colour & 255, format.blueMax, format.blueShift);
+std::vector<uint8> modelPixel(const PixelFormat& format, uint32 color) {
+  const uint32 value = field(color >> 16 & 255, format.redMax, format.redShift) |
+                       field(color >> 8 & 255, format.greenMax, format.greenShift) |
+                       field(color & 255, format.blueMax, format.blueShift);
   std::vector<uint8> bytes;
   for (uint32 i = 0; i < format.bitsPerPixel / 8; ++i)
     bytes.push_back(static_cast<uint8>(value >> 8 * i));
@@ -91,8 +91,8 @@ TEST(ViewerFormat, ConvertsEveryFormatAsTheModelDoes) {
       for (int32 y = area.top; y < area.bottom; ++y) {
         for (int32 x = area.left; x < area.right; ++x) {
           const uint8* pixel = view.at(x, y);
-          const uint32 colour = uint32{pixel[2]} << 16 | uint32{pixel[1]} << 8 | pixel[0];
-          for (const uint8 byte : modelPixel(named.format, colour)) expected.push_back(byte);
+          const uint32 color = uint32{pixel[2]} << 16 | uint32{pixel[1]} << 8 | pixel[0];
+          for (const uint8 byte : modelPixel(named.format, color)) expected.push_back(byte);
         }
       }
       for (size_t i = 0; i < expected.size(); ++i)
@@ -152,21 +152,21 @@ TEST(ViewerFormat, RefusesWhatCannotBe) {
   bad.blueShift = 4;  // the channels overlap
   EXPECT_TRUE(isRefused(bad));
   bad = good;
-  bad.trueColour = false;  // a table of 2^32 colours
+  bad.trueColor = false;  // a table of 2^32 colours
   EXPECT_TRUE(isRefused(bad));
 }
 
 TEST(ViewerFormat, SendsATableToViewersThatWantIndices) {
   PixelFormat indexed = kFormats[0].format;
   indexed.bitsPerPixel = 8;
-  indexed.trueColour = false;
+  indexed.trueColor = false;
   const auto read = tool::live::readPixelFormat(asBytes(indexed).data());
   ASSERT_TRUE(read);
   const ViewerFormat format(*read);
-  EXPECT_TRUE(format.needsColourMap());
+  EXPECT_TRUE(format.needsColorMap());
   EXPECT_EQ(format.libraryCode(), 8u);
   Bytes map;
-  ViewerFormat::putColourMap(map);
+  ViewerFormat::putColorMap(map);
   ASSERT_EQ(map.size(), 6u + 256 * 6);
   const auto channel = [&](uint32 index, uint32 which) {
     return tool::live::bigEndian16(map.data() + 6 + size_t{6} * index + size_t{2} * which);

@@ -84,12 +84,12 @@ class TileReader {
     return bytes;
   }
   std::vector<Pixel> palette(uint32 count) {
-    std::vector<Pixel> colours;
-    for (uint32 i = 0; i < count; ++i) colours.push_back(pixel());
-    return colours;
+    std::vector<Pixel> colors;
+    for (uint32 i = 0; i < count; ++i) colors.push_back(pixel());
+    return colors;
   }
   void packed(uint32 count, uint32 width, uint32 height, std::vector<Pixel>& pixels) {
-    const std::vector<Pixel> colours = palette(count);
+    const std::vector<Pixel> colors = palette(count);
     const uint32 bits = count == 2 ? 1 : count <= 4 ? 2 : 4;
     for (uint32 y = 0; y < height; ++y) {
       uint32 held = 0;
@@ -100,21 +100,21 @@ class TileReader {
           left = 8;
         }
         left -= bits;
-        pixels.push_back(colours.at(held >> left & ((1u << bits) - 1)));
+        pixels.push_back(colors.at(held >> left & ((1u << bits) - 1)));
       }
     }
   }
   void runs(uint32 type, size_t count, std::vector<Pixel>& pixels) {
-    const std::vector<Pixel> colours = palette(type - 128);
+    const std::vector<Pixel> colors = palette(type - 128);
     while (pixels.size() < count && at < end) {
       const uint32 index = type == 128 ? 128 : byte();
-      const Pixel colour = type == 128 ? pixel() : colours.at(index & 127);
+      const Pixel color = type == 128 ? pixel() : colors.at(index & 127);
       size_t length = 1;
       if ((index & 128) != 0) {
         uint32 more = 255;
         while (more == 255) length += more = byte();
       }
-      pixels.insert(pixels.end(), length, colour);
+      pixels.insert(pixels.end(), length, color);
     }
   }
 
@@ -151,14 +151,14 @@ void expectDecoded(const Bytes& out, Inflater& inflater, const PixelView& view, 
 }
 
 /// A picture of some colours in runs of some length, with anything in the top bytes.
-std::vector<uint32> randomPicture(Random& random, size_t count, uint32 colours, uint32 longest) {
-  std::vector<uint32> palette(colours);
-  for (uint32& colour : palette) colour = random.word();
+std::vector<uint32> randomPicture(Random& random, size_t count, uint32 colors, uint32 longest) {
+  std::vector<uint32> palette(colors);
+  for (uint32& color : palette) color = random.word();
   std::vector<uint32> pixels;
   while (pixels.size() < count) {
-    const uint32 colour = palette[random.below(colours)] & 0xFFFFFF;
+    const uint32 color = palette[random.below(colors)] & 0xFFFFFF;
     for (uint32 length = 1 + random.below(longest); length != 0; --length)
-      pixels.push_back(colour | random.word() << 24);
+      pixels.push_back(color | random.word() << 24);
   }
   pixels.resize(count);
   return pixels;
@@ -188,9 +188,9 @@ TEST(ZrleEncoder, IsDecodedToTheSamePixelsInEveryFormat) {
     const ViewerFormat format(wanted);
     ZrleEncoder encoder;
     Inflater inflater;
-    for (const uint32 colours : {1u, 2u, 3u, 5u, 16u, 17u, 127u, 128u, 5000u}) {
+    for (const uint32 colors : {1u, 2u, 3u, 5u, 16u, 17u, 127u, 128u, 5000u}) {
       for (const uint32 longest : {1u, 3u, 40u, 1000u}) {
-        const auto pixels = randomPicture(random, size_t{kWidth} * kHeight, colours, longest);
+        const auto pixels = randomPicture(random, size_t{kWidth} * kHeight, colors, longest);
         const PixelView view = {reinterpret_cast<const uint8*>(pixels.data()), 4 * kWidth, kWidth,
                                 kHeight};
         const int32 x = random.between(0, kWidth - 1);
@@ -209,19 +209,19 @@ TEST(ZrleEncoder, IsDecodedToTheSamePixelsInEveryFormat) {
   for (const bool wasMet : forms) EXPECT_TRUE(wasMet);
 }
 
-TEST(ZrleEncoder, RepeatsAPatternBrieflyWhicheverColourItBeginsWith) {
+TEST(ZrleEncoder, RepeatsAPatternBrieflyWhicheverColorItBeginsWith) {
   constexpr uint32 kSide = 64;
-  const uint32 colours[] = {0xC0C0C0, 0x102030, 0xFFFFFF, 0x808080};
+  const uint32 colors[] = {0xC0C0C0, 0x102030, 0xFFFFFF, 0x808080};
   Random random(8);
   std::vector<uint32> pixels;
-  for (uint32 i = 0; i < kSide * kSide; ++i) pixels.push_back(colours[random.below(4)]);
+  for (uint32 i = 0; i < kSide * kSide; ++i) pixels.push_back(colors[random.below(4)]);
   const PixelView view = {reinterpret_cast<const uint8*>(pixels.data()), 4 * kSide, kSide, kSide};
   ZrleEncoder encoder;
   Bytes out;
   encoder.put(view, view.bounds(), ViewerFormat(), out);
   EXPECT_GT(out.size(), kSide * kSide / 4);
-  for (const uint32 colour : colours) {
-    pixels[0] = colour;
+  for (const uint32 color : colors) {
+    pixels[0] = color;
     out.clear();
     encoder.put(view, view.bounds(), ViewerFormat(), out);
     EXPECT_LT(out.size(), kSide * kSide / 4 / 8);

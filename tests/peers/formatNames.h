@@ -17,12 +17,12 @@
 /// multiple of 16 and with rows of 16 bytes, and returns 0xRRGGBB.
 template <class Read> void expectReads(int32 code, const Read& read) {
   for (uint32 i = 0; i < 8; ++i) {
-    const uint32 colour =
+    const uint32 color =
         0xFF000000U | (i & 1) * 0xFF0000U | (i >> 1 & 1) * 0xFF00U | (i >> 2) * 0xFFU;
     alignas(16) std::array<uint8, 16> bytes = {};
-    Raster_ConvertPixels(bytes.data(), 16, code, &colour, 4, RASTER_FORMAT_8888, false, nullptr, 0,
+    Raster_ConvertPixels(bytes.data(), 16, code, &color, 4, RASTER_FORMAT_8888, false, nullptr, 0,
                          0, 0, 0, 1, 1);
-    EXPECT_EQ(read(bytes.data()) & 0xFFFFFFU, colour & 0xFFFFFFU) << "format " << code;
+    EXPECT_EQ(read(bytes.data()) & 0xFFFFFFU, color & 0xFFFFFFU) << "format " << code;
   }
 }
 

@@ -124,12 +124,12 @@ void check(const Words& pixels, Guard guard = Guard::kAfter) {
 }
 
 /// Runs of random lengths up to `longest`, of few colours, so that neighbours may be equal.
-Words someRuns(Random& random, size_t count, uint32 longest, uint32 colours) {
+Words someRuns(Random& random, size_t count, uint32 longest, uint32 colors) {
   Words pixels;
   while (pixels.size() < count) {
-    const uint32 colour = random.below(colours);
+    const uint32 color = random.below(colors);
     for (uint32 run = 1 + random.below(longest); run != 0 && pixels.size() < count; --run)
-      pixels.push_back(colour);
+      pixels.push_back(color);
   }
   return pixels;
 }
@@ -139,13 +139,13 @@ TEST(Raster_Compress, EqualsTheModelForRunsOfAllKinds) {
   for (int round = 0; round < tests::rounds(12000); ++round) {
     const size_t count = random.below(round % 50 == 0 ? 5000 : 150);
     const uint32 longest = random.oneOf({1u, 2u, 3u, 4u, 6u, 20u, 90u, 400u});
-    const uint32 colours = random.oneOf({1u, 2u, 3u, 1000000000u});
-    check(someRuns(random, count, longest, colours), tests::someGuard(random));
+    const uint32 colors = random.oneOf({1u, 2u, 3u, 1000000000u});
+    check(someRuns(random, count, longest, colors), tests::someGuard(random));
     if (HasFatalFailure()) return;
   }
 }
 
-TEST(Raster_Compress, EqualsTheModelForEveryImageOfTenPixelsAndThreeColours) {
+TEST(Raster_Compress, EqualsTheModelForEveryImageOfTenPixelsAndThreeColors) {
   for (uint32 image = 0; image < 59049; ++image) {
     Words pixels;
     for (uint32 rest = image, i = 0; i < 10; ++i, rest /= 3) pixels.push_back(rest % 3);

@@ -127,27 +127,27 @@ constexpr uint32 kWheelHeight = 128;
 
 /// The colour of pixel (x, y) of a frame that holds every pair of luma and blue-difference: blocks
 /// of 2 x 2 pixels have one blue-difference per column of blocks, and four lumas each.
-struct WheelColour {
+struct WheelColor {
   uint8 y, cb;
 };
-WheelColour wheelColour(uint32 x, uint32 y) {
+WheelColor wheelColor(uint32 x, uint32 y) {
   return {static_cast<uint8>(y / 2 * 4 + y % 2 * 2 + x % 2), static_cast<uint8>(x / 2)};
 }
 
 /// The frame of all colours with one red-difference.
-Bytes colourWheel(uint32 format, uint8 cr) {
+Bytes colorWheel(uint32 format, uint8 cr) {
   Bytes frame(frameBytes(kWheelWidth, kWheelHeight, format), cr);
   for (uint32 y = 0; y < kWheelHeight; ++y) {
     for (uint32 x = 0; x < kWheelWidth; ++x) {
-      const WheelColour colour = wheelColour(x, y);
+      const WheelColor color = wheelColor(x, y);
       const size_t at = size_t{y} * kWheelWidth + x;
       if (format == RASTER_VIDEO_YV12) {
-        frame[at] = colour.y;
-        frame[size_t{kWheelWidth} * kWheelHeight + y / 2 * (kWheelWidth / 2) + x / 2] = colour.cb;
+        frame[at] = color.y;
+        frame[size_t{kWheelWidth} * kWheelHeight + y / 2 * (kWheelWidth / 2) + x / 2] = color.cb;
       } else {
         const bool lumaFirst = format == RASTER_VIDEO_YUY2;
-        frame[2 * at + (lumaFirst ? 0 : 1)] = colour.y;
-        if (x % 2 == 1) frame[2 * at + (lumaFirst ? 1 : 0)] = colour.cb;
+        frame[2 * at + (lumaFirst ? 0 : 1)] = color.y;
+        if (x % 2 == 1) frame[2 * at + (lumaFirst ? 1 : 0)] = color.cb;
       }
     }
   }
@@ -161,19 +161,19 @@ Bytes convertedWheel(int cr, int bppdepth) {
   uint8* at = pixels.data();
   for (uint32 y = 0; y < kWheelHeight; ++y) {
     for (uint32 x = 0; x < kWheelWidth; ++x, at += bytes) {
-      const WheelColour colour = wheelColour(x, y);
+      const WheelColor color = wheelColor(x, y);
       const uint32 pixel =
-          reference::packPixel(reference::yuvToPixel(colour.y, colour.cb, cr, 128), bppdepth);
+          reference::packPixel(reference::yuvToPixel(color.y, color.cb, cr, 128), bppdepth);
       memcpy(at, &pixel, bytes);
     }
   }
   return pixels;
 }
 
-TEST(Raster_YUVtoRGB, ConvertsEveryColourExactly) {
+TEST(Raster_YUVtoRGB, ConvertsEveryColorExactly) {
   for (int cr = 0; cr < 256; ++cr) {
     Bytes frames[3];
-    for (size_t f = 0; f < 3; ++f) frames[f] = colourWheel(kFormats[f], static_cast<uint8>(cr));
+    for (size_t f = 0; f < 3; ++f) frames[f] = colorWheel(kFormats[f], static_cast<uint8>(cr));
     for (const int bppdepth : kDepths) {
       const Bytes expected = convertedWheel(cr, bppdepth);
       for (size_t f = 0; f < 3; ++f) {
@@ -208,11 +208,9 @@ TEST(Raster_YUVtoRGB, MapsTheEndsOfTheLumaRangeToBlackAndWhite) {
 
 // Deliberate: the first chroma byte of a packed group is the red-difference.
 TEST(Raster_YUVtoRGB, TakesTheFirstChromaByteOfAPackedGroupAsRedDifference) {
-  constexpr uint32 kColour = 255 << 16 | 83 << 8 | 0;
-  EXPECT_EQ(convertTwo({0x80, 0xF0, 0x80, 0x10}, RASTER_VIDEO_YUY2, 32),
-            std::pair(kColour, kColour));
-  EXPECT_EQ(convertTwo({0xF0, 0x80, 0x10, 0x80}, RASTER_VIDEO_UYVY, 32),
-            std::pair(kColour, kColour));
+  constexpr uint32 kColor = 255 << 16 | 83 << 8 | 0;
+  EXPECT_EQ(convertTwo({0x80, 0xF0, 0x80, 0x10}, RASTER_VIDEO_YUY2, 32), std::pair(kColor, kColor));
+  EXPECT_EQ(convertTwo({0xF0, 0x80, 0x10, 0x80}, RASTER_VIDEO_UYVY, 32), std::pair(kColor, kColor));
 }
 
 // Deliberate: the plane after the luma plane is the blue-difference.
@@ -345,7 +343,7 @@ TEST(RasterComputeVideoAttributes, RefusesAnUnknownFormatAndLogsOnce) {
 }
 
 // Deliberate: no rounding term here.
-TEST(RasterRGB_YUVtoBGRX, ConvertsEveryColourWithoutRounding) {
+TEST(RasterRGB_YUVtoBGRX, ConvertsEveryColorWithoutRounding) {
   EXPECT_EQ(RasterRGB_YUVtoBGRX(235, 128, 128), 0x00FEFEFEu);
   for (int y = 0; y < 256; ++y) {
     for (int u = 0; u < 256; ++u) {

@@ -150,7 +150,7 @@ Bytes geometry(unsigned short sequence) {
   return replyOf(reply, sequence);
 }
 
-Bytes colours(unsigned short sequence) {
+Bytes colors(unsigned short sequence) {
   xcb_query_colors_reply_t reply = {};
   reply.colors_len = value<uint16_t>("colours");
   return replyOf(reply, sequence, Bytes(sizeof(xcb_rgb_t) * values["coloursSent"], 0x40));
@@ -198,7 +198,7 @@ Bytes answer(unsigned char opcode, unsigned char minor, const Bytes& body,
     case XCB_GET_GEOMETRY:
       return geometry(sequence);
     case XCB_QUERY_COLORS:
-      return colours(sequence);
+      return colors(sequence);
     case XCB_QUERY_EXTENSION:
       return extension(body, sequence);
     case XCB_GET_IMAGE:

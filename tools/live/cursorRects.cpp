@@ -17,13 +17,13 @@ void putHeader(const LiveCursor& cursor, Encoding encoding, Bytes& out) {
 uint32 alphaOf(uint32 pixel) { return pixel >> 24; }
 
 /// The colour that was multiplied by its alpha.
-uint32 ownColour(uint32 pixel) {
+uint32 ownColor(uint32 pixel) {
   const uint32 alpha = alphaOf(pixel);
   if (alpha == 0) return 0;
-  uint32 colour = 0;
+  uint32 color = 0;
   for (const uint32 shift : {0u, 8u, 16u})
-    colour |= std::min(255u, (pixel >> shift & 255) * 255 / alpha) << shift;
-  return colour;
+    color |= std::min(255u, (pixel >> shift & 255) * 255 / alpha) << shift;
+  return color;
 }
 
 }  // namespace
@@ -32,7 +32,7 @@ void putCursor(const LiveCursor& cursor, const ViewerFormat& format, Bytes& out)
   constexpr uint32 kHalf = 128;
   putHeader(cursor, kCursor, out);
   for (const uint32 pixel : cursor.pixels)
-    format.convert(out.extend(format.bytesPerPixel()), ownColour(pixel));
+    format.convert(out.extend(format.bytesPerPixel()), ownColor(pixel));
   const uint32 maskPitch = (cursor.width + 7) / 8;
   const size_t maskBytes = size_t{maskPitch} * cursor.height;
   uint8* mask = out.extend(maskBytes);

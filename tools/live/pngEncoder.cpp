@@ -4,7 +4,7 @@
 
 #include <new>
 
-#include "colourTable.h"
+#include "colorTable.h"
 #include "dynBuf.h"
 
 namespace tool::live {
@@ -24,7 +24,7 @@ void putCompactLength(size_t length, Bytes& out) {
 
 /// Fills `indices` and the palette, or returns false when there are too many colours.
 bool PngEncoder::findPalette(const PixelView& pixels, const Rect& rect) {
-  using Table = ColourTable<256>;
+  using Table = ColorTable<256>;
   Table table;
   indices.resize(size_t{image.width} * image.height);
   uint8* to = indices.data();
@@ -33,19 +33,19 @@ bool PngEncoder::findPalette(const PixelView& pixels, const Rect& rect) {
   for (int32 y = rect.top; y < rect.bottom; ++y) {
     const uint8* row = pixels.at(rect.left, y);
     for (uint32 x = 0; x < widthOf(rect); ++x, row += 4) {
-      uint32 colour;
-      memcpy(&colour, row, sizeof colour);
-      colour &= 0xFFFFFF;
-      if (colour != previous) index = table.indexOf(previous = colour);
+      uint32 color;
+      memcpy(&color, row, sizeof color);
+      color &= 0xFFFFFF;
+      if (color != previous) index = table.indexOf(previous = color);
       if (index == Table::kNone) return false;
       *to++ = static_cast<uint8>(index);
     }
   }
   image.numColors = table.size();
   for (uint32 i = 0; i < table.size(); ++i) {
-    const uint32 colour = table.colour(i);
-    image.palette[i] = {static_cast<uint8>(colour), static_cast<uint8>(colour >> 8),
-                        static_cast<uint8>(colour >> 16), 0};
+    const uint32 color = table.color(i);
+    image.palette[i] = {static_cast<uint8>(color), static_cast<uint8>(color >> 8),
+                        static_cast<uint8>(color >> 16), 0};
   }
   return true;
 }

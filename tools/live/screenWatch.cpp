@@ -172,7 +172,7 @@ void ScreenWatch::makeMemory() {
     ownRows.resize(size);
     rows = ownRows.data();
   }
-  if (screen.code() != 32) asTrueColour = Picture(width(), height(), 32);
+  if (screen.code() != 32) asTrueColor = Picture(width(), height(), 32);
 }
 
 std::vector<ScreenWatch::Rows> ScreenWatch::damagedRows(const ChangeList& damage) {
@@ -236,20 +236,20 @@ void ScreenWatch::hide(const Rows& band) {
 
 PixelView ScreenWatch::converted(const ChangeList& damage) {
   std::array<uint32, 256> palette;
-  std::transform(screen.colours(), screen.colours() + palette.size(), palette.begin(),
-                 [](const ImageUtilColor& colour) {
-                   return uint32{colour.red} << 16 | uint32{colour.green} << 8 | colour.blue;
+  std::transform(screen.colors(), screen.colors() + palette.size(), palette.begin(),
+                 [](const ImageUtilColor& color) {
+                   return uint32{color.red} << 16 | uint32{color.green} << 8 | color.blue;
                  });
   for (const RectList& list : damage.lists()) {
     for (const Rect& rect : rectsOf(list)) {
       const auto x = static_cast<uint32>(rect.left);
       const auto y = static_cast<uint32>(rect.top);
-      Raster_ConvertPixels(asTrueColour.data(), asTrueColour.pitch(), 32, rows, rowPitch,
+      Raster_ConvertPixels(asTrueColor.data(), asTrueColor.pitch(), 32, rows, rowPitch,
                            static_cast<int32>(screen.code()), screen.isIndexed(), palette.data(), x,
                            y, x, y, widthOf(rect), heightOf(rect));
     }
   }
-  return {asTrueColour.data(), asTrueColour.pitch(), width(), height()};
+  return {asTrueColor.data(), asTrueColor.pitch(), width(), height()};
 }
 
 std::optional<PixelView> ScreenWatch::capture(const ChangeList& damage) {

@@ -49,7 +49,7 @@ class ScreenWatch {
   bool tellsCursor() const { return hasCursor; }
   /// Whether pixels are indices into a palette, whose changes the server never tells.
   bool hasPalette() const { return screen.isIndexed(); }
-  bool refreshPalette() { return hasPalette() && screen.refreshColours(); }
+  bool refreshPalette() { return hasPalette() && screen.refreshColors(); }
 
   /// From here on the server says what changes; before, and after end(), it says nothing.
   void begin();
@@ -94,7 +94,7 @@ class ScreenWatch {
   std::vector<uint8> ownRows;  // where no memory can be shared
   uint8* rows = nullptr;       // one of the two
   uint32 rowPitch = 0;
-  Picture asTrueColour;  // for screens of other formats
+  Picture asTrueColor;  // for screens of other formats
 };
 
 }  // namespace tool::live

@@ -49,7 +49,7 @@ void Session::onStart(Bytes& out) {
 
 void Session::onFormat(const PixelFormat& wanted) {
   format = ViewerFormat(wanted);
-  owesColourMap = format.needsColourMap();
+  owesColorMap = format.needsColorMap();
   sentCursor = 0;  // its pixels are in the new format from now on
 }
 
@@ -170,7 +170,7 @@ bool Session::putUpdate(const Scene& scene, Bytes& out) {
   }
   followDrawnCursor(scene);
   const size_t before = out.size();
-  if (owesColourMap) ViewerFormat::putColourMap(out);
+  if (owesColorMap) ViewerFormat::putColorMap(out);
   const size_t count = beginUpdate(out);
   uint32 rects = putCursorRects(scene, out);
   for (const Rect& rect : changes.within(*asked)) rects += putPixels(scene.pixels, rect, out);
@@ -179,7 +179,7 @@ bool Session::putUpdate(const Scene& scene, Bytes& out) {
     return false;
   }
   storeBigEndian16(out.data() + count, rects);
-  owesColourMap = false;
+  owesColorMap = false;
   changes.subtract(*asked);
   asked.reset();
   return true;

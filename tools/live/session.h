@@ -100,7 +100,7 @@ class Session : private ProtocolEvents {
   ZrleEncoder zrle;
   PngEncoder png;
   bool isStarted = false;  // it knows the picture's size
-  bool owesColourMap = false;
+  bool owesColorMap = false;
   bool owesSize = false;
   ChangeList changes;
   Rect everShown;  // all sizes that the viewer may still take for the picture's

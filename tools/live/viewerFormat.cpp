@@ -48,7 +48,7 @@ bool isChannel(uint32 max, uint32 shift, uint32 bitsPerPixel) {
 bool isPossible(const PixelFormat& format) {
   const uint32 bits = format.bitsPerPixel;
   if (bits != 8 && bits != 16 && bits != 24 && bits != 32) return false;
-  if (!format.trueColour) return bits == 8;
+  if (!format.trueColor) return bits == 8;
   if (!isChannel(format.redMax, format.redShift, bits) ||
       !isChannel(format.greenMax, format.greenShift, bits) ||
       !isChannel(format.blueMax, format.blueShift, bits))
@@ -89,14 +89,14 @@ std::optional<PixelFormat> readPixelFormat(const uint8* bytes) {
                         bytes[11],
                         bytes[12]};
   if (!isPossible(format)) return std::nullopt;
-  return format.trueColour ? format : kMapped;
+  return format.trueColor ? format : kMapped;
 }
 
 void putPixelFormat(Bytes& out, const PixelFormat& format) {
   out.put8(format.bitsPerPixel);
   out.put8(format.depth);
   out.put8(format.bigEndian);
-  out.put8(format.trueColour);
+  out.put8(format.trueColor);
   for (const uint32 max : {format.redMax, format.greenMax, format.blueMax}) out.put16(max);
   for (const uint32 shift : {format.redShift, format.greenShift, format.blueShift}) out.put8(shift);
   for (int padding = 0; padding < 3; ++padding) out.put8(0);
@@ -162,16 +162,16 @@ void ViewerFormat::convert(uint8* to, uint32 toPitch, const PixelView& from,
   }
 }
 
-void ViewerFormat::convert(uint8* to, uint32 colour) const {
+void ViewerFormat::convert(uint8* to, uint32 color) const {
   uint8 pixel[4];
-  memcpy(pixel, &colour, sizeof pixel);
+  memcpy(pixel, &color, sizeof pixel);
   convert(to, pixelBytes, {pixel, sizeof pixel, 1, 1}, {0, 0, 1, 1});
 }
 
-void ViewerFormat::putColourMap(Bytes& out) {
-  constexpr uint32 kSetColourMapEntries = 1;
+void ViewerFormat::putColorMap(Bytes& out) {
+  constexpr uint32 kSetColorMapEntries = 1;
   constexpr uint32 kEntries = 256;
-  out.put8(kSetColourMapEntries);
+  out.put8(kSetColorMapEntries);
   out.put8(0);
   out.put16(0);
   out.put16(kEntries);

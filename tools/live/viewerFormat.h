@@ -20,7 +20,7 @@ struct PixelFormat {
   uint32 bitsPerPixel;  // 8, 16, 24 or 32
   uint32 depth;
   bool bigEndian;
-  bool trueColour;  // otherwise pixels are indices into a table that the server sends
+  bool trueColor;  // otherwise pixels are indices into a table that the server sends
   uint32 redMax, greenMax, blueMax;
   uint32 redShift, greenShift, blueShift;
 
@@ -42,7 +42,7 @@ class ViewerFormat {
   uint32 bytesPerPixel() const { return pixelBytes; }
   /// The library's code of the format, or 0 when it has none.
   uint32 libraryCode() const { return code; }
-  bool needsColourMap() const { return !format.trueColour; }
+  bool needsColorMap() const { return !format.trueColor; }
 
   /// Bytes that are left of a pixel, and where they begin, when its unused byte is left out.
   uint32 compactBytes() const { return packedBytes; }
@@ -51,10 +51,10 @@ class ViewerFormat {
   /// Converts a rectangle of 0x00RRGGBB pixels; `to` is the address of its first pixel.
   void convert(uint8* to, uint32 toPitch, const PixelView& from, const Rect& area) const;
   /// One colour, 0x00RRGGBB, as its bytes in memory.
-  void convert(uint8* to, uint32 colour) const;
+  void convert(uint8* to, uint32 color) const;
 
   /// The table of a viewer whose pixels are indices: the colours of all 256 of them.
-  static void putColourMap(Bytes& out);
+  static void putColorMap(Bytes& out);
 
  private:
   void fillTables();

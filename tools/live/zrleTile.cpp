@@ -4,16 +4,16 @@
 
 #include <algorithm>
 
-#include "colourTable.h"
+#include "colorTable.h"
 
 namespace tool::live {
 namespace {
 
-constexpr uint32 kMostPackedColours = 16;
+constexpr uint32 kMostPackedColors = 16;
 
 enum Subencoding : uint8 { kPlain = 0, kSolid = 1, kPlainRuns = 128 };
 
-using Palette = ColourTable<127>;  // as many as runs can have
+using Palette = ColorTable<127>;  // as many as runs can have
 
 /// What is known of a tile before its form is chosen.
 struct Survey {
@@ -26,20 +26,20 @@ struct Survey {
 
 template <class Body> void forRuns(const uint32* pixels, uint32 count, Body body) {
   for (uint32 at = 0; at < count;) {
-    const uint32 colour = pixels[at];
+    const uint32 color = pixels[at];
     uint32 end = at + 1;
-    while (end < count && pixels[end] == colour) ++end;
-    body(colour, end - at);
+    while (end < count && pixels[end] == color) ++end;
+    body(color, end - at);
     at = end;
   }
 }
 
 Survey surveyOf(const uint32* pixels, uint32 count) {
   Survey survey;
-  forRuns(pixels, count, [&](uint32 colour, uint32 length) {
+  forRuns(pixels, count, [&](uint32 color, uint32 length) {
     ++(length == 1 ? survey.singles : survey.runs);
     survey.extraBytes += (length - 1) / 255;
-    if (survey.fitsPalette) survey.fitsPalette = survey.palette.indexOf(colour) != Palette::kNone;
+    if (survey.fitsPalette) survey.fitsPalette = survey.palette.indexOf(color) != Palette::kNone;
   });
   return survey;
 }
@@ -47,15 +47,15 @@ Survey surveyOf(const uint32* pixels, uint32 count) {
 /// The same colours in the order of their values, whichever of them the tile began with: what looks
 /// alike in two tiles then has the same bytes, and zlib finds it.
 Palette sorted(const Palette& palette) {
-  uint32 colours[Palette::kNone];
-  for (uint32 i = 0; i < palette.size(); ++i) colours[i] = palette.colour(i);
-  std::sort(colours, colours + palette.size());
+  uint32 colors[Palette::kNone];
+  for (uint32 i = 0; i < palette.size(); ++i) colors[i] = palette.color(i);
+  std::sort(colors, colors + palette.size());
   Palette inOrder;
-  for (uint32 i = 0; i < palette.size(); ++i) inOrder.indexOf(colours[i]);
+  for (uint32 i = 0; i < palette.size(); ++i) inOrder.indexOf(colors[i]);
   return inOrder;
 }
 
-uint32 bitsOfIndex(uint32 colours) { return colours <= 2 ? 1 : colours <= 4 ? 2 : 4; }
+uint32 bitsOfIndex(uint32 colors) { return colors <= 2 ? 1 : colors <= 4 ? 2 : 4; }
 
 /// Writes into room that is known to be enough, and three bytes beyond.
 class Writer {
@@ -93,22 +93,22 @@ void writePlain(Writer& writer, const Tile& tile) {
 
 void writePlainRuns(Writer& writer, const Tile& tile) {
   writer.put(kPlainRuns);
-  forRuns(tile.pixels, tile.count(), [&](uint32 colour, uint32 length) {
-    writer.putPixel(colour);
+  forRuns(tile.pixels, tile.count(), [&](uint32 color, uint32 length) {
+    writer.putPixel(color);
     writer.putLength(length);
   });
 }
 
 void writePalette(Writer& writer, const Palette& palette) {
-  for (uint32 i = 0; i < palette.size(); ++i) writer.putPixel(palette.colour(i));
+  for (uint32 i = 0; i < palette.size(); ++i) writer.putPixel(palette.color(i));
 }
 
 void writePaletteRuns(Writer& writer, const Tile& tile, Palette palette) {
   constexpr uint32 kIsRun = 128;
   writer.put(kPlainRuns + palette.size());
   writePalette(writer, palette);
-  forRuns(tile.pixels, tile.count(), [&](uint32 colour, uint32 length) {
-    const uint32 index = palette.indexOf(colour);
+  forRuns(tile.pixels, tile.count(), [&](uint32 color, uint32 length) {
+    const uint32 index = palette.indexOf(color);
     writer.put(length == 1 ? index : index | kIsRun);
     if (length != 1) writer.putLength(length);
   });
@@ -143,21 +143,21 @@ void putZrleTile(const uint32* pixels, uint32 width, uint32 height, const PixelP
   constexpr uint32 kNever = ~0u;
   const Tile tile = {pixels, width, height};
   Survey survey = surveyOf(pixels, tile.count());
-  const uint32 colours = survey.palette.size();
-  const uint32 paletteBytes = colours * packing.bytes;
+  const uint32 colors = survey.palette.size();
+  const uint32 paletteBytes = colors * packing.bytes;
   const uint32 plain = tile.count() * packing.bytes;
   const uint32 plainRuns = (survey.singles + survey.runs) * (packing.bytes + 1) + survey.extraBytes;
   const uint32 paletteRuns =
       survey.fitsPalette ? paletteBytes + survey.singles + 2 * survey.runs + survey.extraBytes
                          : kNever;
-  const uint32 packed = survey.fitsPalette && colours <= kMostPackedColours
-                            ? paletteBytes + height * ((width * bitsOfIndex(colours) + 7) / 8)
+  const uint32 packed = survey.fitsPalette && colors <= kMostPackedColors
+                            ? paletteBytes + height * ((width * bitsOfIndex(colors) + 7) / 8)
                             : kNever;
   const uint32 least = std::min({plain, plainRuns, paletteRuns, packed});
   constexpr uint32 kBeyond = 3;
   const size_t before = out.size();
   Writer writer(out.extend(1 + size_t{least} + packing.bytes + kBeyond), packing);
-  if (survey.fitsPalette && colours == 1) {
+  if (survey.fitsPalette && colors == 1) {
     writer.put(kSolid);
     writer.putPixel(*pixels);
   } else if (packed == least) {

@@ -2,7 +2,7 @@
 //
 // YUV video frames to packed RGB.
 //
-// Each source layout says where a group's luma and chroma are, each packing (yuvColour-inl.h) what
+// Each source layout says where a group's luma and chroma are, each packing (yuvColor-inl.h) what
 // becomes of a colour; one loop runs all of them.
 
 #undef HWY_TARGET_INCLUDE
@@ -13,8 +13,8 @@
 
 #include "frame/frameBuffer.h"
 #include "video/rasterYuvInternal.h"
-#include "video/videoColour.h"
-#include "video/yuvColour-inl.h"
+#include "video/videoColor.h"
+#include "video/yuvColor-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -120,8 +120,8 @@ void convertRows(const Rows& rows, uint8* dst, size_t dstPitch, size_t groups) {
   for (size_t row = 0; row < Rows::kRows; ++row, dst += dstPitch) {
     for (size_t group = 0; group < groups; ++group) {
       const uint8 cb = rows.cb(group), cr = rows.cr(group);
-      const Rgb left = colourOf(rows.luma(2 * group, row), cb, cr, 128);
-      const Rgb right = colourOf(rows.luma(2 * group + 1, row), cb, cr, 128);
+      const Rgb left = colorOf(rows.luma(2 * group, row), cb, cr, 128);
+      const Rgb right = colorOf(rows.luma(2 * group + 1, row), cb, cr, 128);
       // A packed frame may be converted in place: the group has been read.
       uint8* const pixels = dst + 2 * group * P::kBytes;
       storePixel<P::kBytes>(pixels, P::pack(left.r, left.g, left.b));
@@ -137,7 +137,7 @@ template <class P, class Rows, class D>
 HWY_INLINE void convertBlock(D d, const Rows& rows, size_t group, uint8* dst, size_t dstPitch) {
   const auto chroma = chromaTerms(d, rows.chroma(P(), d, group));
   for (size_t row = 0; row < Rows::kRows; ++row)
-    P::store(d, colourSums(d, rows.luma(P(), d, group, row), chroma), dst + row * dstPitch);
+    P::store(d, colorSums(d, rows.luma(P(), d, group, row), chroma), dst + row * dstPitch);
 }
 
 /// Converts less than a block of 16 bytes: as such a block, from and to a copy.

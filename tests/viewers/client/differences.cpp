@@ -35,7 +35,7 @@ Screen pictureFrom(const std::string& path) {
     throw Broken(path + ": " + image.message);
   Screen screen = {static_cast<int>(image.width), static_cast<int>(image.height), {}};
   for (size_t i = 0; i + 2 < rgb.size(); i += 3)
-    screen.colours.push_back({rgb[i], rgb[i + 1], rgb[i + 2]});
+    screen.colors.push_back({rgb[i], rgb[i + 1], rgb[i + 2]});
   return screen;
 }
 
@@ -74,7 +74,7 @@ int compare(const std::vector<std::string>& arguments) {
   const Picture picture =
       shown(viewer[0] == ':' ? dumpOf(viewer) : pictureFrom(viewer), left, top, screen, used);
   const size_t different = differences(screen, picture, used);
-  printf("%zu of %zu pixels differ\n", different, screen.colours.size());
+  printf("%zu of %zu pixels differ\n", different, screen.colors.size());
   return different == 0 ? 0 : 1;
 }
 

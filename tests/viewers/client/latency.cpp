@@ -46,8 +46,8 @@ class Lamp {
   }
 
   void show(bool white) {
-    const uint32_t colour = white ? white_ : black_;
-    xcb_change_window_attributes(x_.get(), window_, XCB_CW_BACK_PIXEL, &colour);
+    const uint32_t color = white ? white_ : black_;
+    xcb_change_window_attributes(x_.get(), window_, XCB_CW_BACK_PIXEL, &color);
     xcb_clear_area(x_.get(), 0, window_, 0, 0, 0, 0);
     xcb_flush(x_.get());
   }
@@ -65,10 +65,10 @@ void pauseBefore(int turn) {
 }
 
 double millisecondsUntilSeen(viewers::Session& session, Lamp& lamp, bool white) {
-  const uint32_t colour = white ? 0xFFFFFF : 0;
+  const uint32_t color = white ? 0xFFFFFF : 0;
   const auto start = Clock::now();
   lamp.show(white);
-  while (session.picture().at(kLeft + kSide / 2, kTop + kSide / 2) != colour) {
+  while (session.picture().at(kLeft + kSide / 2, kTop + kSide / 2) != color) {
     if (session.readMessage()) session.request(true);
   }
   return std::chrono::duration<double, std::milli>(Clock::now() - start).count();

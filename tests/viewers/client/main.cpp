@@ -108,7 +108,7 @@ class Viewer {
 
   size_t differencesNow() {
     Screen screen = dumpOf(options_.display);
-    total_ = screen.colours.size();
+    total_ = screen.colors.size();
     const Pointer pointer = pointerOf(options_.display);
     if (options_.besidePointer)
       return differences(screen, session_.picture(), session_.format(), pointer.box());

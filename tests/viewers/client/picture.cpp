@@ -31,7 +31,7 @@ void Picture::copy(Box to, int fromX, int fromY) {
 }
 
 void Picture::convert(const PixelFormat& from, const PixelFormat& to) {
-  for (uint32_t& pixel : pixels_) pixel = to.pixel(from.colour(pixel));
+  for (uint32_t& pixel : pixels_) pixel = to.pixel(from.color(pixel));
 }
 
 void Picture::save(const std::string& path, const PixelFormat& format) const {
@@ -39,8 +39,8 @@ void Picture::save(const std::string& path, const PixelFormat& format) const {
   if (file == nullptr) throw Broken("cannot write " + path);
   fprintf(file, "P6\n%d %d\n255\n", width_, height_);
   for (const uint32_t pixel : pixels_) {
-    const Colour colour = format.colour(pixel);
-    for (const int value : {colour.red, colour.green, colour.blue}) putc(value, file);
+    const Color color = format.color(pixel);
+    for (const int value : {color.red, color.green, color.blue}) putc(value, file);
   }
   if (fclose(file) != 0) throw Broken("cannot write " + path);
 }

@@ -24,8 +24,8 @@ uint32_t PixelFormat::mask() const {
   return bits;
 }
 
-uint32_t PixelFormat::pixel(Colour colour) const {
-  const int values[3] = {colour.red, colour.green, colour.blue};
+uint32_t PixelFormat::pixel(Color color) const {
+  const int values[3] = {color.red, color.green, color.blue};
   uint32_t result = 0;
   for (int channel = 0; channel < 3; ++channel) {
     const int narrowed = values[channel] >> (8 - bitsOf(max[channel]));
@@ -34,7 +34,7 @@ uint32_t PixelFormat::pixel(Colour colour) const {
   return result;
 }
 
-Colour PixelFormat::colour(uint32_t pixel) const {
+Color PixelFormat::color(uint32_t pixel) const {
   std::array<int, 3> values;
   for (int channel = 0; channel < 3; ++channel) {
     const int value = static_cast<int>(pixel >> shift[channel]) & max[channel];

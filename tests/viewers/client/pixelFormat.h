@@ -12,7 +12,7 @@
 
 namespace viewers {
 
-struct Colour {
+struct Color {
   int red, green, blue;  // 0 to 255
 };
 
@@ -28,9 +28,9 @@ struct PixelFormat {
   /// The bits that carry colour.
   uint32_t mask() const;
   /// The pixel of a colour whose channels lose their low bits.
-  uint32_t pixel(Colour colour) const;
+  uint32_t pixel(Color color) const;
   /// The colour nearest to a pixel's.
-  Colour colour(uint32_t pixel) const;
+  Color color(uint32_t pixel) const;
   /// A pixel from `bytes()` bytes; bits without colour are cleared.
   uint32_t load(const uint8_t* from) const { return load(from, bytes()) & mask(); }
   /// As above from a given number of bytes, nothing cleared.

@@ -13,7 +13,7 @@
 namespace viewers {
 namespace {
 
-constexpr int kTrueColour = 4;
+constexpr int kTrueColor = 4;
 
 /// The words of a dump's header that are of interest, by their place.
 enum Word {
@@ -25,7 +25,7 @@ enum Word {
   kBytesPerLine = 12,
   kVisualClass = 13,
   kRedMask = 14,
-  kColours = 19,
+  kColors = 19,
   kWords = 25
 };
 
@@ -35,7 +35,7 @@ class Dump {
     if (bytes_.size() < 4 * kWords) throw Broken("xwd says nothing");
     for (size_t i = 0; i < kWords; ++i) words_[i] = number(4 * i, 4, true);
     palette_ = words_[kHeaderSize];
-    pixels_ = palette_ + kEntry * words_[kColours];
+    pixels_ = palette_ + kEntry * words_[kColors];
     const size_t size = static_cast<size_t>(words_[kBytesPerLine]) * words_[kHeight];
     if (bytes_.size() != pixels_ + size) throw Broken("xwd's dump is not whole");
   }
@@ -43,7 +43,7 @@ class Dump {
   Screen screen() const {
     Screen result = {static_cast<int>(words_[kWidth]), static_cast<int>(words_[kHeight]), {}};
     for (size_t y = 0; y < words_[kHeight]; ++y)
-      for (size_t x = 0; x < words_[kWidth]; ++x) result.colours.push_back(colour(pixel(x, y)));
+      for (size_t x = 0; x < words_[kWidth]; ++x) result.colors.push_back(color(pixel(x, y)));
     return result;
   }
 
@@ -62,14 +62,14 @@ class Dump {
     return number(pixels_ + y * words_[kBytesPerLine] + x * size, size, words_[kByteOrder] != 0);
   }
 
-  Colour colour(uint32_t pixel) const {
-    if (words_[kVisualClass] < kTrueColour) return entry(pixel);
+  Color color(uint32_t pixel) const {
+    if (words_[kVisualClass] < kTrueColor) return entry(pixel);
     return {channel(pixel, words_[kRedMask]), channel(pixel, words_[kRedMask + 1]),
             channel(pixel, words_[kRedMask + 2])};
   }
 
   /// The upper byte of each of a palette entry's three 16-bit values.
-  Colour entry(uint32_t index) const {
+  Color entry(uint32_t index) const {
     const size_t at = palette_ + index * kEntry;
     return {bytes_[at + 4], bytes_[at + 6], bytes_[at + 8]};
   }
@@ -110,7 +110,7 @@ bool isInside(Box box, int x, int y) {
   return x >= box.x && x < box.x + box.width && y >= box.y && y < box.y + box.height;
 }
 
-Colour colourOf(uint32_t argb) {
+Color colorOf(uint32_t argb) {
   return {static_cast<int>(argb >> 16 & 0xFF), static_cast<int>(argb >> 8 & 0xFF),
           static_cast<int>(argb & 0xFF)};
 }
@@ -129,8 +129,8 @@ void drawPointer(const Pointer& pointer, Screen& screen) {
     if (x < 0 || y < 0 || x >= screen.width || y >= screen.height) continue;
     const uint32_t word = image.pixels[static_cast<size_t>(i)];
     const int alpha = static_cast<int>(word >> 24);
-    const Colour over = colourOf(word);
-    Colour& under = screen.at(x, y);
+    const Color over = colorOf(word);
+    Color& under = screen.at(x, y);
     under = {blended(over.red, under.red, alpha), blended(over.green, under.green, alpha),
              blended(over.blue, under.blue, alpha)};
   }
@@ -139,12 +139,12 @@ void drawPointer(const Pointer& pointer, Screen& screen) {
 size_t differences(const Screen& screen, const Picture& picture, const PixelFormat& format,
                    Box without) {
   if (screen.width != picture.width() || screen.height != picture.height())
-    return screen.colours.size();
+    return screen.colors.size();
   size_t count = 0;
   for (int y = 0; y < screen.height; ++y)
     for (int x = 0; x < screen.width; ++x) {
-      const Colour colour = screen.colours[static_cast<size_t>(y * screen.width + x)];
-      if (picture.at(x, y) != format.pixel(colour) && !isInside(without, x, y)) ++count;
+      const Color color = screen.colors[static_cast<size_t>(y * screen.width + x)];
+      if (picture.at(x, y) != format.pixel(color) && !isInside(without, x, y)) ++count;
     }
   return count;
 }
@@ -159,7 +159,7 @@ size_t differences(const CursorImage& wanted, const CursorImage& got, const Pixe
     const uint32_t b = got.pixels[i];
     const bool halfShown = a >> 24 != 0 && a >> 24 != 255;
     if (halfShown && got.isMasked) continue;
-    if (a >> 24 != b >> 24 || format.pixel(colourOf(a)) != format.pixel(colourOf(b))) ++count;
+    if (a >> 24 != b >> 24 || format.pixel(colorOf(a)) != format.pixel(colorOf(b))) ++count;
   }
   return count;
 }

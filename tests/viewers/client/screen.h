@@ -16,9 +16,9 @@ namespace viewers {
 
 struct Screen {
   int width = 0, height = 0;
-  std::vector<Colour> colours;  // row by row
+  std::vector<Color> colors;  // row by row
 
-  Colour& at(int x, int y) { return colours[static_cast<size_t>(y * width + x)]; }
+  Color& at(int x, int y) { return colors[static_cast<size_t>(y * width + x)]; }
 };
 
 /// Runs xwd on the display's root window. Throws Broken.

@@ -7,7 +7,7 @@ namespace {
 
 constexpr unsigned kSetPixelFormat = 0, kSetEncodings = 2, kUpdateRequest = 3, kKey = 4,
                    kPointer = 5;
-constexpr int kUpdate = 0, kColours = 1, kBell = 2, kCutText = 3;
+constexpr int kUpdate = 0, kColors = 1, kBell = 2, kCutText = 3;
 constexpr unsigned kNoSecurity = 1;
 
 std::string textOf(const std::vector<uint8_t>& bytes) { return {bytes.begin(), bytes.end()}; }
@@ -102,7 +102,7 @@ bool Session::readMessage() {
   switch (kind) {
     case kUpdate:
       return readUpdate();
-    case kColours:
+    case kColors:
       throw Broken("colours of a palette that nobody asked for");
     case kBell:
       return false;
@@ -181,10 +181,10 @@ void Session::readCursor(Box box) {
     for (int x = 0; x < box.width; ++x) {
       const int byte = mask[static_cast<size_t>(y) * rowBytes + static_cast<size_t>(x) / 8];
       const bool shown = (byte & 0x80 >> x % 8) != 0;
-      const Colour colour = format_.colour(image.at(x, y));
-      const uint32_t word = 0xFF000000 | static_cast<uint32_t>(colour.red) << 16 |
-                            static_cast<uint32_t>(colour.green) << 8 |
-                            static_cast<uint32_t>(colour.blue);
+      const Color color = format_.color(image.at(x, y));
+      const uint32_t word = 0xFF000000 | static_cast<uint32_t>(color.red) << 16 |
+                            static_cast<uint32_t>(color.green) << 8 |
+                            static_cast<uint32_t>(color.blue);
       cursor.pixels.push_back(shown ? word : 0);
     }
   cursor_ = cursor;

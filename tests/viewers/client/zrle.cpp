@@ -71,11 +71,11 @@ class Tile {
 
 std::vector<uint32_t> readPalette(Unpacked& from, int count) {
   std::vector<uint32_t> palette(static_cast<size_t>(count));
-  for (uint32_t& colour : palette) colour = from.pixel();
+  for (uint32_t& color : palette) color = from.pixel();
   return palette;
 }
 
-uint32_t colourOf(const std::vector<uint32_t>& palette, int index) {
+uint32_t colorOf(const std::vector<uint32_t>& palette, int index) {
   if (index >= static_cast<int>(palette.size())) throw Broken("ZRLE: an index beyond the palette");
   return palette[static_cast<size_t>(index)];
 }
@@ -91,7 +91,7 @@ void readPackedPalette(Unpacked& from, Tile& tile, int count) {
       left = 8;
     }
     left -= bits;
-    tile.put(colourOf(palette, byte >> left & ((1 << bits) - 1)));
+    tile.put(colorOf(palette, byte >> left & ((1 << bits) - 1)));
   }
 }
 
@@ -99,7 +99,7 @@ void readPaletteRuns(Unpacked& from, Tile& tile, int count) {
   const std::vector<uint32_t> palette = readPalette(from, count);
   while (!tile.full()) {
     const int index = from.byte();
-    tile.put(colourOf(palette, index & 0x7F), index >= 128 ? from.length() : 1);
+    tile.put(colorOf(palette, index & 0x7F), index >= 128 ? from.length() : 1);
   }
 }
 

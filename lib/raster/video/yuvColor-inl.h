@@ -12,11 +12,11 @@
 // whose chroma factor is a multiple of 4, is one with 6. Sums that leave the lane saturate beyond
 // the limits of a byte.
 
-#if defined(RASTER_YUV_COLOUR_INL_H) == defined(HWY_TARGET_TOGGLE)
-#ifdef RASTER_YUV_COLOUR_INL_H
-#undef RASTER_YUV_COLOUR_INL_H
+#if defined(RASTER_YUV_COLOR_INL_H) == defined(HWY_TARGET_TOGGLE)
+#ifdef RASTER_YUV_COLOR_INL_H
+#undef RASTER_YUV_COLOR_INL_H
 #else
-#define RASTER_YUV_COLOUR_INL_H
+#define RASTER_YUV_COLOR_INL_H
 #endif
 
 #include "vector/fields-inl.h"
@@ -78,7 +78,7 @@ template <class D> HWY_INLINE ChromaTerms<D> chromaTerms(D d, Chroma<D> chroma) 
 }
 
 template <class D>
-HWY_INLINE Sums<D> colourSums(D d, Unsigned16<D> luma, const ChromaTerms<D>& chroma) {
+HWY_INLINE Sums<D> colorSums(D d, Unsigned16<D> luma, const ChromaTerms<D>& chroma) {
   const auto y = hn::Add(hn::Mul(hn::BitCast(d, luma), hn::Set(d, int16{149})),
                          hn::Set(d, static_cast<int16>(64 - 149 * 16 - kBias)));
   return {hn::SaturatedAdd(y, chroma.r), hn::SaturatedAdd(y, chroma.g),

@@ -2,8 +2,8 @@
 //
 // The colour equation of video for a single pixel.
 
-#ifndef RASTER_VIDEO_COLOUR_H
-#define RASTER_VIDEO_COLOUR_H
+#ifndef RASTER_VIDEO_COLOR_H
+#define RASTER_VIDEO_COLOR_H
 
 #include "baseTypes.h"
 
@@ -17,7 +17,7 @@ struct Rgb {
 constexpr uint32 limitToByte(int32 v) { return static_cast<uint32>(v < 0 ? 0 : v > 255 ? 255 : v); }
 
 /// BT.601 with limited range, in 8 bits of fraction; `rounding` is added before they are dropped.
-constexpr Rgb colourOf(int32 y, int32 cb, int32 cr, int32 rounding) {
+constexpr Rgb colorOf(int32 y, int32 cb, int32 cr, int32 rounding) {
   const int32 luma = 298 * (y - 16) + rounding;
   return {limitToByte((luma + 409 * (cr - 128)) >> 8),
           limitToByte((luma - 100 * (cb - 128) - 208 * (cr - 128)) >> 8),
