@@ -170,6 +170,30 @@ void expectRow(const Bytes& before, const Bytes& source, const BlendFormat& f, c
   }
 }
 
+/// Pixels in runs that are clear, or of noise.
+Bytes spriteRow(Random& random, size_t width) {
+  Bytes row = random.bytes(width * 4);
+  for (size_t x = 0; x < width;) {
+    const size_t end = std::min<size_t>(width, x + 1 + random.below(48));
+    if (random.below(2) == 0) std::fill_n(&row[4 * x], 4 * (end - x), uint8{0});
+    x = end;
+  }
+  return row;
+}
+
+TEST(Raster_AlphaBlend, EqualsTheModelUnderClearRuns) {
+  Random random(17);
+  for (int round = 0; round < tests::rounds(40); ++round) {
+    for (const BlendFormat& f : kBlendFormats) {
+      for (uint32 op = 0; op < kBlendOperators; ++op) {
+        const size_t width = 1 + random.below(200);
+        expectRow(random.bytes(width * f.bytes), spriteRow(random, width), f,
+                  {op, random.below(4), 200, 90});
+      }
+    }
+  }
+}
+
 TEST(Raster_AlphaBlend, EqualsTheModelAndTouchesNothingElse) {
   Random random(1);
   for (int round = 0; round < tests::rounds(6000); ++round) {

@@ -129,19 +129,22 @@ struct WholeBytes {
 
 #if HWY_TARGET == HWY_SCALAR
 
-/// Pixels of kPixel bytes, of which three are read and written.
-template <size_t kPixel> struct ThreeOf : WholeBytes {
-  static constexpr size_t kBytes = kPixel;
+/// Pixels in words of their own.
+struct PixelWord : WholeBytes {
+  static constexpr size_t kBytes = 4;
   static constexpr bool kKeepsBytes = false;
 
   static HWY_INLINE Bytes<Lanes> load(const uint8* at, WholeBlock /*part*/) {
-    return {hn::Set(Lanes(), loadPixel<3>(at))};
+    return {hn::Set(Lanes(), loadPixel<4>(at))};
   }
   template <class P, class Before>
   static HWY_INLINE void store(P p, Before /*before*/, uint8* at, WholeBlock /*part*/) {
-    storePixel<3>(at, hn::GetLane(bytesOf(p).v));
+    storePixel<4>(at, hn::GetLane(bytesOf(p).v));
   }
 };
+
+/// Pixels of kPixel bytes, of which three are read and written, as words (blendThrees).
+template <size_t kPixel> struct ThreeOf { static constexpr size_t kBytes = kPixel; };
 using Bytes3 = ThreeOf<3>;
 using Bytes4 = ThreeOf<4>;
 

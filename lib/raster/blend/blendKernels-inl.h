@@ -73,6 +73,10 @@ HWY_INLINE auto constantFactor(uint8 value, Opaque opaque) {
 template <class Format> HWY_INLINE auto pixelsOf(Nothing /*zero*/) { return Format::black(); }
 template <class Format, class P> HWY_INLINE P pixelsOf(P p) { return p; }
 
+/// Whether the destination's pixels may lie apart from where the results go. Portable kernels find
+/// them there: told that they are the same memory, the compiler vectorises the loop.
+inline constexpr bool kReadsApart = HWY_TARGET != HWY_SCALAR;
+
 /// Where a block of pixels goes, where the destination's pixels are, and the source's.
 struct Block {
   uint8* dst;
@@ -148,28 +152,98 @@ HWY_INLINE void blendEnd(const BlendRect& /*rect*/, Block /*at*/, size_t /*pixel
 
 #endif
 
+/// How many source pixels are looked at at once, whether they are all clear: sprites are clear in
+/// runs, so it is a cache line.
+constexpr size_t kRun = 16;
+
+/// Whether to look: where they are, the destination is neither read nor written. Sums without a
+/// product take no longer than to look, and with AVX-512 nothing does.
+template <auto kOperator, uint32 kFlags>
+constexpr bool kLooksForClear =
+    kClearKeeps<kOperator, kFlags>&& kUsesSrcAlpha<kOperator, kFlags>&& HWY_TARGET != HWY_AVX3;
+
+/// Whether a run of source pixels is 0 in all bytes. Most of those that are not are known by their
+/// first pixel.
+HWY_INLINE bool isClear(const uint8* src) {
+  if (loadPixel<4>(src) != 0) return false;
+  const hn::ScalableTag<uint32> d;
+  auto all = loadLanes(d, src);
+  for (size_t i = kLanes<decltype(d)>; i < kRun; i += kLanes<decltype(d)>)
+    all = hn::Or(all, loadLanes(d, src + 4 * i));
+  return hn::AllTrue(d, hn::Eq(all, hn::Zero(d)));
+}
+
+/// Blends the `whole` pixels of a row, a multiple of a block.
+template <class Format, auto kOperator, uint32 kFlags>
+HWY_INLINE void blendBlocks(const BlendRect& rect, const Block& row, size_t whole) {
+  constexpr size_t kBlock = kLanes<typename Format::Lanes>;
+  size_t x = 0;
+  if constexpr (Format::kKeepsBytes && kLooksForClear<kOperator, kFlags>) {
+    // What is blended from elsewhere is to be stored in any case.
+    while (row.before == row.dst && whole - x >= kRun) {
+      const size_t end = x + kRun;
+      if (isClear(row.src + 4 * x)) x = end;
+      for (; x != end; x += kBlock)
+        blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());
+    }
+  }
+  for (; x != whole; x += kBlock)
+    blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());
+}
+
 template <class Format, auto kOperator, uint32 kFlags> void blendRect(const BlendRect& call) {
   const BlendRect rect = call;  // a local that no store to pixels can change
-  Block row{rect.dst, rect.before, rect.src};
+  Block row{rect.dst, kReadsApart ? rect.before : rect.dst, rect.src};
   constexpr size_t kBlock = kLanes<typename Format::Lanes>;
   const size_t whole = (rect.width - (Format::kKeepsBytes ? 1 : 0)) / kBlock * kBlock;
   for (uint32 y = 0; y < rect.height; ++y) {
-    for (size_t x = 0; x != whole; x += kBlock)
-      blendBlock<Format, kOperator, kFlags>(rect, row.pixel<Format>(x), WholeBlock());
+    blendBlocks<Format, kOperator, kFlags>(rect, row, whole);
     if (whole != rect.width)
       blendEnd<Format, kOperator, kFlags>(rect, row.pixel<Format>(whole), rect.width - whole);
     // The steps come from memory: 32-bit x86 has no registers left for them.
-    row = {nextRow(row.dst, call.dstStep), nextRow(row.before, call.beforeStep),
+    uint8* const dst = nextRow(row.dst, call.dstStep);
+    row = {dst, kReadsApart ? nextRow(row.before, call.beforeStep) : dst,
            nextRow(row.src, call.srcStep)};
   }
 }
 
-/// The flags that make a difference to an operator. One pixel at a time, the constants are always
-/// applied (255 where there is none), for the size of the code.
+#if HWY_TARGET == HWY_SCALAR
+
+/// Blends some pixels, at most a run, of which three bytes are read and written. They go by way of
+/// words: the compiler vectorises the loop over these.
+template <class Format, auto kOperator, uint32 kFlags>
+HWY_INLINE void blendThrees(const BlendRect& rect, uint8* dst, const uint8* src, size_t pixels) {
+  uint8 words[4 * kRun] = {};
+  if constexpr ((kInputs<kOperator, kFlags> & kUsesDestination) != 0) {
+    for (size_t i = 0; i < pixels; ++i)
+      storePixel<4>(words + 4 * i, loadPixel<3>(dst + Format::kBytes * i));
+  }
+  blendBlocks<PixelWord, kOperator, kFlags>(rect, {words, words, src}, pixels);
+  for (size_t i = 0; i < pixels; ++i)
+    storePixel<3>(dst + Format::kBytes * i, loadPixel<4>(words + 4 * i));
+}
+
+template <class Format, auto kOperator, uint32 kFlags>
+void blendRectOfThrees(const BlendRect& call) {
+  const BlendRect rect = call;
+  for (uint32 y = 0; y < rect.height; ++y) {
+    uint8* dst = rowAt(rect.dst, rect.dstStep, y, 0, 0);
+    const uint8* src = rowAt(rect.src, rect.srcStep, y, 0, 0);
+    size_t x = 0;
+    for (; rect.width - x >= kRun; x += kRun, dst += kRun * Format::kBytes, src += kRun * 4) {
+      if (!kLooksForClear<kOperator, kFlags> || !isClear(src))
+        blendThrees<Format, kOperator, kFlags>(rect, dst, src, kRun);
+    }
+    if (x != rect.width) blendThrees<Format, kOperator, kFlags>(rect, dst, src, rect.width - x);
+  }
+}
+
+#endif
+
+/// The flags that make a difference to an operator.
 template <auto kOperator> constexpr uint32 effective(uint32 flags) {
   constexpr uint32 kInputsWith = kInputs<kOperator, RASTER_BLEND_USE_DST_ALPHA>;
   constexpr uint32 kInputsWithout = kInputs<kOperator, 0>;
-  if (HWY_TARGET == HWY_SCALAR) flags = RASTER_BLEND_USE_SRC_ALPHA | RASTER_BLEND_USE_DST_ALPHA;
   if ((kInputsWith & (kUsesDestination | kUsesDstAlpha)) == 0) flags &= ~RASTER_BLEND_USE_DST_ALPHA;
   const uint32 inputs = (flags & RASTER_BLEND_USE_DST_ALPHA) != 0 ? kInputsWith : kInputsWithout;
   if ((inputs & kUsesSource) == 0) flags &= ~RASTER_BLEND_USE_SRC_ALPHA;
@@ -177,9 +251,13 @@ template <auto kOperator> constexpr uint32 effective(uint32 flags) {
 }
 
 template <class Format, auto kOperator, uint32 kFlags>
-constexpr BlendKernel kKernel = {
-    blendRect<Format, kOperator, kFlags>,
-    HWY_TARGET != HWY_SCALAR&& kReadsDestination<Format, kOperator, kFlags>};
+constexpr BlendKernel kKernel = {blendRect<Format, kOperator, kFlags>,
+                                 kReadsApart&& kReadsDestination<Format, kOperator, kFlags>};
+#if HWY_TARGET == HWY_SCALAR
+template <size_t kPixel, auto kOperator, uint32 kFlags>
+constexpr BlendKernel kKernel<ThreeOf<kPixel>, kOperator, kFlags> = {
+    blendRectOfThrees<ThreeOf<kPixel>, kOperator, kFlags>, false};
+#endif
 
 /// The kernel of an operator onto a format: operators of the same formula share it.
 template <class Format, size_t kOp, uint32 kFlags> constexpr const BlendKernel& kernelOf() {

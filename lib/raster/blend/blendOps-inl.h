@@ -74,6 +74,30 @@ constexpr auto kFormula = [] {
 template <auto kOperator, uint32 kFlags>
 constexpr uint32 kInputs = inputsOf(kFormula<kOperator, kFlags>);
 
+/// What an operator makes of clear source pixels, whose factor is `sa`.
+template <auto kOperator, uint32 kFlags, class SourceAlpha> constexpr auto ofClear(SourceAlpha sa) {
+  constexpr bool kConstant = (kFlags & RASTER_BLEND_USE_DST_ALPHA) != 0;
+  struct {
+    Nothing nothing;
+    Nothing s;
+    SourceAlpha sa;
+    Letter<'d', kUsesDestination> d;
+    std::conditional_t<kConstant, Letter<'A', kUsesDstAlpha>, One> da;
+    std::conditional_t<kConstant, Letter<'f', kUsesDstAlpha>, Zero> f;
+  } c{{}, {}, sa, {}, {}, {}};
+  return kOperator(c);
+}
+
+/// Whether source pixels that are 0 in all bytes leave the destination as it is, and whether the
+/// destination is multiplied by something of the source.
+template <auto kOperator, uint32 kFlags>
+constexpr bool kClearKeeps =
+    (kFlags & RASTER_BLEND_USE_DST_ALPHA) == 0 &&
+    std::is_same_v<decltype(ofClear<kOperator, kFlags>(Zero())), Letter<'d', kUsesDestination>>;
+template <auto kOperator, uint32 kFlags>
+constexpr bool kUsesSrcAlpha = (inputsOf(ofClear<kOperator, kFlags>(Letter<'a', kUsesSource>())) &
+                                kUsesSource) != 0;
+
 /// The number of the first operator that has the same formula.
 template <uint32 kFlags, size_t kOp, size_t kFirst = 0> constexpr size_t firstLike() {
   if constexpr (std::is_same_v<decltype(kFormula<std::get<kFirst>(kOperators), kFlags>),
