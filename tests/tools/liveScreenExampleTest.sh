@@ -7,6 +7,7 @@ done
 
 # watch UPDATES: starts the program and waits for its first update.
 watch() {
+  rm -f out # of an earlier one
   "$LIVE_SCREEN" "$1" >out 2>err &
   watching=$!
   for _ in $(seq 300); do
@@ -37,8 +38,11 @@ ended 0 update: '  640x480 at 0,0' update:
 # Of a window, the window.
 watch 2
 xlogo -geometry 64x32+32+64 -borderwidth 0 -fg '#c0a040' -bg '#c0a040' &
+logo=$!
 ended 0 update: '  640x480 at 0,0' update: '  64x32 at 32,64'
-kill $!
+kill $logo
+wait $logo 2>/dev/null
+xsetroot -solid '#204060' # when it has been served, the window is gone
 
 watch 1000000
 stopServer
