@@ -206,6 +206,45 @@ HWY_INLINE void storeBlock(D d, const Block<D>& block, uint8* at) {
   }
 }
 
+// ---- Four pixels -------------------------------------------------------------------------------
+
+/// For rows that are shorter than any block.
+using Quad = hn::CappedTag<uint32, 4>;
+
+/// Four pixels in 32-bit lanes; the bits above the pixel's are 0.
+template <unsigned kBytes> HWY_INLINE hn::Vec<Quad> loadQuad(const uint8* at) {
+  const Quad d;
+  static_assert(kBytes >= 2 && kBytes <= 4, "no source has pixels of another size");
+  if constexpr (kBytes == 4) {
+    return loadLanes(d, at);
+  } else if constexpr (kBytes == 3) {
+    const auto words = hn::ZeroExtendVector(d, loadLanes(hn::Half<Quad>(), at));
+    const auto last = hn::ZeroExtendVector(
+        d, hn::ZeroExtendVector(hn::Half<Quad>(), loadLanes(hn::CappedTag<uint32, 1>(), at + 8)));
+    return spreadTriples(d, hn::Or(words, hn::ShiftLeftBytes<8>(d, last)));
+  } else {
+    return hn::PromoteTo(d, loadLanes(hn::Rebind<uint16, Quad>(), at));
+  }
+}
+
+/// Stores the low bytes of four lanes; of pixels that are narrower than three bytes the rest is 0.
+template <unsigned kBytes> HWY_INLINE void storeQuad(hn::Vec<Quad> pixels, uint8* at) {
+  const Quad d;
+  if constexpr (kBytes == 4) {
+    storeLanes(d, pixels, at);
+  } else if constexpr (kBytes == 3) {
+    const auto packed = gatherTriples(d, pixels);
+    storeLanes(hn::Half<Quad>(), hn::LowerHalf(packed), at);
+    storePixel<4>(at + 8, hn::ExtractLane(packed, 2));
+  } else if constexpr (kBytes == 2) {
+    const hn::Rebind<uint16, Quad> dNarrow;
+    storeLanes(dNarrow, hn::TruncateTo(dNarrow, pixels), at);
+  } else {
+    storePixel<4>(at, hn::GetLane(hn::BitCast(hn::CappedTag<uint32, 1>(),
+                                              hn::TruncateTo(hn::Rebind<uint8, Quad>(), pixels))));
+  }
+}
+
 }  // namespace raster::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
 

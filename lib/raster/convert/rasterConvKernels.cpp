@@ -74,31 +74,44 @@ template <class From, class To> void convertRows(const RowPair& rows, const uint
 
 #else
 
-/// The palette's entries for a block of indices. They are loaded one by one, which takes no longer
-/// than the instructions that gather them.
-template <class D> HWY_INLINE Block<D> loadEntries(D d, const uint8* src, const uint8* palette) {
-  static_assert(kLanes<D> == 4);
+/// The palette's entries for four indices. They are loaded one by one, which takes no longer than
+/// the instructions that gather them.
+HWY_INLINE hn::Vec<Quad> loadEntries(const uint8* src, const uint8* palette) {
+  const Quad d;
   const auto entry = [&](uint32 index) HWY_ATTR {
-    return hn::Vec<D>{loadLanes(hn::CappedTag<uint32, 1>(), entryAt(palette, index & 0xFF)).raw};
+    return hn::Vec<Quad>{loadLanes(hn::CappedTag<uint32, 1>(), entryAt(palette, index & 0xFF)).raw};
   };
-  Block<D> block;
-  for (auto& lanes : block.v) {
-    const uint32 indices = loadPixel<4>(src);
-    const auto low = hn::InterleaveLower(d, entry(indices), entry(indices >> 8));
-    const auto high = hn::InterleaveLower(d, entry(indices >> 16), entry(indices >> 24));
-    lanes = hn::ConcatLowerLower(d, high, low);
-    src += 4;
+  const uint32 indices = loadPixel<4>(src);
+  const auto low = hn::InterleaveLower(d, entry(indices), entry(indices >> 8));
+  const auto high = hn::InterleaveLower(d, entry(indices >> 16), entry(indices >> 24));
+  return hn::ConcatLowerLower(d, high, low);
+}
+
+/// Loads four pixels in the format To.
+template <class From, class To>
+HWY_INLINE hn::Vec<Quad> loadConvertedQuad(const uint8* src,
+                                           [[maybe_unused]] const uint8* palette) {
+  const Quad d;
+  if constexpr (std::is_same_v<From, Palette>) {
+    const auto colors = loadEntries(src, palette);
+    if constexpr (kSameFields<Code32, To>) return colors;
+    return convertLanes<Code32, To>(d, colors);
+  } else {
+    auto pixels = loadQuad<From::kBytes>(src);
+    if constexpr (!kSameFields<From, To>) pixels = convertLanes<From, To>(d, pixels);
+    if constexpr (kOpaque<To> != 0) pixels = hn::Or(pixels, hn::Set(d, kOpaque<To>));
+    return pixels;
   }
-  return block;
 }
 
 /// Loads a block in the format To.
 template <class From, class To, class D>
 HWY_INLINE Block<D> loadConvertedBlock(D d, const uint8* src, const uint8* palette) {
   if constexpr (std::is_same_v<From, Palette>) {
-    Block<D> block = loadEntries(d, src, palette);
-    if constexpr (!kSameFields<Code32, To>) {
-      for (auto& lanes : block.v) lanes = convertLanes<Code32, To>(d, lanes);
+    Block<D> block;
+    for (auto& lanes : block.v) {
+      lanes = loadConvertedQuad<Palette, To>(src, palette);
+      src += 4;
     }
     return block;
   } else if constexpr (From::kBytes == 2 && To::kBytes >= 3) {
@@ -119,6 +132,23 @@ HWY_INLINE void convertBlock(D d, uint8* dst, const uint8* src, const uint8* pal
   storeBlock<To::kBytes, kStreams>(d, loadConvertedBlock<From, To>(d, src, palette), dst);
 }
 
+/// Rows that are shorter than any block: four pixels after four; the last four end with the row and
+/// may do some pixels again.
+template <class From, class To> void convertRowsByQuads(const RowPair& rows, const uint8* palette) {
+  constexpr size_t kPixels = kLanes<Quad>;
+  const size_t pixels = rows.bytes / To::kBytes;
+  if (pixels < kPixels) return convertRowsPlainly<From, To>(rows, palette);
+  const size_t last = pixels - kPixels;
+  const auto convertQuad = [palette](uint8* dst, const uint8* src, size_t x) HWY_ATTR {
+    storeQuad<To::kBytes>(loadConvertedQuad<From, To>(src + x * From::kBytes, palette),
+                          dst + x * To::kBytes);
+  };
+  forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
+    for (size_t x = 0; x < last; x += kPixels) convertQuad(dst, src, x);
+    convertQuad(dst, src, last);
+  });
+}
+
 /// Block after block; the last one ends with the row and may do some pixels again. Rows that are
 /// shorter than a block take smaller ones.
 template <class From, class To, class D>
@@ -129,7 +159,7 @@ void convertRowsByBlocks(D d, const RowPair& rows, const uint8* palette) {
     if constexpr (kPixels > 16) {
       convertRowsByBlocks<From, To>(hn::Half<D>(), rows, palette);
     } else {
-      convertRowsPlainly<From, To>(rows, palette);
+      convertRowsByQuads<From, To>(rows, palette);
     }
     return;
   }
