@@ -192,9 +192,14 @@ void drawWidePixels(const ScaleJob& job) {
 }
 
 /// Nearest sampling of 4-byte pixels that are written where they belong at once.
+template <class Sampler> void drawNearestWith(const ScaleJob& job) {
+  ScaleMemory memory(Sampler::memoryFor(job));
+  Sampler(job, memory).draw();
+}
 void drawNearest(const ScaleJob& job) {
-  ScaleMemory memory(Nearest::memoryFor(job));
-  Nearest(job, memory).draw();
+  constexpr size_t kFewPixels = 32;
+  const bool few = size_t{job.width} * job.height <= kFewPixels;
+  few ? drawNearestWith<PlainNearest>(job) : drawNearestWith<Nearest>(job);
 }
 
 /// Everything else: source rows are resampled and kept, and made into destination rows.
