@@ -571,12 +571,13 @@ enum {
 ///
 /// Operators 0 and 2 read no source, and in place 0, 1, 5 and 7 no destination.
 ///
-/// Byte 3 of 4-byte pixels is neither read nor written with AVX-512 (level avx3), nor in place by
-/// the portable code (scalar). The levels between, ssse3, sse4 and avx2, have no masks for bytes:
-/// within a row they read it and write it back with its value, whatever the operator, and so does
-/// the staged variant of the portable code. No other thread may store there during the call. Byte 3
-/// of a row's last pixel is left out at every level, so that a buffer may end before it; where
-/// neither buffer has gaps between its rows, all rows count as one.
+/// Byte 3 of 4-byte pixels is not written with AVX-512 (level avx3), though it may be read with the
+/// others, and neither read nor written in place by the portable code (scalar). The levels between,
+/// ssse3, sse4 and avx2, have no masks for bytes: within a row they read it and write it back with
+/// its value, whatever the operator, and so does the staged variant of the portable code. No other
+/// thread may store there during the call. Byte 3 of a row's last pixel is left out at every level,
+/// so that a buffer may end before it; where neither buffer has gaps between its rows, all rows
+/// count as one.
 ///
 /// Deliberate:
 /// - Operator 11 is computed as operator 10.

@@ -153,7 +153,7 @@ using Bytes4 = ThreeOf<4>;
 /// Pixels of four bytes, of which the fourth one keeps its value.
 struct Bytes4 : WholeBytes {
   static constexpr size_t kBytes = 4;
-  static constexpr bool kKeepsBytes = !kMasksColors;
+  static constexpr bool kKeepsBytes = true;
 
   template <class Part> static HWY_INLINE Bytes<Lanes> load(const uint8* at, Part part) {
     return {loadColors(Lanes(), at, part)};

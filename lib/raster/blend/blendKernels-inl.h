@@ -89,7 +89,7 @@ struct Block {
 };
 
 template <class Format, auto kOperator, uint32 kFlags>
-constexpr bool kReadsDestination = Format::kKeepsBytes ||
+constexpr bool kReadsDestination = (Format::kKeepsBytes && !kMasksColors) ||
                                    (kInputs<kOperator, kFlags> & kUsesDestination) != 0;
 
 /// Blends a block of pixels, or the first of one, reading only what the operator needs.
@@ -112,6 +112,10 @@ HWY_INLINE void blendBlock(const BlendRect& rect, Block at, Part part) {
 
 template <class Format, auto kOperator, uint32 kFlags>
 HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
+  if constexpr (Format::kKeepsBytes) {
+    if (pixels == kLanes<typename Format::Lanes>)
+      return blendBlock<Format, kOperator, kFlags>(rect, at, AllButLastByte());
+  }
   blendBlock<Format, kOperator, kFlags>(rect, at, FirstPixels{pixels});
 }
 

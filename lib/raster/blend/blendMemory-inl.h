@@ -71,14 +71,22 @@ HWY_INLINE void storePart(D d, hn::Vec<D> lanes, uint8* block, FirstPixels part)
 /// A whole block whose last byte is not in the rectangle.
 struct AllButLastByte {};
 
-/// Whether loadColors and storeColors leave out byte 3 of every pixel. Where they do not, it takes
-/// part in a load, for a store to write it back; that of a row's last pixel is left out by
-/// AllButLastByte.
+/// Whether storeColors leaves out byte 3 of every pixel. Where it does not, it writes back what
+/// loadColors has read. That of a row's last pixel is neither read nor written: AllButLastByte.
 inline constexpr bool kMasksColors = HWY_TARGET == HWY_AVX3;
+
+#if HWY_TARGET != HWY_SCALAR
+
+// Not by a mask: from memory that is far a masked load takes several times as long.
+template <class D> HWY_INLINE hn::Vec<D> loadColors(D d, const uint8* block, WholeBlock part) {
+  return loadPart<4>(d, block, 0, part);
+}
+
+#endif
 
 #if HWY_TARGET == HWY_AVX3
 
-template <class D> HWY_INLINE auto colorMask(D d, WholeBlock /*part*/) {
+template <class D, class Part> HWY_INLINE auto colorMask(D d, Part /*whole*/) {
   const hn::Repartition<uint8, D> d8;
   return hn::MaskFromVec(hn::BitCast(d8, hn::Set(d, 0x00FFFFFFu)));
 }
@@ -102,9 +110,6 @@ HWY_INLINE void storeColors(D d, hn::Vec<D> pixels, hn::Vec<D> /*before*/, uint8
 
 #elif HWY_TARGET != HWY_SCALAR
 
-template <class D> HWY_INLINE hn::Vec<D> loadColors(D d, const uint8* block, WholeBlock part) {
-  return loadPart<4>(d, block, 0, part);
-}
 template <class D>
 HWY_INLINE void storeColors(D d, hn::Vec<D> pixels, hn::Vec<D> before, uint8* block,
                             WholeBlock part) {

@@ -59,13 +59,16 @@ void copyRowOfColors(uint8* to, const uint8* from, size_t pixels) {
 
 HWY_INLINE void copyRowOfColors(uint8* to, const uint8* from, size_t pixels) {
   const hn::ScalableTag<uint32> d;
+  constexpr size_t kBlock = kLanes<decltype(d)>;
   const auto copy = [&](size_t x, auto part) HWY_ATTR {
     const auto colors = loadColors(d, from + x * 4, part);
     storeColors(d, colors, colors, to + x * 4, part);
   };
   size_t x = 0;
-  for (; pixels - x >= kLanes<decltype(d)>; x += kLanes<decltype(d)>) copy(x, WholeBlock());
-  if (x != pixels) copy(x, FirstPixels{pixels - x});
+  for (; pixels - x > kBlock; x += kBlock) copy(x, WholeBlock());
+  // The end goes by the masks of blendEnd: other loads would have to wait for its stores.
+  if (pixels - x == kBlock) return copy(x, AllButLastByte());
+  copy(x, FirstPixels{pixels - x});
 }
 
 #else
