@@ -85,6 +85,46 @@ TEST(FarRectangles, AreFilled) {
   }
 }
 
+// Beyond the inner caches, where runs are left to the processor's string instructions.
+TEST(FarRectangles, AreFilledFromAnyAddress) {
+  Random random(11);
+  for (const uint32 bytesPerPixel : {1u, 2u, 4u}) {
+    for (const bool hasGaps : {false, true}) {
+      for (size_t base = 0; base < 5; ++base) {
+        const uint32 width = 2051 + random.below(4);
+        const uint32 pitch = (width + (hasGaps ? 4 : 0)) * bytesPerPixel;
+        const uint32 height = (1u << 20) / (width * bytesPerPixel) + 1;
+        const uint32 pixel = random.word();
+        Bytes expected(base + size_t{pitch} * (height - 1) + size_t{width} * bytesPerPixel, 0x5A);
+        GuardedBuffer actual(expected.size());
+        actual.assign(expected);
+        reference::rectFill(expected, base, pitch, bytesPerPixel, pixel, 0, 0, width, height);
+        Raster_RectFill(actual.data() + base, pitch, bytesPerPixel, pixel, 0, 0, width, height);
+        ASSERT_TRUE(areEqual(actual, expected))
+            << base << " + " << width << " pixels of " << bytesPerPixel << ", pitch " << pitch;
+      }
+    }
+  }
+}
+
+TEST(FarRectangles, AreCopiedBetweenAnyAddresses) {
+  Random random(12);
+  for (const size_t from : {0u, 1u, 31u}) {
+    for (const size_t to : {0u, 3u, 32u}) {
+      const uint32 width = (1u << 20) + random.below(100);
+      const Bytes source = noise(random, from + width);
+      Bytes expected(to + width, 0x5A);
+      GuardedBuffer actual(expected.size());
+      actual.assign(expected);
+      std::copy_n(source.begin() + static_cast<ptrdiff_t>(from), width,
+                  expected.begin() + static_cast<ptrdiff_t>(to));
+      Raster_RectCopy(actual.data() + to, width, source.data() + from, width, 1, 0, 0, 0, 0, width,
+                      1);
+      ASSERT_TRUE(areEqual(actual, expected)) << width << " bytes from " << from << " to " << to;
+    }
+  }
+}
+
 TEST(FarRectangles, AreCopied) {
   Random random(2);
   for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {

@@ -11,6 +11,7 @@
 #include "vector/byteRows-inl.h"
 #include "vector/pixelPattern-inl.h"
 #include "ops/rasteropsInternal.h"
+#include "vector/longRuns.h"
 #include "vector/rows-inl.h"
 #include "vector/streams-inl.h"
 
@@ -115,11 +116,22 @@ HWY_NOINLINE void fillFarRows(const Rows& rows, const PixelWords& pixels) {
   endStreams();
 }
 
+HWY_NOINLINE void fillLongRuns(const Rows& rows, uint32 word) {
+  const size_t bytes = rows.bytes;
+  forRows(rows, [=](uint8* row) { storeLongRun(row, word, bytes); });
+}
+
+/// The shortest row that is filled or copied as a long run.
+constexpr size_t kMinFilledRun = 2048;
+constexpr size_t kMinCopiedRun = 256 * 1024;
+
 void fillRows(const Rows& rows, const PixelWords& pixels) {
-  if (isStreamed(rows.bytes, rows.bytes, rows.rows)) return fillFarRows(rows, pixels);
   const uint32* const word = pixels.word;
-  if (word[0] != word[1] || word[1] != word[2]) return fillWithPattern(rows, pixels);
-  fillWithWord(rows, word[0]);
+  const bool isWord = word[0] == word[1] && word[1] == word[2];
+  if (isWord && areLongRuns(rows.bytes, rows.rows, kMinFilledRun))
+    return fillLongRuns(rows, word[0]);
+  if (isStreamed(rows.bytes, rows.bytes, rows.rows)) return fillFarRows(rows, pixels);
+  isWord ? fillWithWord(rows, word[0]) : fillWithPattern(rows, pixels);
 }
 
 /// The lanes of the source.
@@ -148,6 +160,9 @@ bool areApart(const RowPair& rows) {
 
 HWY_NOINLINE void copyLongRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
+  if (areLongRuns(bytes, rows.rows, kMinCopiedRun) && areApart(rows)) {
+    return forRows(rows, [=](uint8* dst, const uint8* src) { copyLongRun(dst, src, bytes); });
+  }
   if (isStreamed(bytes, 2 * bytes, rows.rows) && areApart(rows)) {
     forRows(rows, [&](uint8* dst, const uint8* src)
                       HWY_ATTR { streamLongRow(dst, src, bytes, kCopied); });
