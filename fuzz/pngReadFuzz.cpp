@@ -3,6 +3,7 @@
 // PNG streams of any bytes. The mutator repairs checksums, so that what is changed is also looked
 // at. What the exact reader takes as well, both read alike.
 
+#include <array>
 #include <cstdlib>
 #include <cstring>
 
@@ -25,12 +26,20 @@ void storeBigEndian(uint8* at, uint32 value) {
   for (int i = 0; i < 4; ++i) at[i] = static_cast<uint8>(value >> (24 - 8 * i));
 }
 
+/// What a byte does to a checksum.
+constexpr auto kCrcTable = [] {
+  std::array<uint32, 256> table = {};
+  for (uint32 i = 0; i < table.size(); ++i) {
+    table[i] = i;
+    for (int bit = 0; bit < 8; ++bit)
+      table[i] = table[i] >> 1 ^ ((table[i] & 1) != 0 ? 0xEDB88320u : 0u);
+  }
+  return table;
+}();
+
 uint32 crcOf(const uint8* bytes, size_t size) {
   uint32 crc = ~0u;
-  for (size_t i = 0; i < size; ++i) {
-    crc ^= bytes[i];
-    for (int bit = 0; bit < 8; ++bit) crc = crc >> 1 ^ ((crc & 1) != 0 ? 0xEDB88320u : 0u);
-  }
+  for (size_t i = 0; i < size; ++i) crc = crc >> 8 ^ kCrcTable[(crc ^ bytes[i]) & 255];
   return ~crc;
 }
 
