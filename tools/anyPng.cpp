@@ -11,7 +11,7 @@
 #include <csetjmp>
 #include <cstring>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 namespace {

@@ -48,7 +48,7 @@ struct BlendOptions {
 int blend(const BlendOptions& options) {
   const SaveOptions saving = options.output.forSave();
   if (options.op == RASTER_BLEND_SATURATE && options.dstAlpha == 0u)
-    throw CLI::ValidationError("saturate divides by the destination's alpha: --dst-alpha 0");
+    throw UsageError("saturate divides by the destination's alpha: --dst-alpha 0");
   Picture picture = Picture::loadAs(options.code, options.destination);
   Picture source = Picture::loadAs(32, options.source, true);
   premultiply(source);
@@ -72,23 +72,23 @@ uint32 parseOperator(const std::string& text) { return numberOfName(text, kOpera
 
 void addBlendCommand(Commands& commands) {
   auto options = std::make_shared<BlendOptions>();
-  CLI::App* command =
+  Command command =
       commands.add("blend", "Composites a picture with alpha onto another, which counts as opaque.",
                    [options] { return blend(*options); });
-  command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
-  command->add_option("SRC", options->source, "the PNG picture to draw")->required();
+  command.add("DST", options->destination, "the PNG picture to draw on").required();
+  command.add("SRC", options->source, "the PNG picture to draw").required();
   options->output.addTo(command);
-  addParsed(command, "--op", options->op, parseOperator, "NAME|0-13", "the operator (over)");
-  command->add_option("--src-alpha", options->srcAlpha, "scales the source, alpha included")
-      ->check(count(0, 255));
-  command->add_option("--dst-alpha", options->dstAlpha, "scales the destination and is its alpha")
-      ->check(count(0, 255));
-  addParsed(command, "--at", options->at, parsePoint, "X,Y",
-            "where the top left corner of SRC goes");
+  command.addParsed("--op", options->op, parseOperator, "NAME|0-13", "the operator (over)");
+  command.add("--src-alpha", options->srcAlpha, "scales the source, alpha included")
+      .check(count(0, 255));
+  command.add("--dst-alpha", options->dstAlpha, "scales the destination and is its alpha")
+      .check(count(0, 255));
+  command.addParsed("--at", options->at, parsePoint, "X,Y",
+                    "where the top left corner of SRC goes");
   addDepth(command, options->code, {6, 8, 15, 16, 24, 32}, "the pixel format of the destination")
-      ->capture_default_str();
-  command->add_flag("--staged", options->staged, "blend through a small buffer; the same pixels");
-  command->footer("Operators, in upper or lower case: " + listOf(kOperatorNames));
+      .withDefault();
+  command.addFlag("--staged", options->staged, "blend through a small buffer; the same pixels");
+  command.footer("Operators, in upper or lower case: " + listOf(kOperatorNames));
 }
 
 }  // namespace tool

@@ -1,52 +1,14 @@
 // SPDX-License-Identifier: MIT
 //
-// What a family of subcommands needs to add itself to the program, and the way all of them fail.
+// The families of subcommands: each adds itself to the program.
 
 #ifndef RASTER_TOOLS_COMMANDS_H
 #define RASTER_TOOLS_COMMANDS_H
 
-#include <CLI/CLI.hpp>
-#include <functional>
-#include <stdexcept>
-#include <string>
+#include "commandLine.h"
+#include "failure.h"
 
 namespace tool {
-
-/// Ends the command; the text is the one line that the user sees.
-struct Failure : std::runtime_error {
-  using std::runtime_error::runtime_error;
-};
-
-/// A line on standard error about something that is worth knowing and no failure.
-void note(const std::string& text);
-
-enum ExitStatus : int { kSuccess = 0, kFailure = 1, kUsage = 2 };
-
-/// The subcommands of the program, and which of them the command line chose.
-class Commands {
- public:
-  explicit Commands(CLI::App& program) : app(program) {}
-
-  /// Adds a subcommand. `body` runs after the whole command line was understood and returns the
-  /// exit status; when it throws Failure the program ends with `failureStatus`.
-  CLI::App* add(const std::string& name, const std::string& description, std::function<int()> body,
-                int failureStatus = kFailure) {
-    CLI::App* command = app.add_subcommand(name, description);
-    command->callback([this, body = std::move(body), failureStatus] {
-      chosen = body;
-      statusOfFailure = failureStatus;
-    });
-    return command;
-  }
-
-  CLI::App& program() { return app; }
-
-  std::function<int()> chosen;
-  int statusOfFailure = kFailure;
-
- private:
-  CLI::App& app;
-};
 
 void addInfoCommand(Commands& commands);
 void addImageCommands(Commands& commands);

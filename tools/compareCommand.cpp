@@ -179,27 +179,27 @@ int compare(const CompareOptions& options) {
 
 void addCompareCommand(Commands& commands) {
   auto options = std::make_shared<CompareOptions>();
-  CLI::App* command = commands.add(
+  Command command = commands.add(
       "compare",
       "Compares the colours of two pictures. The exit status is 0 when they are equal, 1 when they "
       "differ and 2 when that cannot be told.",
       [options] { return compare(*options); }, kTrouble);
-  command->add_option("A", options->first, "a PNG picture")->required();
-  command->add_option("B", options->second, "a PNG picture")->required();
+  command.add("A", options->first, "a PNG picture").required();
+  command.add("B", options->second, "a PNG picture").required();
   command
-      ->add_option("--mask", options->mask,
-                   "a PNG picture; the bits set in its colours are compared (white: all)")
-      ->type_name("FILE");
-  command->add_option("--max-diffs", options->maxDiffs, "so many pixels' worth of bytes may differ")
-      ->check(count(0, kMostDiffs));
-  command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
-      ->check(count(1, 4096))
-      ->capture_default_str();
+      .add("--mask", options->mask,
+           "a PNG picture; the bits set in its colours are compared (white: all)")
+      .form("FILE");
+  command.add("--max-diffs", options->maxDiffs, "so many pixels' worth of bytes may differ")
+      .check(count(0, kMostDiffs));
+  command.add("--tile", options->tileSize, "side of the tiles that are compared")
+      .check(count(1, 4096))
+      .withDefault();
   command
-      ->add_option("--image,--out", options->image,
-                   "a picture to write: dark, with the differences bright and outlined")
-      ->type_name("FILE");
-  command->add_flag("-q,--quiet", options->quiet, "say nothing: the exit status tells");
+      .add("--image,--out", options->image,
+           "a picture to write: dark, with the differences bright and outlined")
+      .form("FILE");
+  command.addFlag("-q,--quiet", options->quiet, "say nothing: the exit status tells");
 }
 
 }  // namespace tool

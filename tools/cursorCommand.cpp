@@ -85,23 +85,21 @@ int drawCursor(const CursorOptions& options) {
 
 void addCursorCommand(Commands& commands) {
   auto options = std::make_shared<CursorOptions>();
-  CLI::App* command = commands.add("cursor", "Draws a mouse cursor into a picture.",
-                                   [options] { return drawCursor(*options); });
-  command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
+  Command command = commands.add("cursor", "Draws a mouse cursor into a picture.",
+                                 [options] { return drawCursor(*options); });
+  command.add("DST", options->destination, "the PNG picture to draw on").required();
   options->output.addTo(command);
-  CLI::Option_group* kind = command->add_option_group("kind", "What the cursor is made of, one of");
-  kind->add_option("--image", options->image, "a PNG picture with alpha")->type_name("FILE");
-  kind->add_option("--planes", options->planes,
-                   "two PNG pictures, white where a bit is set: the screen is kept where the first "
-                   "one is set, and inverted where the second one then is")
-      ->expected(2)
-      ->type_name("AND XOR");
-  kind->require_option(1);
-  addParsed(command, "--at", options->at, parsePoint, "X,Y", "where the hot spot goes");
-  addParsed(command, "--hot", options->hotSpot, parsePoint, "X,Y",
-            "the hot spot, in pixels of the cursor");
-  command->add_option("--scale", options->scale, "draw it larger or smaller")
-      ->check(finiteNumber(0.1, 16));
+  OptionList kind = command.addChoice("kind", "What the cursor is made of, one of");
+  kind.add("--image", options->image, "a PNG picture with alpha").form("FILE");
+  kind.add("--planes", options->planes,
+           "two PNG pictures, white where a bit is set: the screen is kept where the first "
+           "one is set, and inverted where the second one then is")
+      .values(2)
+      .form("AND XOR");
+  command.addParsed("--at", options->at, parsePoint, "X,Y", "where the hot spot goes");
+  command.addParsed("--hot", options->hotSpot, parsePoint, "X,Y",
+                    "the hot spot, in pixels of the cursor");
+  command.add("--scale", options->scale, "draw it larger or smaller").check(finiteNumber(0.1, 16));
 }
 
 }  // namespace tool

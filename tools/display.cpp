@@ -9,7 +9,7 @@
 #include <cstring>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 #include "cursorImage.h"
 #include "geometry.h"
 #include "progress.h"

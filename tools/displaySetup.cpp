@@ -4,7 +4,7 @@
 
 #include <string>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 namespace {

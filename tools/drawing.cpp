@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-#include "commands.h"
+#include "failure.h"
 #include "geometry.h"
 
 namespace tool {

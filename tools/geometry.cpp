@@ -5,6 +5,8 @@
 #include <algorithm>
 #include <charconv>
 
+#include "failure.h"
+
 namespace tool {
 namespace {
 
@@ -40,9 +42,7 @@ class Reader {
   }
 
  private:
-  [[noreturn]] void fail() const {
-    throw CLI::ValidationError("'" + text + "' is not of the form " + form);
-  }
+  [[noreturn]] void fail() const { throw UsageError("'" + text + "' is not of the form " + form); }
 
   const std::string& text;
   const char* form;
@@ -91,9 +91,9 @@ uint32 parseColor(const std::string& text) {
   const char* end = text.data() + text.size();
   const auto [next, error] = std::from_chars(text.data() + prefix, end, value, 16);
   if (error != std::errc() || next != end || text.size() - prefix != (isShort ? 3 : 6))
-    throw CLI::ValidationError("'" + text +
-                               "' is not of the form RRGGBB, #RRGGBB, #RGB or "
-                               "0xRRGGBB");
+    throw UsageError("'" + text +
+                     "' is not of the form RRGGBB, #RRGGBB, #RGB or "
+                     "0xRRGGBB");
   if (!isShort) return value;
   return (value >> 8) * 0x110000 + (value >> 4 & 0xF) * 0x1100 + (value & 0xF) * 0x11;
 }
@@ -115,9 +115,9 @@ SizeRequest parseSizeRequest(const std::string& text) {
   const auto [next, error] = std::from_chars(text.data(), end, factor);
   if (isPercent) factor /= 100;
   if (error != std::errc() || next != end || !(factor > 0) || factor > kLargestFactor)
-    throw CLI::ValidationError("'" + text +
-                               "' is neither of the form WxH, Wx or xH nor a factor or "
-                               "percentage above 0");
+    throw UsageError("'" + text +
+                     "' is neither of the form WxH, Wx or xH nor a factor or "
+                     "percentage above 0");
   return {0, 0, factor};
 }
 

@@ -5,8 +5,6 @@
 #ifndef RASTER_TOOLS_GEOMETRY_H
 #define RASTER_TOOLS_GEOMETRY_H
 
-#include <CLI/CLI.hpp>
-#include <optional>
 #include <string>
 
 #include "rect.h"
@@ -38,17 +36,6 @@ Point parsePoint(const std::string& text);   // X,Y
 Rect parseRegion(const std::string& text);   // WxH+X+Y, or WxH at 0,0
 uint32 parseColor(const std::string& text);  // RRGGBB, #RRGGBB, #RGB, 0xRRGGBB
 std::string regionText(const Rect& rect);    // WxH+X+Y
-
-/// An option whose text goes through one of the parsers. A target may be a std::optional.
-template <class Target, class Value>
-CLI::Option* addParsed(CLI::App* command, const char* name, Target& target,
-                       Value (*parse)(const std::string&), const char* form,
-                       const char* description) {
-  return command
-      ->add_option_function<std::string>(
-          name, [&target, parse](const std::string& text) { target = parse(text); }, description)
-      ->type_name(form);
-}
 
 }  // namespace tool
 

@@ -2,6 +2,7 @@
 
 #include "help.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cstdio>
 #include <memory>
@@ -168,8 +169,7 @@ void addOptionNames(const CLI::App& app, std::vector<std::string>& names) {
 int showHelp(const CLI::App& app, const std::string& name) {
   const std::vector<std::string> commands = commandNames(app);
   if (!name.empty() && std::find(commands.begin(), commands.end(), name) == commands.end())
-    throw CLI::ValidationError("there is no subcommand '" + name + "'" +
-                               suggestion(name, commands));
+    throw UsageError("there is no subcommand '" + name + "'" + suggestion(name, commands));
   // Its own help() would be that of the command that runs: this one.
   const CLI::App& about = name.empty() ? app : *app.get_subcommand(name);
   fputs(Formatter().make_help(&about, "", CLI::AppFormatMode::Normal).c_str(), stdout);
@@ -187,12 +187,13 @@ std::string versionText() {
 void addHelpCommand(Commands& commands) {
   auto name = std::make_shared<std::string>();
   const CLI::App& app = commands.program();
-  CLI::App* command = commands.add("help", "Says what the program or a command does.",
-                                   [name, &app] { return showHelp(app, *name); });
-  command->add_option("COMMAND", *name, "the command to say more about");
+  Command command = commands.add("help", "Says what the program or a command does.",
+                                 [name, &app] { return showHelp(app, *name); });
+  command.add("COMMAND", *name, "the command to say more about");
 }
 
-void addHelp(CLI::App& app) {
+void addHelp(Commands& commands) {
+  CLI::App& app = commands.program();
   const auto formatter = std::make_shared<Formatter>();
   app.formatter(formatter);
   app.set_version_flag("-V,--version", versionText,
@@ -217,13 +218,14 @@ void addHelp(CLI::App& app) {
   }
 }
 
-std::string explanation(const CLI::App& app, const CLI::ParseError& error, int argc,
+std::string explanation(const Commands& commands, const UsageError& error, int argc,
                         const char* const* argv) {
-  const std::vector<std::string> commands = commandNames(app);
+  const CLI::App& app = commands.program();
+  const std::vector<std::string> known = commandNames(app);
   const std::string first = argc > 1 ? argv[1] : "";
   const bool isOption = first.empty() || first[0] == '-';
-  if (!isOption && std::find(commands.begin(), commands.end(), first) == commands.end())
-    return "there is no subcommand '" + first + "'" + suggestion(first, commands);
+  if (!isOption && std::find(known.begin(), known.end(), first) == known.end())
+    return "there is no subcommand '" + first + "'" + suggestion(first, known);
   if (argc == 1) return "a subcommand is required";
   const auto unknown = unknownOptions(app);
   if (unknown.empty()) return error.what();

@@ -6,23 +6,22 @@
 #ifndef RASTER_TOOLS_HELP_H
 #define RASTER_TOOLS_HELP_H
 
-#include <CLI/CLI.hpp>
 #include <string>
 
-#include "commands.h"
+#include "commandLine.h"
 
 namespace tool {
 
 void addHelpCommand(Commands& commands);
 
 /// Gives the program and all the commands that it has this form of help, -h and -V.
-void addHelp(CLI::App& app);
+void addHelp(Commands& commands);
 
 /// The version, and the instruction-set level that the library runs at.
 std::string versionText();
 
 /// What is wrong with a command line, and what may have been meant.
-std::string explanation(const CLI::App& app, const CLI::ParseError& error, int argc,
+std::string explanation(const Commands& commands, const UsageError& error, int argc,
                         const char* const* argv);
 
 }  // namespace tool

@@ -23,8 +23,8 @@ struct ConvertOptions {
 int convert(const ConvertOptions& options) {
   const bool isNarrow = options.code != 0 && options.code != 32;
   if (isNarrow && options.output.keepAlpha)
-    throw CLI::ValidationError("pixels of --depth " + std::to_string(options.code) +
-                               " have no alpha to keep");
+    throw UsageError("pixels of --depth " + std::to_string(options.code) +
+                     " have no alpha to keep");
   options.output.forSave();
   Picture picture = Picture::load(options.input, !options.output.noAlpha);
   const bool hadAlpha = picture.code() == 32 && isTransparent(picture);
@@ -38,9 +38,9 @@ int convert(const ConvertOptions& options) {
 
 void addConvert(Commands& commands) {
   auto options = std::make_shared<ConvertOptions>();
-  CLI::App* command = commands.add("convert", "Writes a PNG picture as PNG or BMP.",
-                                   [options] { return convert(*options); });
-  command->add_option("IN", options->input, "a PNG picture")->required();
+  Command command = commands.add("convert", "Writes a PNG picture as PNG or BMP.",
+                                 [options] { return convert(*options); });
+  command.add("IN", options->input, "a PNG picture").required();
   options->output.addTo(command);
   options->output.addCompressionTo(command);
   options->output.addAlphaTo(command);
@@ -57,7 +57,7 @@ struct PlacedFile {
 PlacedFile parsePlacedFile(const std::string& text) {
   const size_t sign = text.rfind('@');
   if (sign == std::string::npos || sign == 0)
-    throw CLI::ValidationError("'" + text + "' is not of the form FILE@X,Y");
+    throw UsageError("'" + text + "' is not of the form FILE@X,Y");
   return {text.substr(0, sign), parsePoint(text.substr(sign + 1))};
 }
 
@@ -108,15 +108,15 @@ int combine(const OutputOptions& output, const std::vector<std::string>& inputs)
 void addCombine(Commands& commands) {
   auto output = std::make_shared<OutputOptions>();
   auto inputs = std::make_shared<std::vector<std::string>>();
-  CLI::App* command = commands.add(
+  Command command = commands.add(
       "combine",
       "Lays pictures out in one. Later ones cover earlier ones; gaps are transparent in a PNG.",
       [output, inputs] { return combine(*output, *inputs); });
   output->addTo(command);
   output->addAlphaTo(command);
-  command->add_option("PICTURES", *inputs, "a PNG picture and where its top left corner goes")
-      ->required()
-      ->type_name("FILE@X,Y");
+  command.add("PICTURES", *inputs, "a PNG picture and where its top left corner goes")
+      .required()
+      .form("FILE@X,Y");
 }
 
 }  // namespace

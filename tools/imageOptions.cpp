@@ -2,32 +2,31 @@
 
 #include "imageOptions.h"
 
-#include "commands.h"
+#include "failure.h"
 #include "numbers.h"
 
 namespace tool {
 
-void OutputOptions::addPathTo(CLI::App* command) {
-  command->add_option("OUT", path, "the picture to write")->required();
+void OutputOptions::addPathTo(OptionList& command) {
+  command.add("OUT", path, "the picture to write").required();
 }
 
-void OutputOptions::addTo(CLI::App* command) {
+void OutputOptions::addTo(OptionList& command) {
   addPathTo(command);
-  command->add_option("--format", format, "the kind of file, when the name does not say it")
-      ->check(CLI::IsMember({"png", "bmp"}));
+  command.add("--format", format, "the kind of file, when the name does not say it")
+      .oneOf({"png", "bmp"});
 }
 
-void OutputOptions::addCompressionTo(CLI::App* command) {
-  command->add_option("--compression", compression, "effort of the PNG compression")
-      ->check(count(0, 9));
+void OutputOptions::addCompressionTo(OptionList& command) {
+  command.add("--compression", compression, "effort of the PNG compression").check(count(0, 9));
 }
 
-void OutputOptions::addAlphaTo(CLI::App* command) {
-  CLI::Option* without = command->add_flag("--no-alpha", noAlpha, "leave the alpha channel out");
+void OutputOptions::addAlphaTo(OptionList& command) {
+  Option without = command.addFlag("--no-alpha", noAlpha, "leave the alpha channel out");
   command
-      ->add_flag("--keep-alpha", keepAlpha,
-                 "fail rather than leave out alpha, which is kept where it can be")
-      ->excludes(without);
+      .addFlag("--keep-alpha", keepAlpha,
+               "fail rather than leave out alpha, which is kept where it can be")
+      .excludes(without);
 }
 
 SaveOptions OutputOptions::forSave() const {
@@ -36,7 +35,7 @@ SaveOptions OutputOptions::forSave() const {
                                            : FileType::fromName;
   const FileType type = typeFromName(path, given);
   if (type == FileType::bmp && (keepAlpha || compression != -1))
-    throw CLI::ValidationError("a BMP file has neither alpha nor compression");
+    throw UsageError("a BMP file has neither alpha nor compression");
   return {type, compression, keepAlpha};
 }
 
@@ -48,9 +47,9 @@ void OutputOptions::saveWithAlpha(const Picture& picture) const {
     note("a BMP file keeps no alpha: all pixels became opaque");
 }
 
-CLI::Option* addDepth(CLI::App* command, uint32& code, const std::vector<uint32>& allowed,
-                      const std::string& description) {
-  return command->add_option("--depth", code, description)->check(CLI::IsMember(allowed));
+Option addDepth(OptionList& command, uint32& code, const std::vector<uint32>& allowed,
+                const std::string& description) {
+  return command.add("--depth", code, description).oneOf(allowed);
 }
 
 }  // namespace tool

@@ -5,10 +5,10 @@
 #ifndef RASTER_TOOLS_IMAGE_OPTIONS_H
 #define RASTER_TOOLS_IMAGE_OPTIONS_H
 
-#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
+#include "commandLine.h"
 #include "picture.h"
 
 namespace tool {
@@ -21,12 +21,12 @@ struct OutputOptions {
   bool noAlpha = false;
 
   /// OUT.
-  void addPathTo(CLI::App* command);
+  void addPathTo(OptionList& command);
   /// OUT and --format.
-  void addTo(CLI::App* command);
-  void addCompressionTo(CLI::App* command);
+  void addTo(OptionList& command);
+  void addCompressionTo(OptionList& command);
   /// --no-alpha and --keep-alpha, for commands that keep alpha anyhow.
-  void addAlphaTo(CLI::App* command);
+  void addAlphaTo(OptionList& command);
   SaveOptions forSave() const;
   /// Writes a picture with its alpha, of which `picture` has some if it has 32 bits; says so when
   /// that cannot be kept.
@@ -34,8 +34,8 @@ struct OutputOptions {
 };
 
 /// --depth, one of the given pixel formats.
-CLI::Option* addDepth(CLI::App* command, uint32& code, const std::vector<uint32>& allowed,
-                      const std::string& description);
+Option addDepth(OptionList& command, uint32& code, const std::vector<uint32>& allowed,
+                const std::string& description);
 
 }  // namespace tool
 

@@ -178,10 +178,9 @@ int showInfo(const std::string& path) {
 
 void addInfoCommand(Commands& commands) {
   auto path = std::make_shared<std::string>();
-  CLI::App* command = commands.add("info", "Says what a picture, a raster block or a recording is.",
-                                   [path] { return showInfo(*path); });
-  command->add_option("FILE", *path, "a PNG or BMP picture, a raster block or a recording")
-      ->required();
+  Command command = commands.add("info", "Says what a picture, a raster block or a recording is.",
+                                 [path] { return showInfo(*path); });
+  command.add("FILE", *path, "a PNG or BMP picture, a raster block or a recording").required();
 }
 
 }  // namespace tool

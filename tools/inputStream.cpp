@@ -12,7 +12,7 @@
 #include <system_error>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 namespace {

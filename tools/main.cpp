@@ -9,7 +9,7 @@
 #include <cstring>
 #include <exception>
 #include <new>
-#include <sstream>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -48,7 +48,7 @@ int runChosen(Commands& commands) {
   Warning_SetSink([](const char*) {});  // a Panic follows, and one line is enough
   try {
     return commands.chosen();
-  } catch (const CLI::ParseError& error) {  // arguments that only the body can judge
+  } catch (const UsageError& error) {  // arguments that only the body can judge
     return usageError(error.what());
   } catch (const std::bad_alloc&) {
     complain("out of memory");
@@ -65,36 +65,32 @@ int closed(int status, int statusOfFailure) {
   return statusOfFailure;
 }
 
-/// The arguments, the last one first as the argument library takes them. Standard input at a place
-/// ("-@X,Y") would look like an option.
+/// The arguments. Standard input at a place ("-@X,Y") would look like an option.
 std::vector<std::string> argumentsOf(int argc, char** argv) {
   std::vector<std::string> arguments(argv + std::min(argc, 1), argv + argc);
   for (std::string& argument : arguments)
     if (argument.rfind("-@", 0) == 0) argument.replace(0, 1, "/dev/stdin");
-  std::reverse(arguments.begin(), arguments.end());
   return arguments;
 }
 
 int runCommandLine(int argc, char** argv) {
-  CLI::App app("Screenshots of X displays, and raster graphics on pictures in files or pipes.",
-               "rastertool");
-  app.require_subcommand(1);
-  Commands commands(app);
+  Commands commands(
+      "rastertool",
+      "Screenshots of X displays, and raster graphics on pictures in files or pipes.");
   for (const auto addFamily :
        {addScreenCommands, addServeCommand, addPlayCommand, addInfoCommand, addImageCommands,
         addRopCommand, addBlendCommand, addCursorCommand, addScaleCommands, addCompareCommand,
         addYuvCommand, addPackCommands, addHelpCommand})
     addFamily(commands);
-  addHelp(app);
+  addHelp(commands);
   try {
-    app.parse(argumentsOf(argc, argv));
-  } catch (const CLI::Success& asked) {
-    std::ostringstream text;
-    app.exit(asked, text);
-    fputs(text.str().c_str(), stdout);
-    return closed(kSuccess, kFailure);
-  } catch (const CLI::ParseError& error) {
-    return usageError(explanation(app, error, argc, argv));
+    const std::optional<std::string> answer = commands.parse(argumentsOf(argc, argv));
+    if (answer) {
+      fputs(answer->c_str(), stdout);
+      return closed(kSuccess, kFailure);
+    }
+  } catch (const UsageError& error) {
+    return usageError(explanation(commands, error, argc, argv));
   }
   return closed(runChosen(commands), commands.statusOfFailure);
 }

@@ -7,7 +7,7 @@
 #include <charconv>
 #include <sstream>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 namespace {
@@ -63,8 +63,7 @@ uint32 numberOfName(const std::string& text, std::span<const char* const> lists)
   const char* end = text.data() + text.size();
   const auto [next, error] = std::from_chars(text.data(), end, number);
   if (error == std::errc() && next == end && number < lists.size()) return number;
-  throw CLI::ValidationError("there is no operation '" + text + "'; the names are " +
-                             listOf(lists));
+  throw UsageError("there is no operation '" + text + "'; the names are " + listOf(lists));
 }
 
 std::string listOf(std::span<const char* const> lists) {

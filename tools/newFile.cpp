@@ -13,7 +13,7 @@
 #include <random>
 #include <system_error>
 
-#include "commands.h"
+#include "failure.h"
 #include "fileIO.h"
 
 namespace tool {

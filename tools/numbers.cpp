@@ -27,7 +27,7 @@ std::string wrong(const std::string& text, const std::string& expected) {
 
 }  // namespace
 
-CLI::Validator finiteNumber(double lowest, double highest) {
+Check finiteNumber(double lowest, double highest) {
   const std::string expected = "a number from " + shown(lowest) + " to " + shown(highest);
   const auto check = [=](const std::string& text) {
     double number = 0;
@@ -35,10 +35,10 @@ CLI::Validator finiteNumber(double lowest, double highest) {
     const bool good = parse(text, number) && number >= lowest && number <= highest;
     return good && std::isfinite(number) ? std::string() : wrong(text, expected);
   };
-  return CLI::Validator(check, "NUMBER in [" + shown(lowest) + " - " + shown(highest) + "]");
+  return {"NUMBER in [" + shown(lowest) + " - " + shown(highest) + "]", check};
 }
 
-CLI::Validator count(uint64 lowest, uint64 highest) {
+Check count(uint64 lowest, uint64 highest) {
   const std::string most = highest == UINT64_MAX ? "" : std::to_string(highest);
   const std::string least = std::to_string(lowest);
   const std::string expected =
@@ -49,7 +49,7 @@ CLI::Validator count(uint64 lowest, uint64 highest) {
     // The argument library takes a number with a leading zero for an octal one.
     return good && text == std::to_string(number) ? std::string() : wrong(text, expected);
   };
-  return CLI::Validator(check, "COUNT in [" + least + " - " + most + "]");
+  return {"COUNT in [" + least + " - " + most + "]", check};
 }
 
 }  // namespace tool

@@ -6,17 +6,16 @@
 #ifndef RASTER_TOOLS_NUMBERS_H
 #define RASTER_TOOLS_NUMBERS_H
 
-#include <CLI/CLI.hpp>
-
 #include "baseTypes.h"
+#include "commandLine.h"
 
 namespace tool {
 
 /// Checks an option whose value is a number between two limits, both allowed.
-CLI::Validator finiteNumber(double lowest, double highest);
+Check finiteNumber(double lowest, double highest);
 
 /// Checks an option whose value is a whole number from `lowest` to `highest`, without a sign.
-CLI::Validator count(uint64 lowest, uint64 highest);
+Check count(uint64 lowest, uint64 highest);
 
 }  // namespace tool
 

@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <filesystem>
 
-#include "commands.h"
+#include "failure.h"
 #include "fileIO.h"
 #include "newFile.h"
 

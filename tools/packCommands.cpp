@@ -23,8 +23,8 @@ struct PackOptions {
 
 int pack(const PackOptions& options) {
   if (options.output.keepAlpha && options.code != 32)
-    throw CLI::ValidationError("pixels of --depth " + std::to_string(options.code) +
-                               " have no alpha to keep");
+    throw UsageError("pixels of --depth " + std::to_string(options.code) +
+                     " have no alpha to keep");
   const Picture picture = Picture::loadAs(options.code, options.input, options.output.keepAlpha);
   const std::vector<uint8> block = packBlock(picture);
   writeOutput(options.output.path, block.data(), block.size());
@@ -41,25 +41,25 @@ int unpack(const std::string& path, const OutputOptions& output) {
 
 void addPack(Commands& commands) {
   auto options = std::make_shared<PackOptions>();
-  CLI::App* command = commands.add("pack", "Compresses a picture to a raster block.",
-                                   [options] { return pack(*options); });
-  command->add_option("IN", options->input, "a PNG picture")->required();
-  command->add_option("OUT", options->output.path, "the block to write")->required();
-  command->add_flag("--keep-alpha", options->output.keepAlpha,
-                    "keep the alpha channel of the picture");
+  Command command = commands.add("pack", "Compresses a picture to a raster block.",
+                                 [options] { return pack(*options); });
+  command.add("IN", options->input, "a PNG picture").required();
+  command.add("OUT", options->output.path, "the block to write").required();
+  command.addFlag("--keep-alpha", options->output.keepAlpha,
+                  "keep the alpha channel of the picture");
   addDepth(command, options->code, {8, 16, 24, 32}, "the pixel format; only 32 is compressed")
-      ->capture_default_str();
+      .withDefault();
 }
 
 void addUnpack(Commands& commands) {
   auto input = std::make_shared<std::string>();
   auto output = std::make_shared<OutputOptions>();
-  CLI::App* command = commands.add("unpack", "Writes the picture in a raster block.",
-                                   [input, output] { return unpack(*input, *output); });
-  command->add_option("IN", *input, "a raster block")->required();
+  Command command = commands.add("unpack", "Writes the picture in a raster block.",
+                                 [input, output] { return unpack(*input, *output); });
+  command.add("IN", *input, "a raster block").required();
   output->addTo(command);
   output->addCompressionTo(command);
-  command->add_flag("--keep-alpha", output->keepAlpha, "take the fourth byte of a pixel for alpha");
+  command.addFlag("--keep-alpha", output->keepAlpha, "take the fourth byte of a pixel for alpha");
 }
 
 }  // namespace

@@ -9,7 +9,7 @@
 #include <utility>
 
 #include "anyPng.h"
-#include "commands.h"
+#include "failure.h"
 #include "dynBuf.h"
 #include "pngFile.h"
 #include "raster.h"
@@ -204,7 +204,7 @@ FileType typeFromName(const std::string& path, FileType given) {
   const std::string ending = lowerCaseEnding(path);
   if (ending == "png") return FileType::png;
   if (ending == "bmp") return FileType::bmp;
-  throw CLI::ValidationError("'" + path + "' ends neither in .png nor in .bmp");
+  throw UsageError("'" + path + "' ends neither in .png nor in .bmp");
 }
 
 void save(const Picture& picture, const std::string& path, const SaveOptions& options) {

@@ -5,7 +5,7 @@
 #include <cstring>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 namespace {

@@ -8,7 +8,7 @@
 #include <memory>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 #include "raster.h"
 
 namespace tool {

@@ -86,7 +86,7 @@ uint32 parseRop(const std::string& text) { return numberOfName(text, kRopNames);
 
 Point parsePhase(const std::string& text) {
   const Point phase = parsePoint(text);
-  if (phase.x < 0 || phase.y < 0) throw CLI::ValidationError("a phase is not negative");
+  if (phase.x < 0 || phase.y < 0) throw UsageError("a phase is not negative");
   return phase;
 }
 
@@ -94,31 +94,29 @@ Point parsePhase(const std::string& text) {
 
 void addRopCommand(Commands& commands) {
   auto options = std::make_shared<RopOptions>();
-  CLI::App* command = commands.add(
+  Command command = commands.add(
       "rop",
       "Combines a picture with another, with a colour or with a tile by one of the sixteen raster "
       "operations.",
       [options] { return rop(*options); });
-  command->add_option("DST", options->destination, "the PNG picture to draw on")->required();
+  command.add("DST", options->destination, "the PNG picture to draw on").required();
   options->output.addTo(command);
-  addParsed(command, "--op", options->rop, parseRop, "NAME|0-15", "the operation")->required();
-  CLI::Option_group* from = command->add_option_group("source", "What is combined with it, one of");
-  CLI::Option* source =
-      from->add_option("--source", options->source, "a PNG picture")->type_name("FILE");
-  addParsed(from, "--color,--colour", options->color, parseColor, "COLOUR",
-            "one colour: RRGGBB, #RGB, 0xRRGGBB");
-  CLI::Option* tile = from->add_option("--tile", options->tile, "a PNG picture that is repeated")
-                          ->type_name("FILE");
-  from->require_option(1);
-  addParsed(command, "--at", options->at, parsePoint, "X,Y",
-            "where the top left corner of --source goes")
-      ->needs(source);
-  addParsed(command, "--phase", options->phase, parsePhase, "X,Y",
-            "the pixel of --tile that lands on the top left corner")
-      ->needs(tile);
-  addDepth(command, options->code, {16, 24, 32}, "the pixel format to work in")
-      ->capture_default_str();
-  command->footer(
+  command.addParsed("--op", options->rop, parseRop, "NAME|0-15", "the operation").required();
+  OptionList from = command.addChoice("source", "What is combined with it, one of");
+  Option source = from.add("--source", options->source, "a PNG picture").form("FILE");
+  from.addParsed("--color,--colour", options->color, parseColor, "COLOUR",
+                 "one colour: RRGGBB, #RGB, 0xRRGGBB");
+  Option tile = from.add("--tile", options->tile, "a PNG picture that is repeated").form("FILE");
+  command
+      .addParsed("--at", options->at, parsePoint, "X,Y",
+                 "where the top left corner of --source goes")
+      .needs(source);
+  command
+      .addParsed("--phase", options->phase, parsePhase, "X,Y",
+                 "the pixel of --tile that lands on the top left corner")
+      .needs(tile);
+  addDepth(command, options->code, {16, 24, 32}, "the pixel format to work in").withDefault();
+  command.footer(
       "Operations, in upper or lower case; X11's and Windows' names are known as well: " +
       listOf(kRopNames));
 }

@@ -68,15 +68,16 @@ int scale(const ScaleOptions& options) {
 
 void addScale(Commands& commands) {
   auto options = std::make_shared<ScaleOptions>();
-  CLI::App* command = commands.add("scale", "Enlarges or reduces a picture.",
-                                   [options] { return scale(*options); });
-  command->add_option("IN", options->input, "a PNG picture")->required();
+  Command command = commands.add("scale", "Enlarges or reduces a picture.",
+                                 [options] { return scale(*options); });
+  command.add("IN", options->input, "a PNG picture").required();
   options->output.addTo(command);
   options->output.addAlphaTo(command);
-  addParsed(command, "SIZE", options->size, parseSizeRequest, "SIZE",
-            "the new size: WxH, Wx or xH to keep the sides' ratio, a factor, or a percentage")
-      ->required();
-  command->add_flag("--nearest", options->nearest, "repeat or drop pixels instead of smoothing");
+  command
+      .addParsed("SIZE", options->size, parseSizeRequest, "SIZE",
+                 "the new size: WxH, Wx or xH to keep the sides' ratio, a factor, or a percentage")
+      .required();
+  command.addFlag("--nearest", options->nearest, "repeat or drop pixels instead of smoothing");
 }
 
 struct CropOptions {
@@ -116,17 +117,18 @@ int crop(const CropOptions& options) {
 
 void addCrop(Commands& commands) {
   auto options = std::make_shared<CropOptions>();
-  CLI::App* command =
+  Command command =
       commands.add("crop", "Cuts a rectangle out of a picture, and scales it if so asked.",
                    [options] { return crop(*options); });
-  command->add_option("IN", options->input, "a PNG picture")->required();
+  command.add("IN", options->input, "a PNG picture").required();
   options->output.addTo(command);
   options->output.addAlphaTo(command);
-  addParsed(command, "REGION", options->region, parseRegion, "WxH[+X+Y]",
-            "the part to keep; without +X+Y at the top left corner")
-      ->required();
-  addParsed(command, "--scale", options->size, parseSizeRequest, "SIZE",
-            "the size to scale it to: WxH, Wx, xH, a factor or a percentage");
+  command
+      .addParsed("REGION", options->region, parseRegion, "WxH[+X+Y]",
+                 "the part to keep; without +X+Y at the top left corner")
+      .required();
+  command.addParsed("--scale", options->size, parseSizeRequest, "SIZE",
+                    "the size to scale it to: WxH, Wx, xH, a factor or a percentage");
 }
 
 }  // namespace

@@ -27,10 +27,9 @@ struct ScreenOptions {
   std::string display;
   std::optional<Rect> region;
 
-  void addTo(CLI::App* command) {
-    command->add_option("--display", display, "the X display; without it, the one in DISPLAY")
-        ->type_name("NAME");
-    addParsed(command, "--region", region, parseRegion, "WxH+X+Y", "a part of the screen");
+  void addTo(OptionList& command) {
+    command.add("--display", display, "the X display; without it, the one in DISPLAY").form("NAME");
+    command.addParsed("--region", region, parseRegion, "WxH+X+Y", "a part of the screen");
   }
 
   Rect regionOf(const Display& from) const {
@@ -76,15 +75,14 @@ int screenshot(const ScreenshotOptions& options) {
 
 void addScreenshot(Commands& commands) {
   auto options = std::make_shared<ScreenshotOptions>();
-  CLI::App* command = commands.add("screenshot", "Saves the screen of an X display.",
-                                   [options] { return screenshot(*options); });
+  Command command = commands.add("screenshot", "Saves the screen of an X display.",
+                                 [options] { return screenshot(*options); });
   options->output.addTo(command);
   options->screen.addTo(command);
-  CLI::Option* cursor =
-      command->add_flag("--cursor", options->withCursor, "draw the mouse cursor as well");
-  command->add_option("--cursor-scale", options->cursorScale, "draw it larger or smaller")
-      ->check(finiteNumber(0.1, 16))
-      ->needs(cursor);
+  Option cursor = command.addFlag("--cursor", options->withCursor, "draw the mouse cursor as well");
+  command.add("--cursor-scale", options->cursorScale, "draw it larger or smaller")
+      .check(finiteNumber(0.1, 16))
+      .needs(cursor);
 }
 
 struct WatchOptions {
@@ -147,24 +145,24 @@ int watch(const WatchOptions& options) {
 
 void addWatch(Commands& commands) {
   auto options = std::make_shared<WatchOptions>();
-  CLI::App* command = commands.add(
+  Command command = commands.add(
       "watch", "Prints the rectangles of a screen that change from one capture to the next.",
       [options] { return watch(*options); });
   options->screen.addTo(command);
-  command->add_option("--interval", options->interval, "seconds between captures")
-      ->check(finiteNumber(0, 86400))
-      ->capture_default_str();
-  command->add_option("--count", options->count, "how many times; 0 goes on until interrupted")
-      ->check(count(0, UINT64_MAX))
-      ->capture_default_str();
-  command->add_option("--tile", options->tileSize, "side of the tiles that are compared")
-      ->check(count(1, 4096))
-      ->capture_default_str();
+  command.add("--interval", options->interval, "seconds between captures")
+      .check(finiteNumber(0, 86400))
+      .withDefault();
+  command.add("--count", options->count, "how many times; 0 goes on until interrupted")
+      .check(count(0, UINT64_MAX))
+      .withDefault();
+  command.add("--tile", options->tileSize, "side of the tiles that are compared")
+      .check(count(1, 4096))
+      .withDefault();
   command
-      ->add_option("--raw", options->raw,
-                   "also write every capture, the first one included, as raw video: four bytes a "
-                   "pixel, blue first (FFmpeg's bgr0)")
-      ->type_name("FILE");
+      .add("--raw", options->raw,
+           "also write every capture, the first one included, as raw video: four bytes a "
+           "pixel, blue first (FFmpeg's bgr0)")
+      .form("FILE");
 }
 
 }  // namespace

@@ -7,7 +7,7 @@
 #include <cerrno>
 #include <filesystem>
 
-#include "commands.h"
+#include "failure.h"
 #include "outputFile.h"
 
 namespace tool {

@@ -9,7 +9,7 @@
 #include <string>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 #include "names.h"
 #include "raster.h"
 #include "rasterChecked.h"
@@ -119,11 +119,11 @@ VideoLayout videoLayout(const std::string& name, bool libraryOrder) {
       std::find_if(std::begin(kLayouts), std::end(kLayouts),
                    [&](const NamedLayout& layout) { return isOneOf(layout.names, name); });
   if (found == std::end(kLayouts))
-    throw CLI::ValidationError("there is no video format '" + name + "'; the names are " +
-                               videoLayoutNames());
+    throw UsageError("there is no video format '" + name + "'; the names are " +
+                     videoLayoutNames());
   if (libraryOrder && !isOfLibrary(*found))
-    throw CLI::ValidationError("the library's own order has no format '" + name +
-                               "'; its names are YV12, YUY2 and UYVY");
+    throw UsageError("the library's own order has no format '" + name +
+                     "'; its names are YV12, YUY2 and UYVY");
   return {firstOf(found->names), found->code, found->isPlanar,
           found->swapsDifferences && !libraryOrder, libraryOrder};
 }
@@ -242,8 +242,7 @@ bool FrameReader::goTo(uint64 wanted) {
 Size parseFrameSize(const std::string& text) {
   const Size size = parseSize(text);
   if (!isFrameSize(size))
-    throw CLI::ValidationError("no side of a frame may be over " +
-                               std::to_string(kLargestFrameSide));
+    throw UsageError("no side of a frame may be over " + std::to_string(kLargestFrameSide));
   return size;
 }
 

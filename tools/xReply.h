@@ -11,7 +11,7 @@
 #include <memory>
 #include <string>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool {
 

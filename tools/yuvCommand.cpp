@@ -46,11 +46,11 @@ std::string numberedPath(const std::string& path, uint64 number) {
 FrameReader readerFor(const YuvOptions& options, InputStream& input) {
   if (options.layout.empty() && !options.size) return FrameReader(input);
   if (options.input.ends_with(".y4m"))
-    throw CLI::ValidationError(
+    throw UsageError(
         "a .y4m file says its format and size itself: leave --format and "
         "--size out");
   if (options.layout.empty() || !options.size)
-    throw CLI::ValidationError("raw video needs both --format and --size");
+    throw UsageError("raw video needs both --format and --size");
   return {input, videoLayout(options.layout, options.libraryOrder), *options.size};
 }
 
@@ -84,29 +84,26 @@ int convertFrames(const YuvOptions& options) {
 
 void addYuvCommand(Commands& commands) {
   auto options = std::make_shared<YuvOptions>();
-  CLI::App* command = commands.add("yuv", "Converts frames of uncompressed video to pictures.",
-                                   [options] { return convertFrames(*options); });
-  command->add_option("IN", options->input, "frames one after the other, raw or as .y4m")
-      ->required();
+  Command command = commands.add("yuv", "Converts frames of uncompressed video to pictures.",
+                                 [options] { return convertFrames(*options); });
+  command.add("IN", options->input, "frames one after the other, raw or as .y4m").required();
   options->output.addPathTo(command);
-  command->add_option("--format", options->layout, "how a frame of raw video lies in memory")
-      ->type_name("NAME");
-  command->add_flag("--library-order", options->libraryOrder,
-                    "YUY2, UYVY and YV12 as the library has them, with the colour differences the "
-                    "other way round");
-  addParsed(command, "--size", options->size, parseFrameSize, "WxH",
-            "pixels of a frame of raw video");
+  command.add("--format", options->layout, "how a frame of raw video lies in memory").form("NAME");
+  command.addFlag("--library-order", options->libraryOrder,
+                  "YUY2, UYVY and YV12 as the library has them, with the colour differences the "
+                  "other way round");
+  command.addParsed("--size", options->size, parseFrameSize, "WxH",
+                    "pixels of a frame of raw video");
   addDepth(command, options->code, {15, 16, 24, 32}, "the pixel format to convert to")
-      ->capture_default_str();
-  CLI::Option* frame =
-      command->add_option("--frame", options->frame, "the number of the frame, from 0")
-          ->check(count(0, UINT64_MAX));
+      .withDefault();
+  Option frame = command.add("--frame", options->frame, "the number of the frame, from 0")
+                     .check(count(0, UINT64_MAX));
   command
-      ->add_flag("--all", options->all,
-                 "every frame: OUT gets a number before its ending; on standard output "
-                 "the pictures follow each other")
-      ->excludes(frame);
-  command->footer("Formats, in upper or lower case: " + videoLayoutNames());
+      .addFlag("--all", options->all,
+               "every frame: OUT gets a number before its ending; on standard output "
+               "the pictures follow each other")
+      .excludes(frame);
+  command.footer("Formats, in upper or lower case: " + videoLayoutNames());
 }
 
 }  // namespace tool

@@ -4,7 +4,7 @@
 
 #include <xcb/xtest.h>
 
-#include "commands.h"
+#include "failure.h"
 #include "xReply.h"
 
 namespace tool::live {

@@ -15,7 +15,7 @@
 #include <memory>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool::live {
 namespace {
@@ -32,7 +32,7 @@ struct HostAndPort {
 HostAndPort splitAddress(const std::string& text) {
   const size_t colon = text.rfind(':');
   if (colon == std::string::npos || colon == 0 || colon + 1 == text.size())
-    throw CLI::ValidationError("'" + text + "' is not of the form HOST:PORT");
+    throw UsageError("'" + text + "' is not of the form HOST:PORT");
   std::string host = text.substr(0, colon);
   if (host.front() == '[' && host.back() == ']') host = host.substr(1, host.size() - 2);
   if (host == "localhost") host = "127.0.0.1";
@@ -48,7 +48,7 @@ Addresses lookUp(const std::string& text) {
   hints.ai_flags = AI_NUMERICHOST | AI_NUMERICSERV | AI_PASSIVE;
   addrinfo* found = nullptr;
   if (getaddrinfo(parts.host.c_str(), parts.port.c_str(), &hints, &found) != 0)
-    throw CLI::ValidationError("'" + text + "' is not an address in numbers and a port");
+    throw UsageError("'" + text + "' is not an address in numbers and a port");
   return {found, freeaddrinfo};
 }
 
@@ -82,7 +82,7 @@ sockaddr_un pathAddress(const std::string& path) {
   sockaddr_un address = {};
   address.sun_family = AF_UNIX;
   if (path.empty() || path.size() >= sizeof address.sun_path)
-    throw CLI::ValidationError("'" + path + "' is too long for a socket, or empty");
+    throw UsageError("'" + path + "' is too long for a socket, or empty");
   memcpy(address.sun_path, path.c_str(), path.size() + 1);
   return address;
 }
@@ -125,8 +125,8 @@ Listener::~Listener() {
 Listener Listener::onPort(const std::string& address, bool anyone) {
   const Addresses found = lookUp(address);
   if (!anyone && !isLoopback(found->ai_addr))
-    throw CLI::ValidationError("other machines can reach " + address +
-                               ", without a password and unencrypted: use ssh -L, or say --anyone");
+    throw UsageError("other machines can reach " + address +
+                     ", without a password and unencrypted: use ssh -L, or say --anyone");
   Descriptor socket(
       ::socket(found->ai_family, SOCK_STREAM | SOCK_NONBLOCK | SOCK_CLOEXEC, IPPROTO_TCP));
   const int on = 1;

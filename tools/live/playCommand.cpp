@@ -133,20 +133,20 @@ int play(const PlayOptions& options) {
 
 void addPlayCommand(Commands& commands) {
   auto options = std::make_shared<PlayOptions>();
-  CLI::App* command = commands.add("play", "Shows what `serve --record` has written.",
-                                   [options] { return play(*options); });
-  command->add_option("FILE", options->input, "a recording")->required();
+  Command command = commands.add("play", "Shows what `serve --record` has written.",
+                                 [options] { return play(*options); });
+  command.add("FILE", options->input, "a recording").required();
   command
-      ->add_option("OUT", options->output,
-                   "a PNG or BMP picture, or - for frames of 32 bits a pixel on standard output")
-      ->required();
-  command->add_option("--at", options->at, "seconds after the start; without it, the end")
-      ->check(finiteNumber(0, 1e9))
-      ->type_name("SECONDS");
-  command->add_option("--rate", options->rate, "frames a second")
-      ->check(count(1, 1000))
-      ->type_name("FPS")
-      ->capture_default_str();
+      .add("OUT", options->output,
+           "a PNG or BMP picture, or - for frames of 32 bits a pixel on standard output")
+      .required();
+  command.add("--at", options->at, "seconds after the start; without it, the end")
+      .check(finiteNumber(0, 1e9))
+      .form("SECONDS");
+  command.add("--rate", options->rate, "frames a second")
+      .check(count(1, 1000))
+      .form("FPS")
+      .withDefault();
 }
 
 }  // namespace tool

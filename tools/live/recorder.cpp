@@ -8,7 +8,7 @@
 #include <cerrno>
 #include <cstring>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool::live {
 

@@ -9,7 +9,7 @@
 #include <array>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 #include "geometry.h"
 #include "raster.h"
 #include "rectLists.h"

@@ -9,7 +9,7 @@
 #include <cstdio>
 #include <utility>
 
-#include "commands.h"
+#include "failure.h"
 #include "drawnCursor.h"
 #include "inputPlayer.h"
 

@@ -6,7 +6,7 @@
 
 #include <csignal>
 
-#include "commands.h"
+#include "failure.h"
 
 namespace tool::live {
 
