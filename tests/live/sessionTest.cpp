@@ -7,10 +7,13 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <list>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
+#include "drawnCursor.h"
 #include "support/random.h"
 
 namespace {
@@ -21,6 +24,9 @@ using tool::live::bigEndian16;
 using tool::live::bigEndian32;
 using tool::live::Bytes;
 using tool::live::ChangeList;
+using tool::live::Changes;
+using tool::live::DrawnCursor;
+using tool::live::Move;
 using tool::live::PixelFormat;
 using tool::live::PixelView;
 using tool::live::Scene;
@@ -86,6 +92,13 @@ class Viewer {
     return say(messages);
   }
 
+  void lose(const Rect& area) {
+    const size_t bytes = format.bitsPerPixel / 8;
+    for (auto y = static_cast<size_t>(area.top); y < static_cast<size_t>(area.bottom); ++y)
+      memset(picture.data() + (y * kWidth + static_cast<size_t>(area.left)) * bytes, 0xA7,
+             static_cast<size_t>(area.right - area.left) * bytes);
+  }
+
   /// Takes an update, if there is one.
   bool update(const Scene& scene) {
     Bytes out;
@@ -103,6 +116,7 @@ class Viewer {
   std::vector<Rect> drawn;
   std::vector<int32> others;
   bool gotColorMap = false;
+  bool moves = true;  // whether it says that it can
 
  private:
   void take(const Bytes& out) {
@@ -132,12 +146,29 @@ class Viewer {
     if (encoding != 0) others.push_back(encoding);
     if (encoding == -239) return at + size_t{width} * height * bytes + (width + 7) / 8 * height;
     if (encoding == -314) return at + 4 + size_t{width} * height * 4;
+    if (encoding == 1) return move(at, {x, y, width, height});
     if (encoding != 0) return at;
     drawn.push_back({static_cast<int32>(x), static_cast<int32>(y), static_cast<int32>(x + width),
                      static_cast<int32>(y + height)});
     for (uint32 row = 0; row < height; ++row, at += size_t{width} * bytes)
       memcpy(picture.data() + (size_t{y + row} * kWidth + x) * bytes, at, size_t{width} * bytes);
     return at;
+  }
+
+  struct Box {
+    uint32 x, y, width, height;
+  };
+  const uint8* move(const uint8* at, const Box& to) {
+    const size_t bytes = format.bitsPerPixel / 8;
+    const size_t fromX = bigEndian16(at);
+    const size_t fromY = bigEndian16(at + 2);
+    EXPECT_TRUE(moves);
+    EXPECT_TRUE(fromX + to.width <= kWidth && fromY + to.height <= kHeight);
+    const std::vector<uint8> before = picture;
+    for (size_t row = 0; row < to.height; ++row)
+      memcpy(picture.data() + ((to.y + row) * kWidth + to.x) * bytes,
+             before.data() + ((fromY + row) * kWidth + fromX) * bytes, to.width * bytes);
+    return at + 4;
   }
 
   Bytes answers;
@@ -151,22 +182,51 @@ class Screen {
   PixelView view() const { return {pixels.data(), 4 * kWidth, kWidth, kHeight}; }
   Scene scene() const { return {view(), nullptr, 0, {}, {-1, -1}}; }
 
-  ChangeList change() {
-    ChangeList changed(kWidth, kHeight);
+  Changes change() {
+    Changes changed(kWidth, kHeight);
     for (uint32 i = random.below(5); i != 0; --i) {
       const int32 x = random.between(0, kWidth - 1);
       const int32 y = random.between(0, kHeight - 1);
       const Rect rect = {x, y, random.between(x + 1, kWidth), random.between(y + 1, kHeight)};
       for (int32 row = rect.top; row < rect.bottom; ++row)
         for (int32 column = rect.left; column < rect.right; ++column)
-          pixels[static_cast<size_t>((row * static_cast<int32>(kWidth) + column) * 4)] ^= 0x5A;
-      changed.add(rect);
+          pixels[byteOf(column, row)] ^= 0x5A;
+      changed.all.add(rect);
     }
+    return changed;
+  }
+
+  /// Something goes up or down, and what it uncovers is new. Elsewhere something else changes.
+  Changes scroll() {
+    const std::vector<uint8> before = pixels;
+    Changes changed = change();
+    const int32 x = random.between(0, kWidth - 1);
+    const int32 y = random.between(0, kHeight - 2);
+    const Rect page = {x, y, random.between(x + 1, kWidth), random.between(y + 2, kHeight)};
+    const int32 most = page.bottom - page.top - 1;
+    const int32 down = random.below(2) == 0 ? random.between(1, most) : -random.between(1, most);
+    Move move = {{page.left, page.top + down, page.right, page.bottom + down}, down};
+    Rect_Intersect(&move.to, &move.to, &page);
+    for (int32 row = page.top; row < page.bottom; ++row)
+      for (int32 column = page.left; column < page.right; ++column) {
+        const bool isMoved = row >= move.to.top && row < move.to.bottom;
+        for (int32 byte = 0; byte < 4; ++byte)
+          pixels[byteOf(column, row) + static_cast<size_t>(byte)] =
+              isMoved ? before[byteOf(column, row - down) + static_cast<size_t>(byte)]
+                      : static_cast<uint8>(random.word());
+      }
+    changed.all.add(page);
+    changed.moves.push_back(move);
     return changed;
   }
 
   Random random;
   std::vector<uint8> pixels;
+
+ private:
+  static size_t byteOf(int32 x, int32 y) {
+    return static_cast<size_t>((y * static_cast<int32>(kWidth) + x) * 4);
+  }
 };
 
 std::vector<uint8> expectedPicture(const Screen& screen, const PixelFormat& wanted) {
@@ -183,6 +243,8 @@ void expectSeesScreen(const Viewer& viewer, const Screen& screen) {
 }
 
 constexpr Rect kWhole = {0, 0, kWidth, kHeight};
+
+LiveCursor someCursor() { return {{0, 0}, {1, 2}, 9, 5, std::vector<uint32>(45, 0xFF00FF00)}; }
 
 TEST(Session, SaysNothingUnasked) {
   Screen screen(1);
@@ -217,6 +279,143 @@ TEST(Session, KeepsUpWithChangesAndFormats) {
     expectSeesScreen(viewer, screen);
     if (HasFatalFailure()) return;
   }
+}
+
+/// A viewer that may understand moves, that draws the cursor or has it drawn, and that asks when it
+/// likes, for what it likes.
+struct Reader {
+  Reader(Random& chosen, bool drawsCursor) : random(chosen), ownCursor(drawsCursor) {
+    const auto wanted = random.oneOf({kStandard, kSixteen, kEight});
+    EXPECT_TRUE(viewer.say(Messages().format(wanted), wanted));
+    setEncodings();
+  }
+
+  void setEncodings() {
+    std::vector<int32> list = {0};
+    viewer.moves = random.below(4) != 0;
+    if (viewer.moves) list.push_back(1);
+    if (ownCursor) list.push_back(-239);
+    ASSERT_TRUE(viewer.say(Messages().encodings(list)));
+  }
+  /// What it does not ask for incrementally it has lost.
+  void ask() {
+    Rect area = kWhole;
+    if (random.below(4) == 0) area = {0, 0, random.between(1, kWidth), random.between(1, kHeight)};
+    bool incremental = random.below(10) != 0;
+    if (random.below(30) == 0) {
+      const auto wanted = random.oneOf({kStandard, kSixteen, kEight});
+      ASSERT_TRUE(viewer.say(Messages().format(wanted), wanted));
+      area = kWhole;
+      incremental = false;
+    }
+    if (random.below(30) == 0) setEncodings();
+    if (!incremental) viewer.lose(area);
+    ASSERT_TRUE(viewer.say(Messages().request(incremental, area)));
+    Rect_Union(&asked, &area);
+  }
+  /// Whether it then has the whole picture.
+  bool update(const Scene& scene) {
+    viewer.update(scene);
+    const bool hasAll = Rect_IsEqual(&asked, &kWhole);
+    if (!viewer.session.isWaiting()) asked = {};
+    return hasAll;
+  }
+
+  Random& random;
+  bool ownCursor;
+  Viewer viewer;
+  Rect asked = {};
+};
+
+TEST(Session, MovesWhatEachViewerHas) {
+  Screen screen(10);
+  const LiveCursor cursor = someCursor();
+  std::list<Reader> readers;
+  for (int i = 0; i < 6; ++i) readers.emplace_back(screen.random, i % 2 == 0);
+  Point pointer = {20, 20};
+  for (int round = 0; round < tests::rounds(2000); ++round) {
+    const Changes changes = screen.random.below(3) == 0 ? screen.change() : screen.scroll();
+    for (Reader& reader : readers) reader.viewer.session.addChanges(changes);
+    if (screen.random.below(4) == 0)
+      pointer = {screen.random.between(0, kWidth - 1), screen.random.between(0, kHeight - 1)};
+    uint32 pace = 1;
+    for (Reader& reader : readers) {
+      pace = pace * 3 / 2 + 1;
+      if (screen.random.below(pace) != 0) continue;
+      do {
+        reader.ask();
+      } while (screen.random.below(4) == 0);
+      Scene scene = screen.scene();
+      scene.cursor = &cursor;
+      scene.cursorSerial = 1;
+      scene.cursorBox = tool::live::cursorBox(cursor, pointer, kWidth, kHeight);
+      std::optional<DrawnCursor> drawn;
+      if (!reader.ownCursor)
+        drawn.emplace(screen.pixels.data(), 4 * kWidth, kWidth, kHeight, cursor, pointer);
+      if (reader.update(scene)) expectSeesScreen(reader.viewer, screen);
+      if (HasFailure()) return;
+    }
+  }
+  uint64 moved = 0;
+  for (const Reader& reader : readers) moved += reader.viewer.session.movedPixels();
+  EXPECT_GT(moved, 100000u);
+}
+
+/// A viewer that has the picture, of which all but the last ten rows then goes up by ten rows.
+struct Scrolled {
+  explicit Scrolled(bool understands) : screen(11) {
+    viewer.moves = understands;
+    const std::vector<int32> list = understands ? std::vector<int32>{0, 1} : std::vector<int32>{0};
+    EXPECT_TRUE(viewer.say(Messages().encodings(list).request(false, kWhole)));
+    EXPECT_TRUE(viewer.update(screen.scene()));
+    Changes changes(kWidth, kHeight);
+    changes.all.addAll();
+    changes.moves.push_back({{0, 0, kWidth, kHeight - 10}, -10});
+    screen.pixels.erase(screen.pixels.begin(), screen.pixels.begin() + 10 * 4 * kWidth);
+    screen.pixels.resize(size_t{4} * kWidth * kHeight, 7);
+    viewer.session.addChanges(changes);
+  }
+
+  Screen screen;
+  Viewer viewer;
+};
+
+TEST(Session, LeavesAMoveToThoseWhoCan) {
+  for (const bool understands : {false, true}) {
+    Scrolled scrolled(understands);
+    Viewer& viewer = scrolled.viewer;
+    EXPECT_EQ(viewer.session.takesMoves(), understands);
+    ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+    ASSERT_TRUE(viewer.update(scrolled.screen.scene()));
+    expectSeesScreen(viewer, scrolled.screen);
+    ASSERT_EQ(viewer.drawn.size(), 1u);
+    EXPECT_EQ(viewer.drawn[0].top, understands ? 80 : 0);
+    EXPECT_EQ(viewer.others, understands ? std::vector<int32>{1} : std::vector<int32>{});
+  }
+}
+
+TEST(Session, MovesNothingBeyondWhatWasAskedFor) {
+  for (const Rect& part : {Rect{0, 0, 40, kHeight}, Rect{0, 0, kWidth, kHeight - 10}}) {
+    Scrolled scrolled(true);
+    Viewer& viewer = scrolled.viewer;
+    ASSERT_TRUE(viewer.say(Messages().request(true, part)));
+    ASSERT_TRUE(viewer.update(scrolled.screen.scene()));
+    EXPECT_TRUE(viewer.others.empty());
+    for (const Rect& rect : viewer.drawn) EXPECT_TRUE(Rect_ContainsRect(&part, &rect));
+    ASSERT_TRUE(viewer.say(Messages().request(true, kWhole)));
+    ASSERT_TRUE(viewer.update(scrolled.screen.scene()));
+    expectSeesScreen(viewer, scrolled.screen);
+  }
+}
+
+TEST(Session, MovesNothingThatTheViewerHasLost) {
+  Scrolled scrolled(true);
+  Viewer& viewer = scrolled.viewer;
+  const Rect lost = {20, 40, 60, 60};
+  viewer.lose(lost);
+  ASSERT_TRUE(viewer.say(Messages().request(true, kWhole).request(false, lost)));
+  ASSERT_TRUE(viewer.update(scrolled.screen.scene()));
+  expectSeesScreen(viewer, scrolled.screen);
 }
 
 TEST(Session, SendsWhatWasAskedForAndKeepsTheRest) {
@@ -272,8 +471,6 @@ TEST(Session, CannotTellANewSizeToEveryViewer) {
   ASSERT_TRUE(viewer.say(Messages().encodings({0})));
   EXPECT_FALSE(viewer.session.resize(50, 60));
 }
-
-LiveCursor someCursor() { return {{0, 0}, {1, 2}, 9, 5, std::vector<uint32>(45, 0xFF00FF00)}; }
 
 TEST(Session, SendsACursorWheneverItIsAnotherOne) {
   Screen screen(6);

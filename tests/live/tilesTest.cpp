@@ -18,8 +18,9 @@ namespace {
 using tests::GuardedBuffer;
 using tests::Random;
 using tool::live::ChangeList;
+using tool::live::findChanges;
 using tool::live::PixelView;
-using tool::live::takeChanges;
+using tool::live::takeOver;
 using tool::live::TileCount;
 
 constexpr uint32 kWidth = 143;
@@ -50,11 +51,12 @@ TEST(Tiles, TakesOverWhatDiffersWithinTheDamage) {
     }
     for (int i = 0; i < 100; ++i) now.data()[random.below(kSize)] ^= 0x10;
     const std::vector<uint8> before = seen.bytes();
-    ChangeList changed(kWidth, kHeight);
+    std::vector<Rect> told;
     const PixelView view = {now.data(), kPitch, kWidth, kHeight};
-    takeChanges(view, seen.data(), kPitch, damage, changed);
+    findChanges(view, {seen.data(), kPitch, kWidth, kHeight}, damage, told);
+    ASSERT_EQ(seen.bytes(), before);
+    takeOver(view, seen.data(), kPitch, told);
     const std::vector<Rect> damaged = damage.all();
-    const std::vector<Rect> told = changed.all();
     for (int32 y = 0; y < static_cast<int32>(kHeight); ++y) {
       for (int32 x = 0; x < static_cast<int32>(kWidth); ++x) {
         const size_t at = (static_cast<size_t>(y) * kWidth + static_cast<size_t>(x)) * 4;
@@ -74,12 +76,12 @@ TEST(Tiles, TellsTilesOnlyThatDiffer) {
   now[kPitch * 20 + 4 * 40] = 1;
   ChangeList damage(kWidth, kHeight);
   damage.addAll();
-  ChangeList changed(kWidth, kHeight);
-  const TileCount count =
-      takeChanges({now.data(), kPitch, kWidth, kHeight}, seen.data(), kPitch, damage, changed);
+  std::vector<Rect> runs;
+  const TileCount count = findChanges({now.data(), kPitch, kWidth, kHeight},
+                                      {seen.data(), kPitch, kWidth, kHeight}, damage, runs);
   EXPECT_EQ(count.equal + 1, count.compared);
-  ASSERT_EQ(changed.all().size(), 1u);
-  const Rect rect = changed.all()[0];
+  ASSERT_EQ(runs.size(), 1u);
+  const Rect rect = runs[0];
   const Point differs = {40, 20};
   EXPECT_TRUE(Rect_ContainsPoint(&rect, &differs));
   EXPECT_LE(rect.right - rect.left, 64);
@@ -92,12 +94,12 @@ TEST(Tiles, CountsNoTopBytes) {
   for (size_t i = 3; i < kSize; i += 4) now[i] = 0xFF;
   ChangeList damage(kWidth, kHeight);
   damage.addAll();
-  ChangeList changed(kWidth, kHeight);
-  const TileCount count =
-      takeChanges({now.data(), kPitch, kWidth, kHeight}, seen.data(), kPitch, damage, changed);
+  std::vector<Rect> runs;
+  const TileCount count = findChanges({now.data(), kPitch, kWidth, kHeight},
+                                      {seen.data(), kPitch, kWidth, kHeight}, damage, runs);
   EXPECT_EQ(count.equal, count.compared);
   EXPECT_GT(count.compared, 0u);
-  EXPECT_TRUE(changed.isEmpty());
+  EXPECT_TRUE(runs.empty());
 }
 
 }  // namespace

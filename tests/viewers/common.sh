@@ -71,6 +71,14 @@ change() {
   xsetroot -mod $((3 + changes % 9)) $((5 + changes % 7)) -fg '#1050a0' -bg '#f0c040'
 }
 
+# scrollSlowly: a terminal that prints line by line, and then stands still.
+scrollSlowly() {
+  rm -f scrolled
+  start xterm +j -geometry 90x30+80+40 -bg '#101418' -fg '#d0e0d0' -e sh -c 'ls -l /usr/bin | head -90 |
+    while read -r line; do echo "$line"; sleep 0.04; done; echo done >scrolled; exec sleep 86400'
+  waitFor [ -s scrolled ]
+}
+
 # startServing OPTION...: the live screen of $DISPLAY; $address is where, $serving its process.
 startServing() {
   rm -f serve.out serve.err

@@ -29,6 +29,14 @@ window() {
   change
   # shellcheck disable=SC2086
   sees "$name, after a change" "$differences" "$DISPLAY" "$other" --at 20,30 $options
+  if have xterm; then
+    scrolling=$started
+    scrollSlowly
+    # shellcheck disable=SC2086
+    sees "$name, after scrolling" "$differences" "$DISPLAY" "$other" --at 20,30 $options
+    stop "$started"
+    started=$scrolling
+  fi
   stop "$started"
 }
 

@@ -144,16 +144,20 @@ LiveScreen::Clock::time_point LiveScreen::captureTime() const {
 
 void LiveScreen::rest(Clock::time_point captured) { pace.captured(captured, cpuTime()); }
 
-void LiveScreen::capture(Clock::time_point now, ChangeList& changed) {
+void LiveScreen::capture(Clock::time_point now, Changes& changes) {
   if (!watch.tellsDamage() || watch.refreshPalette()) damage.addAll();
   const std::optional<PixelView> captured = watch.capture(damage);
   if (!captured) return;
-  ChangeList differing(watch.width(), watch.height());
-  const TileCount count = takeChanges(*captured, seen.data(), seen.pitch(), damage, differing);
+  std::vector<Rect> runs;
+  const TileCount count = findChanges(*captured, seenPicture(), damage, runs);
   tileCount.compared += count.compared;
   tileCount.equal += count.equal;
+  if (seeksMoves) changes.moves = findMoves(*captured, seenPicture(), runs, damage);
+  takeOver(*captured, seen.data(), seen.pitch(), runs);
   damage.clear();
-  show(differing, now, changed);
+  ChangeList differing(watch.width(), watch.height());
+  for (const Rect& run : runs) differing.add(run);
+  show(differing, now, changes.all);
   isCaptured = true;
 }
 

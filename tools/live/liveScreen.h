@@ -9,6 +9,7 @@
 #include <chrono>
 #include <optional>
 
+#include "moves.h"
 #include "pace.h"
 #include "scaledPicture.h"
 #include "screenWatch.h"
@@ -35,6 +36,9 @@ class LiveScreen {
   /// Whether anybody needs to know where the pointer is.
   void followPointer(bool wanted);
 
+  /// Whether anybody can move what has only gone up or down.
+  void seekMoves(bool wanted) { seeksMoves = wanted && !scaled && !tinted; }
+
   /// Listens to the display without waiting. True when the picture has another size now.
   bool listen(Clock::time_point now);
   /// Whether the display said anything when it was last listened to.
@@ -48,8 +52,8 @@ class LiveScreen {
   Clock::time_point captureTime() const;
   /// No capture is due before that, and so what the display says may wait.
   Clock::time_point restsUntil() const { return pace.restsUntil(); }
-  /// Brings the picture up to date and adds to `changed` what of it is another one.
-  void capture(Clock::time_point now, ChangeList& changed);
+  /// Brings the picture up to date and adds to `changes` what of it is another one.
+  void capture(Clock::time_point now, Changes& changes);
   /// What came of a capture has been sent to the viewers that waited.
   void rest(Clock::time_point captured);
 
@@ -92,6 +96,7 @@ class LiveScreen {
   uint32 cursorSerial = 0;
   Point pointer = {-1, -1};
   bool followsPointer = false;
+  bool seeksMoves = false;
   bool isWatched = false;
   bool isCaptured = false;
   bool heard = false;

@@ -33,7 +33,7 @@ unsigned long long shown(uint64 number) { return number; }
 
 Server::Server(const ServeOptions& chosen)
     : options(chosen), listener(listenerFor(chosen)), screen(chosen) {
-  changed = ChangeList(screen.width(), screen.height());
+  changed = Changes(screen.width(), screen.height());
   if (!options.recording.empty())
     recorder.emplace(options.recording, screen.width(), screen.height());
   if (options.input) InputPlayer(screen).pointer(0, {-1, -1});  // fails now when it cannot be
@@ -58,6 +58,7 @@ void Server::printStatistics() const {
          shown(screen.tiles().equal));
   printf("sent %llu pixels, %llu bytes, to %llu viewers\n", shown(sentPixels), shown(sentBytes),
          shown(viewerCount));
+  printf("moved %llu pixels at the viewers\n", shown(movedPixels));
   fflush(stdout);
 }
 
@@ -91,17 +92,16 @@ bool Server::turn() {
 /// Does for the screen and the viewers what is due.
 void Server::attend(Clock::time_point now) {
   // Before it is listened to: what waits for an answer of the display may take in other news.
-  screen.followPointer(std::any_of(viewers.begin(), viewers.end(), [](const Connection& viewer) {
-    return viewer.viewer().needsPointer();
-  }));
+  screen.followPointer(isAnyViewer(&Session::needsPointer));
   if (now >= nextListening) listenToScreen(now);
   if (!isWatched()) return;
   const bool captures = isCapturePending() && now >= screen.captureTime();
   if (captures) {
     listenToScreen(now);
+    screen.seekMoves(isAnyViewer(&Session::takesMoves));
     screen.capture(now, changed);
   }
-  screen.expire(now, changed);
+  screen.expire(now, changed.all);
   tellChanges();
   if (screen.hasPicture()) update();
   if (!captures) return;
@@ -139,6 +139,7 @@ template <class Condition> void Server::dropIf(Condition isGone) {
 void Server::retire(Connection& viewer) {
   sentPixels += viewer.viewer().sentPixels();
   sentBytes += viewer.sentBytes();
+  movedPixels += viewer.viewer().movedPixels();
 }
 
 void Server::admit() {
@@ -155,7 +156,7 @@ void Server::admit() {
 
 void Server::listenToScreen(Clock::time_point now) {
   if (screen.listen(now)) {
-    changed = ChangeList(screen.width(), screen.height());
+    changed = Changes(screen.width(), screen.height());
     if (recorder) recorder->resize(now, screen.width(), screen.height());
     dropIf([&](Connection& viewer) {
       return !viewer.viewer().resize(screen.width(), screen.height()) &&
@@ -167,10 +168,15 @@ void Server::listenToScreen(Clock::time_point now) {
 }
 
 void Server::tellChanges() {
-  if (changed.isEmpty()) return;
+  if (changed.all.isEmpty()) return;
   for (Connection& viewer : viewers) viewer.viewer().addChanges(changed);
-  if (recorder) recorder->record(Clock::now(), screen.scene().pixels, changed);
+  if (recorder) recorder->record(Clock::now(), screen.scene().pixels, changed.all);
   changed.clear();
+}
+
+bool Server::isAnyViewer(bool (Session::*is)() const) const {
+  return std::any_of(viewers.begin(), viewers.end(),
+                     [is](const Connection& viewer) { return (viewer.viewer().*is)(); });
 }
 
 bool Server::isAnyoneReady() const {

@@ -41,6 +41,7 @@ class Server {
   bool isWatched() const { return recorder.has_value() || !viewers.empty(); }
   void listenToScreen(Clock::time_point now);
   void tellChanges();
+  bool isAnyViewer(bool (Session::*is)() const) const;
   bool isAnyoneReady() const;
   bool isCapturePending() const { return screen.needsCapture() && isAnyoneReady(); }
   /// Whether one comes that needs no news of the display.
@@ -54,11 +55,12 @@ class Server {
   LiveScreen screen;
   std::optional<Recorder> recorder;
   std::list<Connection> viewers;
-  ChangeList changed;
+  Changes changed;
   Clock::time_point nextListening;
   uint64 viewerCount = 0;
   uint64 sentPixels = 0;
   uint64 sentBytes = 0;
+  uint64 movedPixels = 0;
 };
 
 }  // namespace tool::live

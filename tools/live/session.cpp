@@ -23,14 +23,19 @@ size_t beginUpdate(Bytes& out) {
 }  // namespace
 
 Session::Session(uint32 width, uint32 height, std::string name, InputSink* input)
-    : title(std::move(name)), sink(input), changes(width, height), everShown(changes.bounds()) {
-  changes.addAll();
+    : title(std::move(name)), sink(input), owed(width, height), everShown(owed.bounds()) {}
+
+void Session::addChanges(const Changes& changes) {
+  if (takesMoves()) {
+    owed.add(changes, drawnBox);
+  } else {
+    owed.add(changes.all);
+  }
 }
 
 bool Session::resize(uint32 width, uint32 height) {
-  changes = ChangeList(width, height);
-  changes.addAll();
-  const Rect now = changes.bounds();
+  owed = Owed(width, height);
+  const Rect now = owed.bounds();
   Rect_Union(&everShown, &now);
   drawnBox = {};
   owesSize = isStarted;
@@ -39,7 +44,7 @@ bool Session::resize(uint32 width, uint32 height) {
 
 void Session::onStart(Bytes& out) {
   isStarted = true;
-  const Rect area = changes.bounds();
+  const Rect area = owed.bounds();
   out.put16(widthOf(area));
   out.put16(heightOf(area));
   putPixelFormat(out, standardFormat());
@@ -59,6 +64,9 @@ void Session::onEncoding(int32 encoding) {
     case kZrle:
     case kTightPng:
       if (!std::exchange(understood.choseOne, true)) understood.pixels = encoding;
+      break;
+    case kCopyRect:
+      understood.copyRect = true;
       break;
     case kDesktopSize:
       understood.desktopSize = true;
@@ -83,7 +91,9 @@ bool Session::onRequest(const UpdateRequest& request) {
   if (isEmpty(request.area) || !Rect_ContainsRect(&everShown, &request.area)) return false;
   if (!asked) asked.emplace();
   Rect_Union(&*asked, &request.area);
-  if (!request.incremental) changes.add(request.area);
+  if (request.incremental) return true;
+  owed.forgetMoves();
+  owed.add(request.area);
   return true;
 }
 
@@ -100,8 +110,8 @@ void Session::onPointer(uint32 buttons, const Point& at) {
 void Session::followDrawnCursor(const Scene& scene) {
   const Rect box = needsDrawnCursor() && scene.cursor != nullptr ? scene.cursorBox : Rect{};
   if (Rect_IsEqual(&box, &drawnBox) && drawnSerial == scene.cursorSerial) return;
-  changes.add(drawnBox);
-  changes.add(box);
+  owed.add(drawnBox);
+  owed.add(box);
   drawnBox = box;
   drawnSerial = scene.cursorSerial;
 }
@@ -109,7 +119,7 @@ void Session::followDrawnCursor(const Scene& scene) {
 /// An update of its own: what the viewer asked for was of the old size.
 void Session::putNewSize(Bytes& out) {
   const size_t count = beginUpdate(out);
-  const Rect area = changes.bounds();
+  const Rect area = owed.bounds();
   putRectHeader(out, area, kDesktopSize);
   storeBigEndian16(out.data() + count, 1);
   owesSize = false;
@@ -128,7 +138,7 @@ uint32 Session::putCursorRects(const Scene& scene, Bytes& out) {
     ++rects;
   }
   const bool hasMoved = scene.pointer.x != sentPointer.x || scene.pointer.y != sentPointer.y;
-  const Rect area = changes.bounds();
+  const Rect area = owed.bounds();
   if (understood.pointerPosition && hasMoved && Rect_ContainsPoint(&area, &scene.pointer)) {
     putRectHeader(out, static_cast<uint32>(scene.pointer.x), static_cast<uint32>(scene.pointer.y),
                   0, 0, kPointerPosition);
@@ -149,6 +159,20 @@ void Session::putOne(const PixelView& pixels, const Rect& rect, Bytes& out) {
     uint8* rows = out.extend(size_t{pitch} * heightOf(rect));
     format.convert(rows, pitch, pixels, rect);
   }
+}
+
+/// Returns the number of rectangles.
+uint32 Session::putMoves(Bytes& out) {
+  if (!takesMoves()) owed.forgetMoves();
+  const std::vector<Move> moves = owed.takeMoves(*asked);
+  for (const Move& move : moves) {
+    const Rect from = move.from();
+    putRectHeader(out, move.to, kCopyRect);
+    out.put16(static_cast<uint32>(from.left));
+    out.put16(static_cast<uint32>(from.top));
+    pixelsMoved += areaOf(move.to);
+  }
+  return static_cast<uint32>(moves.size());
 }
 
 /// Cuts a rectangle into bands where it is too large for one, and returns their number.
@@ -172,15 +196,15 @@ bool Session::putUpdate(const Scene& scene, Bytes& out) {
   const size_t before = out.size();
   if (owesColorMap) ViewerFormat::putColorMap(out);
   const size_t count = beginUpdate(out);
-  uint32 rects = putCursorRects(scene, out);
-  for (const Rect& rect : changes.within(*asked)) rects += putPixels(scene.pixels, rect, out);
+  uint32 rects = putCursorRects(scene, out) + putMoves(out);
+  for (const Rect& rect : owed.pixelsWithin(*asked)) rects += putPixels(scene.pixels, rect, out);
   if (rects == 0) {
     out.truncate(before);
     return false;
   }
   storeBigEndian16(out.data() + count, rects);
   owesColorMap = false;
-  changes.subtract(*asked);
+  owed.subtractPixels(*asked);
   asked.reset();
   return true;
 }

@@ -9,9 +9,9 @@
 #include <optional>
 #include <string>
 
-#include "changeList.h"
 #include "encodings.h"
 #include "liveCursor.h"
+#include "owed.h"
 #include "pixelView.h"
 #include "pngEncoder.h"
 #include "protocol.h"
@@ -56,7 +56,9 @@ class Session : private ProtocolEvents {
   bool needsDrawnCursor() const { return !drawsCursor(); }
   bool needsPointer() const { return needsDrawnCursor() || understood.pointerPosition; }
 
-  void addChanges(const ChangeList& changed) { changes.add(changed); }
+  /// Whether it can move what it has.
+  bool takesMoves() const { return understood.copyRect; }
+  void addChanges(const Changes& changes);
   /// The picture has another size from now on. False when the viewer cannot be told.
   bool resize(uint32 width, uint32 height);
 
@@ -64,12 +66,14 @@ class Session : private ProtocolEvents {
   bool putUpdate(const Scene& scene, Bytes& out);
 
   uint64 sentPixels() const { return pixelsSent; }
+  uint64 movedPixels() const { return pixelsMoved; }
 
  private:
   /// What the viewer says it understands.
   struct Understood {
     int32 pixels = kRaw;  // the first one of its list that is known here
     bool choseOne = false;
+    bool copyRect = false;
     bool desktopSize = false;
     bool cursor = false;
     bool cursorWithAlpha = false;
@@ -89,6 +93,7 @@ class Session : private ProtocolEvents {
   void followDrawnCursor(const Scene& scene);
   void putNewSize(Bytes& out);
   uint32 putCursorRects(const Scene& scene, Bytes& out);
+  uint32 putMoves(Bytes& out);
   uint32 putPixels(const PixelView& pixels, const Rect& rect, Bytes& out);
   void putOne(const PixelView& pixels, const Rect& rect, Bytes& out);
 
@@ -102,7 +107,7 @@ class Session : private ProtocolEvents {
   bool isStarted = false;  // it knows the picture's size
   bool owesColorMap = false;
   bool owesSize = false;
-  ChangeList changes;
+  Owed owed;
   Rect everShown;  // all sizes that the viewer may still take for the picture's
   std::optional<Rect> asked;
   uint32 sentCursor = 0;
@@ -110,6 +115,7 @@ class Session : private ProtocolEvents {
   Rect drawnBox = {};
   uint32 drawnSerial = 0;
   uint64 pixelsSent = 0;
+  uint64 pixelsMoved = 0;
 };
 
 }  // namespace tool::live

@@ -24,65 +24,67 @@ template <class Body> void forSteps(int32 from, int32 end, int32 step, Body body
   }
 }
 
-class Taking {
+class Finding {
  public:
-  Taking(const PixelView& captured, uint8* target, uint32 targetPitch, ChangeList& told)
-      : now(captured), seen(target), pitch(targetPitch), changed(told) {}
+  Finding(const PixelView& captured, const PixelView& earlier, std::vector<Rect>& found)
+      : now(captured), seen(earlier), runs(found) {}
 
-  void take(const Rect& rect) {
+  void find(const Rect& rect) {
     forSteps(rect.top, rect.bottom, kTileHeight, [&](int32 top, int32 bottom) {
-      takeBand({rect.left, top, rect.right, bottom});
+      findInBand({rect.left, top, rect.right, bottom});
     });
   }
   const TileCount& tiles() const { return count; }
 
  private:
-  /// One call finds a band equal, or stops at its first row that is not. Tiles that differ side by
-  /// side are copied together, while the inner cache has them.
-  void takeBand(const Rect& band) {
+  /// One call finds a band equal, or stops at its first row that is not.
+  void findInBand(const Rect& band) {
     const bool isEqual = equals(band);
     int32 differs = band.left;  // from here to the tile in question, all of them do
     forSteps(band.left, band.right, kTileWidth, [&](int32 left, int32 right) {
       ++count.compared;
       if (!isEqual && !equals({left, band.top, right, band.bottom})) return;
       ++count.equal;
-      takeRun({differs, band.top, left, band.bottom});
+      add({differs, band.top, left, band.bottom});
       differs = right;
     });
-    takeRun({differs, band.top, band.right, band.bottom});
+    add({differs, band.top, band.right, band.bottom});
   }
 
   bool equals(const Rect& part) const {
     const auto x = static_cast<uint32>(part.left);
     const auto y = static_cast<uint32>(part.top);
-    return Raster_ComparePixels(now.data, now.pitch, kPixelBits, seen, pitch, kPixelBits, x, y, x,
-                                y, widthOf(part), heightOf(part)) == 0;
+    return Raster_ComparePixels(now.data, now.pitch, kPixelBits, seen.data, seen.pitch, kPixelBits,
+                                x, y, x, y, widthOf(part), heightOf(part)) == 0;
   }
 
-  void takeRun(const Rect& run) {
-    if (isEmpty(run)) return;
-    const auto x = static_cast<uint32>(run.left);
-    const auto y = static_cast<uint32>(run.top);
-    Raster_RectCopy(seen, pitch, now.data, now.pitch, kPixelBytes, x, y, x, y, widthOf(run),
-                    heightOf(run));
-    changed.add(run);
+  void add(const Rect& run) {
+    if (!isEmpty(run)) runs.push_back(run);
   }
 
   const PixelView& now;
-  uint8* seen;
-  uint32 pitch;
-  ChangeList& changed;
+  const PixelView& seen;
+  std::vector<Rect>& runs;
   TileCount count;
 };
 
 }  // namespace
 
-TileCount takeChanges(const PixelView& now, uint8* seen, uint32 seenPitch, const ChangeList& damage,
-                      ChangeList& changed) {
-  Taking taking(now, seen, seenPitch, changed);
+TileCount findChanges(const PixelView& now, const PixelView& seen, const ChangeList& damage,
+                      std::vector<Rect>& runs) {
+  Finding finding(now, seen, runs);
   for (const RectList& list : damage.lists())
-    for (const Rect& rect : rectsOf(list)) taking.take(rect);
-  return taking.tiles();
+    for (const Rect& rect : rectsOf(list)) finding.find(rect);
+  return finding.tiles();
+}
+
+void takeOver(const PixelView& now, uint8* seen, uint32 seenPitch, const std::vector<Rect>& runs) {
+  for (const Rect& run : runs) {
+    const auto x = static_cast<uint32>(run.left);
+    const auto y = static_cast<uint32>(run.top);
+    Raster_RectCopy(seen, seenPitch, now.data, now.pitch, kPixelBytes, x, y, x, y, widthOf(run),
+                    heightOf(run));
+  }
 }
 
 }  // namespace tool::live

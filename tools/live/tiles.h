@@ -15,11 +15,14 @@ struct TileCount {
   uint64 equal = 0;
 };
 
-/// Compares the damaged parts of `now` with `seen` tile by tile, copies tiles that differ into
-/// `seen`, whose pixels these are, and adds them to `changed`. All of one size. The top byte of a
-/// pixel does not count.
-TileCount takeChanges(const PixelView& now, uint8* seen, uint32 seenPitch, const ChangeList& damage,
-                      ChangeList& changed);
+/// Compares the damaged parts of `now` with `seen` tile by tile, and adds those that differ to
+/// `runs`: disjoint, as wide as tiles side by side. All of one size. The top byte of a pixel does
+/// not count.
+TileCount findChanges(const PixelView& now, const PixelView& seen, const ChangeList& damage,
+                      std::vector<Rect>& runs);
+
+/// Copies rectangles of `now` into `seen`.
+void takeOver(const PixelView& now, uint8* seen, uint32 seenPitch, const std::vector<Rect>& runs);
 
 }  // namespace tool::live
 

@@ -152,7 +152,8 @@ bool Session::readRectangle() {
       break;
   }
   if (!picture_.contains(box)) throw Broken("a rectangle outside the screen");
-  counters_.pixels += static_cast<uint64_t>(width) * static_cast<uint64_t>(height);
+  if (encoding != kCopyRect)
+    counters_.pixels += static_cast<uint64_t>(width) * static_cast<uint64_t>(height);
   switch (encoding) {
     case kRaw:
       readRaw(link_, format_, picture_, box);
