@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <vector>
 
+#include "rectSize.h"
 #include "support/random.h"
 
 namespace {
@@ -41,6 +42,12 @@ Cover coverOf(const std::vector<Rect>& rects) {
   Cover cover;
   for (const Rect& rect : rects) cover.add(rect);
   return cover;
+}
+
+uint64 areaOf(const std::vector<Rect>& rects) {
+  uint64 area = 0;
+  for (const Rect& rect : rects) area += tool::areaOf(rect);
+  return area;
 }
 
 Rect randomRect(Random& random, int32 largest) {
@@ -157,6 +164,32 @@ TEST(ChangeList, TellsAPartOfThePicture) {
   EXPECT_EQ(cover.at(20, 69), 0);
   EXPECT_EQ(cover.at(19, 70), 0);
   EXPECT_TRUE(list.within({110, 0, 150, 140}).empty());
+}
+
+TEST(ChangeList, JoinsWhatIsNear) {
+  std::vector<Rect> rects = {{0, 0, 10, 10}, {40, 0, 50, 10}, {10, 0, 19, 10}, {20, 0, 40, 10}};
+  tool::live::joinNear(rects, 9);
+  ASSERT_EQ(rects.size(), 2u);
+  tool::live::joinNear(rects, 10);
+  ASSERT_EQ(rects.size(), 1u);
+  const Rect all = {0, 0, 50, 10};
+  EXPECT_TRUE(Rect_IsEqual(&rects[0], &all));
+}
+
+TEST(ChangeList, JoinsAndLosesNothing) {
+  Random random(5);
+  for (int round = 0; round < 300; ++round) {
+    std::vector<Rect> rects;
+    for (uint32 i = random.below(20); i != 0; --i) rects.push_back(randomRect(random, 30));
+    const std::vector<Rect> apart = rects;
+    const uint64 slack = random.below(500);
+    tool::live::joinNear(rects, slack);
+    const Cover before = coverOf(apart);
+    const Cover after = coverOf(rects);
+    for (size_t i = 0; i < before.all().size(); ++i)
+      ASSERT_TRUE(before.all()[i] == 0 || after.all()[i] != 0);
+    ASSERT_LE(areaOf(rects), areaOf(apart) + slack * (apart.size() - rects.size()));
+  }
 }
 
 TEST(ChangeList, IgnoresWhatLiesOutside) {

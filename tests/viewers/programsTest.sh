@@ -6,15 +6,15 @@ differences=$VIEWERS/screenDifferences
 
 # sees NAME COMMAND...: the command finds no difference before long.
 sees() {
-  name=$1
+  what=$1
   shift
   for _ in $(seq 100); do
     "$@" >out 2>&1 && break
     sleep 0.2
   done
   case $(tail -n 1 out) in
-    '0 of '*) note "$name: $(cat out)" ;;
-    *) fail "$name: $(cat out)" ;;
+    '0 of '*) note "$what: $(cat out)" ;;
+    *) fail "$what: $(cat out)" ;;
   esac
 }
 
@@ -85,5 +85,9 @@ else
   note 'left out: no xtightvncviewer here'
 fi
 stopServing
+note "$(grep '^moved' serve.out)"
+if have xterm && have xtigervncviewer; then
+  grep -q '^moved [1-9]' serve.out || fail "nothing was moved: $(cat serve.out)"
+fi
 [ ! -s serve.err ] || fail "serve said: $(cat serve.err)"
 finish

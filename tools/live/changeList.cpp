@@ -121,4 +121,22 @@ std::vector<Rect> ChangeList::within(const Rect& part) const {
   return rects;
 }
 
+void joinNear(std::vector<Rect>& rects, uint64 slack) {
+  for (size_t before = 0; before != rects.size();) {
+    before = rects.size();
+    for (size_t i = 0; i < rects.size(); ++i) {
+      for (size_t k = i + 1; k < rects.size();) {
+        Rect box = rects[i];
+        Rect_Union(&box, &rects[k]);
+        if (areaOf(box) > areaOf(rects[i]) + areaOf(rects[k]) + slack) {
+          ++k;
+          continue;
+        }
+        rects[i] = box;
+        rects.erase(rects.begin() + static_cast<ptrdiff_t>(k));
+      }
+    }
+  }
+}
+
 }  // namespace tool::live

@@ -40,6 +40,10 @@ class ChangeList {
   std::vector<RectList> strips;
 };
 
+/// Puts the box of two rectangles in their place wherever it has at most `slack` pixels more than
+/// both: one rectangle costs less to be sent than two.
+void joinNear(std::vector<Rect>& rects, uint64 slack);
+
 }  // namespace tool::live
 
 #endif

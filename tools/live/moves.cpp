@@ -143,7 +143,7 @@ class MoveSearch {
   static int32 distanceOf(const Window& window, int32 at, const std::vector<uint64>& rows) {
     const auto last = static_cast<int32>(rows.size()) - kWindow;
     const auto isAt = [&](int32 row) {
-      return row >= 0 && row <= last && std::equal(window.begin(), window.end(), &rows[0] + row);
+      return row >= 0 && row <= last && std::equal(window.begin(), window.end(), rows.data() + row);
     };
     if (isAt(at) ||
         std::all_of(window.begin(), window.end(), [&](uint64 row) { return row == window[0]; }))

@@ -11,6 +11,8 @@ namespace tool::live {
 namespace {
 
 constexpr uint32 kFramebufferUpdate = 0;
+/// As many pixels take fewer bytes, compressed, than another rectangle.
+constexpr uint64 kCheapPixels = 1024;
 
 /// Begins an update; the number of its rectangles is stored at the returned place later.
 size_t beginUpdate(Bytes& out) {
@@ -197,7 +199,9 @@ bool Session::putUpdate(const Scene& scene, Bytes& out) {
   if (owesColorMap) ViewerFormat::putColorMap(out);
   const size_t count = beginUpdate(out);
   uint32 rects = putCursorRects(scene, out) + putMoves(out);
-  for (const Rect& rect : owed.pixelsWithin(*asked)) rects += putPixels(scene.pixels, rect, out);
+  std::vector<Rect> lacking = owed.pixelsWithin(*asked);
+  joinNear(lacking, understood.pixels == kRaw ? 0 : kCheapPixels);
+  for (const Rect& rect : lacking) rects += putPixels(scene.pixels, rect, out);
   if (rects == 0) {
     out.truncate(before);
     return false;

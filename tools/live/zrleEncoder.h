@@ -25,8 +25,8 @@ class ZrleEncoder {
   void put(const PixelView& pixels, const Rect& rect, const ViewerFormat& format, Bytes& out);
 
  private:
-  // Of the levels that take no more time than 1, the one whose output is the smallest.
-  static constexpr int kUsualLevel = 5;
+  // 5 takes a tenth less time and a tenth more bytes.
+  static constexpr int kUsualLevel = 6;
 
   void putTiles(const PixelView& pixels, const Rect& rect, const ViewerFormat& format);
   void deflateTo(Bytes& out);

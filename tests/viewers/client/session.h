@@ -28,7 +28,7 @@ struct CursorImage {
 
 struct Counters {
   uint64_t updates = 0;
-  uint64_t pixels = 0;  // that came, not those that were there and moved
+  uint64_t pixels = 0;                     // that came, not those that were there and moved
   std::map<int32_t, uint64_t> rectangles;  // by encoding
 };
 
