@@ -6,6 +6,7 @@ replaced; the rest is written by hand.
 """
 import re
 import statistics
+from fnmatch import fnmatchcase
 
 from speedData import DATA, FAMILIES, LEVEL_WITH, ROOT, SIZES, read
 
@@ -62,12 +63,12 @@ def not_behind(level):
 
 
 def reasons():
-    """The lines of docs/speed/reasons.txt: by level or *, job, size or *, the words."""
-    known = {}
+    """The lines of docs/speed/reasons.txt: patterns of level, job and size, and the words."""
+    known = []
     for line in (DATA.parent / "reasons.txt").read_text(encoding="utf-8").splitlines():
         if line and not line.startswith("#"):
             where, words = line.split(": ", 1)
-            known[tuple(where.split())] = words
+            known.append((where.split(), words))
     return known
 
 
@@ -75,8 +76,8 @@ def reason(behind, known):
     """The words for a job at a size that is behind at some levels."""
     found = {}
     for row in behind:
-        words = next((known[level, row.job, size] for level in (row.level, "*") for size in (row.size, "*")
-                      if (level, row.job, size) in known), None)
+        words = next((words for patterns, words in known
+                      if all(map(fnmatchcase, (row.level, row.job, row.size), patterns))), None)
         if words:
             found.setdefault(words, []).append(row.level)
     return "; ".join(words if len(at) == len(behind) else f"{', '.join(at)}: {words}"
