@@ -24,6 +24,19 @@ struct PngUse {
 png_structp createPngReader(PngUse* use);
 png_structp createPngWriter(PngUse* use);
 
+/// Runs `body` on a structure that was made, with room for what is told of the picture; both are
+/// released then. `Job` has them as `png` and `info` beside its `use`.
+template <class Job>
+RasterStatus runPng(Job& job, bool (*body)(Job&), void (*release)(png_structpp, png_infopp)) {
+  if (job.png == nullptr) return RASTER_STATUS_NO_MEMORY;
+  job.info = png_create_info_struct(job.png);
+  const bool hasInfo = job.info != nullptr;
+  const bool done = hasInfo && withoutPngError(job.png, body, job);
+  release(&job.png, &job.info);
+  if (done) return RASTER_STATUS_OK;
+  return hasInfo ? job.use.failure : RASTER_STATUS_NO_MEMORY;
+}
+
 /// Stores a text, cut to what fits.
 void setMessage(const PngUse& use, const char* text);
 

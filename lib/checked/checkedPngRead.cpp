@@ -150,14 +150,11 @@ bool readImage(Reader& reader) {
 
 RasterStatus decode(Reader& reader) {
   reader.png = createPngReader(&reader.use);
-  if (reader.png == nullptr) return RASTER_STATUS_NO_MEMORY;
-  reader.info = png_create_info_struct(reader.png);
-  const bool hasInfo = reader.info != nullptr;
-  const bool read = hasInfo && withoutPngError(reader.png, readImage, reader);
-  png_destroy_read_struct(&reader.png, &reader.info, nullptr);
-  if (read) return RASTER_STATUS_OK;
-  free(reader.image->data);
-  return hasInfo ? reader.use.failure : RASTER_STATUS_NO_MEMORY;
+  const RasterStatus status = runPng(reader, readImage, [](png_structpp png, png_infopp info) {
+    png_destroy_read_struct(png, info, nullptr);
+  });
+  if (status != RASTER_STATUS_OK) free(reader.image->data);
+  return status;
 }
 
 }  // namespace

@@ -105,14 +105,9 @@ bool writeImage(Writer& writer) {
 
 RasterStatus encode(Writer& writer) {
   writer.png = createPngWriter(&writer.use);
-  if (writer.png == nullptr) return RASTER_STATUS_NO_MEMORY;
-  writer.info = png_create_info_struct(writer.png);
-  const bool hasInfo = writer.info != nullptr;
-  const bool written = hasInfo && withoutPngError(writer.png, writeImage, writer);
-  png_destroy_write_struct(&writer.png, &writer.info);
-  if (written) return RASTER_STATUS_OK;
-  DynBuf_Destroy(&writer.out);
-  return hasInfo ? writer.use.failure : RASTER_STATUS_NO_MEMORY;
+  const RasterStatus status = runPng(writer, writeImage, png_destroy_write_struct);
+  if (status != RASTER_STATUS_OK) DynBuf_Destroy(&writer.out);
+  return status;
 }
 
 }  // namespace
