@@ -12,10 +12,10 @@
 #include "rectSize.h"
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::Random;
-using tool::live::ChangeList;
 
 constexpr int32 kWidth = 150;
 constexpr int32 kHeight = 140;  // two strips and a piece of one
@@ -66,33 +66,38 @@ void expectDisjointAndCovering(const std::vector<Rect>& rects, const Cover& want
   }
 }
 
+/// A list and what it should hold.
+struct Modelled {
+  void add(const Rect& rect) {
+    list.add(rect);
+    model.add(rect);
+  }
+  void subtract(const Rect& rect) {
+    list.subtract(rect);
+    model.remove(rect);
+  }
+
+  ChangeList list = ChangeList(kWidth, kHeight);
+  Cover model;
+};
+
 TEST(ChangeList, IsExactWhileThereIsRoom) {
   Random random(1);
   for (int round = 0; round < 300; ++round) {
-    ChangeList list(kWidth, kHeight);
-    Cover model;
-    for (int i = 0; i < 3; ++i) {
-      const Rect rect = randomRect(random, 100);
-      list.add(rect);
-      model.add(rect);
-    }
-    const Cover cover = coverOf(list.all());
+    Modelled both;
+    for (int i = 0; i < 3; ++i) both.add(randomRect(random, 100));
+    const Cover cover = coverOf(both.list.all());
     for (size_t i = 0; i < cover.all().size(); ++i)
-      ASSERT_EQ(cover.all()[i], model.all()[i] != 0 ? 1 : 0);
+      ASSERT_EQ(cover.all()[i], both.model.all()[i] != 0 ? 1 : 0);
   }
 }
 
 TEST(ChangeList, HoldsEverythingWhenItOverflows) {
   Random random(2);
   for (int round = 0; round < 100; ++round) {
-    ChangeList list(kWidth, kHeight);
-    Cover model;
-    for (int i = 0; i < 60; ++i) {
-      const Rect rect = randomRect(random, 12);
-      list.add(rect);
-      model.add(rect);
-    }
-    expectDisjointAndCovering(list.all(), model);
+    Modelled both;
+    for (int i = 0; i < 60; ++i) both.add(randomRect(random, 12));
+    expectDisjointAndCovering(both.list.all(), both.model);
   }
 }
 
@@ -117,19 +122,15 @@ TEST(ChangeList, JoinsWhatGoesOnInTheNextStrip) {
 TEST(ChangeList, TakesOutNothingElse) {
   Random random(3);
   for (int round = 0; round < 500; ++round) {
-    ChangeList list(kWidth, kHeight);
-    Cover model;
+    Modelled both;
     for (int i = 0; i < 12; ++i) {
-      const Rect rect = randomRect(random, 40);
-      list.add(rect);
-      model.add(rect);
+      both.add(randomRect(random, 40));
       if (i % 3 != 2) continue;
       const Rect hole = randomRect(random, 60);
-      list.subtract(hole);
-      model.remove(hole);
-      for (const Rect& left : list.all()) ASSERT_FALSE(Rect_Intersect(nullptr, &left, &hole));
+      both.subtract(hole);
+      for (const Rect& left : both.list.all()) ASSERT_FALSE(Rect_Intersect(nullptr, &left, &hole));
     }
-    expectDisjointAndCovering(list.all(), model);
+    expectDisjointAndCovering(both.list.all(), both.model);
   }
 }
 
@@ -201,3 +202,4 @@ TEST(ChangeList, IgnoresWhatLiesOutside) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -14,15 +14,11 @@
 #include "support/random.h"
 #include "tiles.h"
 
+namespace tool::live {
 namespace {
 
 using tests::GuardedBuffer;
 using tests::Random;
-using tool::live::ChangeList;
-using tool::live::findChanges;
-using tool::live::findMoves;
-using tool::live::Move;
-using tool::live::PixelView;
 
 constexpr int32 kWidth = 210;
 constexpr int32 kHeight = 170;
@@ -143,7 +139,7 @@ TEST(Moves, FindsAPageOfTextByLines) {
     uint64 area = 0;
     for (const Move& move : moves) {
       EXPECT_EQ(move.down, -13 * lines);
-      area += tool::areaOf(move.to);
+      area += areaOf(move.to);
     }
     EXPECT_GT(area, uint64{100} * 80);
   }
@@ -282,3 +278,4 @@ TEST(Moves, FindsNothingWhereNothingMoved) {
 }
 
 }  // namespace
+}  // namespace tool::live

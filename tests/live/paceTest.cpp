@@ -6,12 +6,12 @@
 
 #include <gtest/gtest.h>
 
+namespace tool::live {
 namespace {
 
 using std::chrono::microseconds;
 using std::chrono::milliseconds;
 using std::chrono::seconds;
-using tool::live::Pace;
 
 using Time = Pace::Clock::time_point;
 
@@ -66,3 +66,4 @@ TEST(Pace, KeepsToTheLowerRateWhenThatIsTheGreatest) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -15,16 +15,10 @@
 #include "support/random.h"
 #include "tintedPicture.h"
 
+namespace tool::live {
 namespace {
 
 using tests::Random;
-using tool::LiveCursor;
-using tool::live::Bytes;
-using tool::live::ChangeList;
-using tool::live::PixelView;
-using tool::live::PngEncoder;
-using tool::live::ScaledPicture;
-using tool::live::TintedPicture;
 
 constexpr uint32 kWidth = 90;
 constexpr uint32 kHeight = 70;
@@ -58,23 +52,45 @@ ChangeList everything(uint32 width, uint32 height) {
   return list;
 }
 
+/// A picture that is shown at a scale and changes in one rectangle after the other.
+class ScaledAndChanging {
+ public:
+  ScaledAndChanging(Random& numbers, double scale)
+      : random(numbers), scaled(kWidth, kHeight, scale) {
+    drawAll(scaled);
+  }
+
+  void drawAll(ScaledPicture& picture) const {
+    ChangeList drawn(picture.view().width, picture.view().height);
+    picture.draw(viewOf(pixels), everything(kWidth, kHeight), drawn);
+  }
+  /// Changes a rectangle and returns what of the scaled picture was drawn for it.
+  ChangeList change() {
+    const Rect rect = randomRect(random);
+    repaint(random, pixels, rect);
+    ChangeList changed(kWidth, kHeight);
+    changed.add(rect);
+    ChangeList drawn(shown().width, shown().height);
+    scaled.draw(viewOf(pixels), changed, drawn);
+    return drawn;
+  }
+  PixelView shown() const { return scaled.view(); }
+
+ private:
+  Random& random;
+  std::vector<uint8> pixels = random.bytes(kWidth * kHeight * 4);
+  ScaledPicture scaled;
+};
+
 TEST(ScaledPicture, DrawsPartsAsItDrawsTheWhole) {
   Random random(1);
   for (const double scale : {0.1, 0.31, 0.5, 0.77, 1.3, 2.0, 3.7}) {
-    std::vector<uint8> pixels = random.bytes(kWidth * kHeight * 4);
-    ScaledPicture parts(kWidth, kHeight, scale);
-    const PixelView shown = parts.view();
-    ChangeList drawn(shown.width, shown.height);
-    parts.draw(viewOf(pixels), everything(kWidth, kHeight), drawn);
+    ScaledAndChanging parts(random, scale);
     for (int round = 0; round < 40; ++round) {
-      const Rect rect = randomRect(random);
-      repaint(random, pixels, rect);
-      ChangeList changed(kWidth, kHeight);
-      changed.add(rect);
-      parts.draw(viewOf(pixels), changed, drawn);
+      parts.change();
       ScaledPicture whole(kWidth, kHeight, scale);
-      whole.draw(viewOf(pixels), everything(kWidth, kHeight), drawn);
-      ASSERT_EQ(bytesOf(parts.view()), bytesOf(whole.view())) << "scale " << scale;
+      parts.drawAll(whole);
+      ASSERT_EQ(bytesOf(parts.shown()), bytesOf(whole.view())) << "scale " << scale;
     }
   }
 }
@@ -82,24 +98,14 @@ TEST(ScaledPicture, DrawsPartsAsItDrawsTheWhole) {
 TEST(ScaledPicture, TellsAllThatItDrew) {
   Random random(2);
   for (const double scale : {0.31, 0.5, 1.3, 3.7}) {
-    std::vector<uint8> pixels = random.bytes(kWidth * kHeight * 4);
-    ScaledPicture scaled(kWidth, kHeight, scale);
-    const PixelView shown = scaled.view();
-    ChangeList drawn(shown.width, shown.height);
-    scaled.draw(viewOf(pixels), everything(kWidth, kHeight), drawn);
+    ScaledAndChanging scaled(random, scale);
+    const uint32 width = scaled.shown().width;
     for (int round = 0; round < 40; ++round) {
-      const Rect rect = randomRect(random);
-      repaint(random, pixels, rect);
-      const std::vector<uint8> before = bytesOf(scaled.view());
-      ChangeList changed(kWidth, kHeight);
-      changed.add(rect);
-      drawn.clear();
-      scaled.draw(viewOf(pixels), changed, drawn);
-      const std::vector<uint8> after = bytesOf(scaled.view());
-      const std::vector<Rect> told = drawn.all();
+      const std::vector<uint8> before = bytesOf(scaled.shown());
+      const std::vector<Rect> told = scaled.change().all();
+      const std::vector<uint8> after = bytesOf(scaled.shown());
       for (size_t i = 0; i < after.size(); i += 4) {
-        const Point at = {static_cast<int32>(i / 4 % shown.width),
-                          static_cast<int32>(i / 4 / shown.width)};
+        const Point at = {static_cast<int32>(i / 4 % width), static_cast<int32>(i / 4 / width)};
         const bool isTold = std::any_of(told.begin(), told.end(), [&](const Rect& part) {
           return Rect_ContainsPoint(&part, &at);
         });
@@ -157,7 +163,7 @@ LiveCursor blackAndClear() {
 
 TEST(CursorRects, MakeAMaskOfWhatIsAtLeastHalfThere) {
   Bytes out;
-  tool::live::putCursor(blackAndClear(), tool::live::ViewerFormat(), out);
+  putCursor(blackAndClear(), ViewerFormat(), out);
   ASSERT_EQ(out.size(), 12u + 30 * 4 + 3 * 2);
   const std::vector<uint8> header = {0, 1, 0, 1, 0, 10, 0, 3, 0xFF, 0xFF, 0xFF, 0x11};
   EXPECT_EQ(std::vector<uint8>(out.data(), out.data() + 12), header);
@@ -170,7 +176,7 @@ TEST(CursorRects, MakeAMaskOfWhatIsAtLeastHalfThere) {
 
 TEST(CursorRects, KeepAlpha) {
   Bytes out;
-  tool::live::putCursorWithAlpha(blackAndClear(), out);
+  putCursorWithAlpha(blackAndClear(), out);
   ASSERT_EQ(out.size(), 12u + 4 + 30 * 4);
   const std::vector<uint8> half = {0x40, 0x40, 0x40, 0x80};
   EXPECT_EQ(std::vector<uint8>(out.data() + 20, out.data() + 24), half);
@@ -182,9 +188,9 @@ TEST(DrawnCursor, IsThereForAMoment) {
   const std::vector<uint8> before = pixels;
   const LiveCursor cursor = blackAndClear();
   for (const Point at : {Point{40, 30}, Point{0, 0}, Point{kWidth, kHeight}, Point{-50, 9}}) {
-    const Rect box = tool::live::cursorBox(cursor, at, kWidth, kHeight);
+    const Rect box = cursorBox(cursor, at, kWidth, kHeight);
     {
-      const tool::live::DrawnCursor drawn(pixels.data(), 4 * kWidth, kWidth, kHeight, cursor, at);
+      const DrawnCursor drawn(pixels.data(), 4 * kWidth, kWidth, kHeight, cursor, at);
       for (size_t i = 0; i < pixels.size(); i += 4) {
         const Point pixel = {static_cast<int32>(i / 4 % kWidth),
                              static_cast<int32>(i / 4 / kWidth)};
@@ -253,3 +259,4 @@ TEST(PngEncoder, KeepsEveryPixel) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -11,14 +11,10 @@
 
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::Random;
-using tool::live::Bytes;
-using tool::live::PixelFormat;
-using tool::live::Protocol;
-using tool::live::ProtocolEvents;
-using tool::live::UpdateRequest;
 
 /// Writes down what it is told.
 class Diary : public ProtocolEvents {
@@ -230,3 +226,4 @@ TEST(Protocol, SurvivesRandomBytes) {
 }
 
 }  // namespace
+}  // namespace tool::live

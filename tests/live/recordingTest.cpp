@@ -13,14 +13,11 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::GuardedBuffer;
 using tests::Random;
-using tool::live::Bytes;
-using tool::live::PixelView;
-using tool::live::RecordingReader;
-using tool::live::RecordingWriter;
 
 constexpr uint32 kWidth = 60;
 constexpr uint32 kHeight = 40;
@@ -171,3 +168,4 @@ TEST(Recording, SurvivesDamage) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -16,22 +16,10 @@
 #include "drawnCursor.h"
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::Random;
-using tool::LiveCursor;
-using tool::live::bigEndian16;
-using tool::live::bigEndian32;
-using tool::live::Bytes;
-using tool::live::ChangeList;
-using tool::live::Changes;
-using tool::live::DrawnCursor;
-using tool::live::Move;
-using tool::live::PixelFormat;
-using tool::live::PixelView;
-using tool::live::Scene;
-using tool::live::Session;
-using tool::live::ViewerFormat;
 
 constexpr uint32 kWidth = 100;
 constexpr uint32 kHeight = 90;
@@ -50,7 +38,7 @@ class Messages {
   }
   Messages& format(const PixelFormat& wanted) {
     bytes.put32(0);
-    tool::live::putPixelFormat(bytes, wanted);
+    putPixelFormat(bytes, wanted);
     return *this;
   }
   Messages& encodings(const std::vector<int32>& list) {
@@ -348,7 +336,7 @@ TEST(Session, MovesWhatEachViewerHas) {
       Scene scene = screen.scene();
       scene.cursor = &cursor;
       scene.cursorSerial = 1;
-      scene.cursorBox = tool::live::cursorBox(cursor, pointer, kWidth, kHeight);
+      scene.cursorBox = live::cursorBox(cursor, pointer, kWidth, kHeight);
       std::optional<DrawnCursor> drawn;
       if (!reader.ownCursor)
         drawn.emplace(screen.pixels.data(), 4 * kWidth, kWidth, kHeight, cursor, pointer);
@@ -540,3 +528,4 @@ TEST(Session, SendsAColorMapBeforeIndices) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -13,15 +13,11 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::GuardedBuffer;
 using tests::Random;
-using tool::live::ChangeList;
-using tool::live::findChanges;
-using tool::live::PixelView;
-using tool::live::takeOver;
-using tool::live::TileCount;
 
 constexpr uint32 kWidth = 143;
 constexpr uint32 kHeight = 90;
@@ -103,3 +99,4 @@ TEST(Tiles, CountsNoTopBytes) {
 }
 
 }  // namespace
+}  // namespace tool::live

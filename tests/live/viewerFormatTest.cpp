@@ -11,14 +11,11 @@
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::GuardedBuffer;
 using tests::Random;
-using tool::live::Bytes;
-using tool::live::PixelFormat;
-using tool::live::PixelView;
-using tool::live::ViewerFormat;
 
 struct Named {
   const char* name;
@@ -116,51 +113,40 @@ TEST(ViewerFormat, LeavesOutTheUnusedByte) {
 
 std::vector<uint8> asBytes(const PixelFormat& format) {
   Bytes bytes;
-  tool::live::putPixelFormat(bytes, format);
+  putPixelFormat(bytes, format);
   return {bytes.data(), bytes.data() + bytes.size()};
 }
 
 TEST(ViewerFormat, ReadsWhatItWrites) {
   for (const Named& named : kFormats) {
     const std::vector<uint8> bytes = asBytes(named.format);
-    ASSERT_EQ(bytes.size(), tool::live::kPixelFormatBytes);
-    EXPECT_EQ(tool::live::readPixelFormat(bytes.data()), named.format) << named.name;
+    ASSERT_EQ(bytes.size(), kPixelFormatBytes);
+    EXPECT_EQ(readPixelFormat(bytes.data()), named.format) << named.name;
   }
 }
 
 TEST(ViewerFormat, RefusesWhatCannotBe) {
-  const PixelFormat good = kFormats[0].format;
-  const auto isRefused = [](const PixelFormat& format) {
-    return !tool::live::readPixelFormat(asBytes(format).data());
+  const auto refuses = [](void change(PixelFormat&)) {
+    PixelFormat format = kFormats[0].format;
+    change(format);
+    return !readPixelFormat(asBytes(format).data());
   };
-  PixelFormat bad = good;
-  bad.bitsPerPixel = 12;
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.redMax = 0;
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.greenMax = 200;
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.redShift = 25;
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.blueShift = 255;
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.blueShift = 4;  // the channels overlap
-  EXPECT_TRUE(isRefused(bad));
-  bad = good;
-  bad.trueColor = false;  // a table of 2^32 colours
-  EXPECT_TRUE(isRefused(bad));
+  EXPECT_FALSE(refuses([](PixelFormat&) {}));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.bitsPerPixel = 12; }));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.redMax = 0; }));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.greenMax = 200; }));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.redShift = 25; }));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.blueShift = 255; }));
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.blueShift = 4; }));  // channels overlap
+  // A table of 2^32 colours.
+  EXPECT_TRUE(refuses([](PixelFormat& format) { format.trueColor = false; }));
 }
 
 TEST(ViewerFormat, SendsATableToViewersThatWantIndices) {
   PixelFormat indexed = kFormats[0].format;
   indexed.bitsPerPixel = 8;
   indexed.trueColor = false;
-  const auto read = tool::live::readPixelFormat(asBytes(indexed).data());
+  const auto read = readPixelFormat(asBytes(indexed).data());
   ASSERT_TRUE(read);
   const ViewerFormat format(*read);
   EXPECT_TRUE(format.needsColorMap());
@@ -169,7 +155,7 @@ TEST(ViewerFormat, SendsATableToViewersThatWantIndices) {
   ViewerFormat::putColorMap(map);
   ASSERT_EQ(map.size(), 6u + 256 * 6);
   const auto channel = [&](uint32 index, uint32 which) {
-    return tool::live::bigEndian16(map.data() + 6 + size_t{6} * index + size_t{2} * which);
+    return bigEndian16(map.data() + 6 + size_t{6} * index + size_t{2} * which);
   };
   EXPECT_EQ(channel(7, 0), 0xFFFFu);
   EXPECT_EQ(channel(7, 1), 0u);
@@ -178,3 +164,4 @@ TEST(ViewerFormat, SendsATableToViewersThatWantIndices) {
 }
 
 }  // namespace
+}  // namespace tool::live

@@ -13,14 +13,10 @@
 
 #include "support/random.h"
 
+namespace tool::live {
 namespace {
 
 using tests::Random;
-using tool::live::Bytes;
-using tool::live::PixelFormat;
-using tool::live::PixelView;
-using tool::live::ViewerFormat;
-using tool::live::ZrleEncoder;
 
 /// The stream of a connection, inflated rectangle by rectangle.
 class Inflater {
@@ -126,7 +122,7 @@ class TileReader {
 /// Decodes a rectangle and compares it with the pixels that the format makes of the picture.
 void expectDecoded(const Bytes& out, Inflater& inflater, const PixelView& view, const Rect& rect,
                    const ViewerFormat& format, bool* forms) {
-  ASSERT_EQ(tool::live::bigEndian32(out.data()), out.size() - 4);
+  ASSERT_EQ(bigEndian32(out.data()), out.size() - 4);
   const std::vector<uint8> plain = inflater.inflateAll(out.data() + 4, out.size() - 4);
   TileReader reader(plain, format.compactBytes());
   for (int32 y = rect.top; y < rect.bottom; y += 64) {
@@ -229,3 +225,4 @@ TEST(ZrleEncoder, RepeatsAPatternBrieflyWhicheverColorItBeginsWith) {
 }
 
 }  // namespace
+}  // namespace tool::live
