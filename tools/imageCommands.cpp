@@ -22,9 +22,7 @@ struct ConvertOptions {
 
 int convert(const ConvertOptions& options) {
   const bool isNarrow = options.code != 0 && options.code != 32;
-  if (isNarrow && options.output.keepAlpha)
-    throw UsageError("pixels of --depth " + std::to_string(options.code) +
-                     " have no alpha to keep");
+  if (isNarrow) options.output.refuseToKeepAlphaOf(options.code);
   options.output.forSave();
   Picture picture = Picture::load(options.input, !options.output.noAlpha);
   const bool hadAlpha = picture.code() == 32 && isTransparent(picture);

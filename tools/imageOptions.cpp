@@ -39,6 +39,11 @@ SaveOptions OutputOptions::forSave() const {
   return {type, compression, keepAlpha};
 }
 
+void OutputOptions::refuseToKeepAlphaOf(uint32 code) const {
+  if (keepAlpha)
+    throw UsageError("pixels of --depth " + std::to_string(code) + " have no alpha to keep");
+}
+
 void OutputOptions::saveWithAlpha(const Picture& picture) const {
   SaveOptions saving = forSave();
   saving.keepAlpha = picture.code() == 32 && !noAlpha;

@@ -28,6 +28,8 @@ struct OutputOptions {
   /// --no-alpha and --keep-alpha, for commands that keep alpha anyhow.
   void addAlphaTo(OptionList& command);
   SaveOptions forSave() const;
+  /// A usage error for --keep-alpha, since pixels of this depth have none.
+  void refuseToKeepAlphaOf(uint32 code) const;
   /// Writes a picture with its alpha, of which `picture` has some if it has 32 bits; says so when
   /// that cannot be kept.
   void saveWithAlpha(const Picture& picture) const;

@@ -22,9 +22,7 @@ struct PackOptions {
 };
 
 int pack(const PackOptions& options) {
-  if (options.output.keepAlpha && options.code != 32)
-    throw UsageError("pixels of --depth " + std::to_string(options.code) +
-                     " have no alpha to keep");
+  if (options.code != 32) options.output.refuseToKeepAlphaOf(options.code);
   const Picture picture = Picture::loadAs(options.code, options.input, options.output.keepAlpha);
   const std::vector<uint8> block = packBlock(picture);
   writeOutput(options.output.path, block.data(), block.size());

@@ -66,13 +66,18 @@ int scale(const ScaleOptions& options) {
   return kSuccess;
 }
 
+/// The arguments and options of a command that makes a picture of another one.
+void addPictures(OptionList& command, std::string& input, OutputOptions& output) {
+  command.add("IN", input, "a PNG picture").required();
+  output.addTo(command);
+  output.addAlphaTo(command);
+}
+
 void addScale(Commands& commands) {
   auto options = std::make_shared<ScaleOptions>();
   Command command = commands.add("scale", "Enlarges or reduces a picture.",
                                  [options] { return scale(*options); });
-  command.add("IN", options->input, "a PNG picture").required();
-  options->output.addTo(command);
-  options->output.addAlphaTo(command);
+  addPictures(command, options->input, options->output);
   command
       .addParsed("SIZE", options->size, parseSizeRequest, "SIZE",
                  "the new size: WxH, Wx or xH to keep the sides' ratio, a factor, or a percentage")
@@ -120,9 +125,7 @@ void addCrop(Commands& commands) {
   Command command =
       commands.add("crop", "Cuts a rectangle out of a picture, and scales it if so asked.",
                    [options] { return crop(*options); });
-  command.add("IN", options->input, "a PNG picture").required();
-  options->output.addTo(command);
-  options->output.addAlphaTo(command);
+  addPictures(command, options->input, options->output);
   command
       .addParsed("REGION", options->region, parseRegion, "WxH[+X+Y]",
                  "the part to keep; without +X+Y at the top left corner")

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <array>
+#include <type_traits>
 #include <utility>
 
 #include "failure.h"
@@ -28,31 +29,33 @@ uint8 firstEventOf(xcb_connection_t* connection, xcb_extension_t& extension) {
 
 [[noreturn]] void failWithDisplay() { throw Failure("the display went away"); }
 
+/// Whether the display has an extension and answers when it is told the version that is used.
+template <class Cookie, class Number, class Reply>
+bool speaks(xcb_connection_t* connection, xcb_extension_t& extension,
+            Cookie (*tell)(xcb_connection_t*, Number, Number),
+            Reply* (*wait)(xcb_connection_t*, Cookie, xcb_generic_error_t**),
+            std::type_identity_t<Number> major, std::type_identity_t<Number> minor) {
+  return hasExtension(connection, extension) &&
+         replyTo(connection, tell(connection, major, minor), wait) != nullptr;
+}
+
 bool findDamage(xcb_connection_t* connection) {
-  return hasExtension(connection, xcb_damage_id) &&
-         replyTo(connection,
-                 xcb_damage_query_version(connection, XCB_DAMAGE_MAJOR_VERSION,
-                                          XCB_DAMAGE_MINOR_VERSION),
-                 xcb_damage_query_version_reply) != nullptr;
+  return speaks(connection, xcb_damage_id, xcb_damage_query_version, xcb_damage_query_version_reply,
+                XCB_DAMAGE_MAJOR_VERSION, XCB_DAMAGE_MINOR_VERSION);
 }
 
 bool findFixes(xcb_connection_t* connection) {
-  return hasExtension(connection, xcb_xfixes_id) &&
-         replyTo(connection,
-                 xcb_xfixes_query_version(connection, XCB_XFIXES_MAJOR_VERSION,
-                                          XCB_XFIXES_MINOR_VERSION),
-                 xcb_xfixes_query_version_reply) != nullptr;
+  return speaks(connection, xcb_xfixes_id, xcb_xfixes_query_version, xcb_xfixes_query_version_reply,
+                XCB_XFIXES_MAJOR_VERSION, XCB_XFIXES_MINOR_VERSION);
 }
 
 /// The opcode of the input extension, or 0 without it.
 uint8 findInput(xcb_connection_t* connection) {
   constexpr uint16 kMajor = 2;
   constexpr uint16 kMinor = 2;  // from which on motion is told during grabs as well
-  if (!hasExtension(connection, xcb_input_id) ||
-      !replyTo(connection, xcb_input_xi_query_version(connection, kMajor, kMinor),
-               xcb_input_xi_query_version_reply))
-    return 0;
-  return xcb_get_extension_data(connection, &xcb_input_id)->major_opcode;
+  const bool found = speaks(connection, xcb_input_id, xcb_input_xi_query_version,
+                            xcb_input_xi_query_version_reply, kMajor, kMinor);
+  return found ? xcb_get_extension_data(connection, &xcb_input_id)->major_opcode : 0;
 }
 
 }  // namespace
