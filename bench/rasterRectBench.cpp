@@ -9,6 +9,10 @@
 #include "support/jobs.h"
 #include "support/peers.h"
 
+#ifdef HAVE_PIXMAN
+#include "peers/pixmanRegion.h"
+#endif
+
 namespace {
 
 using bench::Contenders;
@@ -34,32 +38,6 @@ constexpr RectListEntry kWhole = {0, 0, 400, 400};
 constexpr std::array<RectListEntry, 4> kHoles = {
     {{20, 20, 50, 50}, {120, 20, 50, 50}, {20, 120, 50, 50}, {300, 300, 200, 50}}};
 
-#ifdef HAVE_PIXMAN
-/// pixman's counterpart of a list: begins empty for every run, and is released after it.
-class Region {
- public:
-  Region() { pixman_region32_init(&region_); }
-  ~Region() { pixman_region32_fini(&region_); }
-  Region(const Region&) = delete;
-  Region& operator=(const Region&) = delete;
-
-  void add(const RectListEntry& r) {
-    pixman_region32_union_rect(&region_, &region_, r.x, r.y, static_cast<unsigned>(r.width),
-                               static_cast<unsigned>(r.height));
-  }
-  void subtract(const RectListEntry& r) {
-    pixman_region32_t hole;
-    pixman_region32_init_rect(&hole, r.x, r.y, static_cast<unsigned>(r.width),
-                              static_cast<unsigned>(r.height));
-    pixman_region32_subtract(&region_, &region_, &hole);
-    pixman_region32_fini(&hole);
-  }
-
- private:
-  pixman_region32_t region_;
-};
-#endif
-
 template <class Rects> void addJob(const std::string& name, const Rects& rects) {
   Contenders c(name, {1, 1}, static_cast<double>(rects.size()));
   c.add("raster", [=] {
@@ -70,7 +48,7 @@ template <class Rects> void addJob(const std::string& name, const Rects& rects) 
   });
 #ifdef HAVE_PIXMAN
   c.add("pixman", [=] {
-    Region region;
+    tests::PixmanRegion region;
     for (const RectListEntry& r : rects) region.add(r);
     benchmark::DoNotOptimize(region);
   });
@@ -86,7 +64,7 @@ void subtractJob() {
   });
 #ifdef HAVE_PIXMAN
   c.add("pixman", [] {
-    Region region;
+    tests::PixmanRegion region;
     region.add(kWhole);
     for (const RectListEntry& r : kHoles) region.subtract(r);
     benchmark::DoNotOptimize(region);

@@ -7,6 +7,7 @@
 
 #include "fuzzing.h"
 #include "imageUtil.h"
+#include "support/cursorPlanes.h"
 #include "support/viewImages.h"
 
 using fuzz::Bytes;
@@ -30,14 +31,7 @@ struct OwnCursor {
     planeBytes = size_t{cursor.width} * cursor.height * (mask ? format.bpp / 8 : 4);
     first = c.fill(planeBytes);
     second = c.fill(planeBytes);
-    if (mask) {
-      cursor.depth = format.depth;
-      cursor.bpp = format.bpp;
-      cursor.andMask = first.data();
-      cursor.xorMask = second.data();
-    } else {
-      cursor.pixels = first.data();
-    }
+    tests::setPlanes(cursor, format.depth, format.bpp, first.data(), second.data());
     if (c.chance(8)) (c.chance(2) ? cursor.width : cursor.height) = c.word();
   }
   RasterCursor cursor{};

@@ -3,7 +3,8 @@
 // PNG streams of any bytes. The mutator repairs checksums, so that what is changed is also looked
 // at. What the exact reader takes as well, both read alike.
 
-#include <array>
+#include <zlib.h>
+
 #include <cstdlib>
 #include <cstring>
 
@@ -26,28 +27,12 @@ void storeBigEndian(uint8* at, uint32 value) {
   for (int i = 0; i < 4; ++i) at[i] = static_cast<uint8>(value >> (24 - 8 * i));
 }
 
-/// What a byte does to a checksum.
-constexpr auto kCrcTable = [] {
-  std::array<uint32, 256> table = {};
-  for (uint32 i = 0; i < table.size(); ++i) {
-    table[i] = i;
-    for (int bit = 0; bit < 8; ++bit)
-      table[i] = table[i] >> 1 ^ ((table[i] & 1) != 0 ? 0xEDB88320u : 0u);
-  }
-  return table;
-}();
-
-uint32 crcOf(const uint8* bytes, size_t size) {
-  uint32 crc = ~0u;
-  for (size_t i = 0; i < size; ++i) crc = crc >> 8 ^ kCrcTable[(crc ^ bytes[i]) & 255];
-  return ~crc;
-}
-
 void repairChecksums(uint8* bytes, size_t size) {
   for (size_t at = kSignature; size >= kFrame && at <= size - kFrame;) {
     const size_t length = bigEndian(bytes + at);
     if (length > size - at - kFrame) return;
-    storeBigEndian(bytes + at + 8 + length, crcOf(bytes + at + 4, length + 4));
+    const uLong checksum = crc32(0, bytes + at + 4, static_cast<uInt>(length + 4));
+    storeBigEndian(bytes + at + 8 + length, static_cast<uint32>(checksum));
     at += length + kFrame;
   }
 }

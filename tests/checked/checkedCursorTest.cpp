@@ -10,6 +10,7 @@
 
 #include "checked/checkedScenes.h"
 #include "rasterChecked.h"
+#include "support/cursorPlanes.h"
 #include "support/recordedMessages.h"
 
 namespace {
@@ -31,14 +32,7 @@ struct OwnCursor {
     cursor.hotY = random.between(-3, 20);
     cursor.width = width;
     cursor.height = height;
-    if (mask) {
-      cursor.depth = format.depth;
-      cursor.bpp = format.bpp;
-      cursor.andMask = first.data();
-      cursor.xorMask = second.data();
-    } else {
-      cursor.pixels = first.data();
-    }
+    tests::setPlanes(cursor, format.depth, format.bpp, first.data(), second.data());
   }
 
   size_t bytes;
@@ -189,18 +183,16 @@ TEST(RasterChecked_ExpandCursor, EqualsTheExactExpansion) {
 TEST(RasterChecked_ExpandCursor, RefusesSizesThatWrap) {
   uint8 bytes[16] = {};
   uint8 dst[16] = {};
-  EXPECT_EQ(RasterChecked_ExpandCursor(0x10000000, 1, 1, bytes, 16, 1, bytes, 16, 32, dst, 16),
-            RASTER_STATUS_TOO_BIG);
-  EXPECT_EQ(RasterChecked_ExpandCursor(0x10000, 0x10000, 1, bytes, 16, 1, bytes, 16, 32, dst, 16),
-            RASTER_STATUS_TOO_BIG);
-  EXPECT_EQ(RasterChecked_ExpandCursor(0x80000000, 0, 1, bytes, 16, 1, bytes, 16, 8, dst, 16),
-            RASTER_STATUS_TOO_BIG);
-  EXPECT_EQ(RasterChecked_ExpandCursor(1, 1, 1, bytes, 16, 1, dst, 16, 32, dst, 16),
-            RASTER_STATUS_OVERLAP);
-  EXPECT_EQ(RasterChecked_ExpandCursor(1, 1, 1, nullptr, 16, 1, bytes, 16, 32, dst, 16),
-            RASTER_STATUS_NULL);
-  EXPECT_EQ(RasterChecked_ExpandCursor(1, 1, 1, bytes, 16, 1, bytes, 16, 32, nullptr, 16),
-            RASTER_STATUS_NULL);
+  const auto statusOf = [](uint32 width, uint32 height, uint32 bpp, const uint8* andBits,
+                           const uint8* xorBits, uint8* to) {
+    return RasterChecked_ExpandCursor(width, height, 1, andBits, 16, 1, xorBits, 16, bpp, to, 16);
+  };
+  EXPECT_EQ(statusOf(0x10000000, 1, 32, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
+  EXPECT_EQ(statusOf(0x10000, 0x10000, 32, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
+  EXPECT_EQ(statusOf(0x80000000, 0, 8, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
+  EXPECT_EQ(statusOf(1, 1, 32, bytes, dst, dst), RASTER_STATUS_OVERLAP);
+  EXPECT_EQ(statusOf(1, 1, 32, nullptr, bytes, dst), RASTER_STATUS_NULL);
+  EXPECT_EQ(statusOf(1, 1, 32, bytes, bytes, nullptr), RASTER_STATUS_NULL);
 }
 
 // ---- Scaling -----------------------------------------------------------------------------------

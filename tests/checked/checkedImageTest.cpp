@@ -8,11 +8,10 @@
 #include <cstring>
 #include <memory>
 
-#include "checked/checkedScenes.h"
+#include "checked/checkedImages.h"
 #include "imageUtil.h"
 #include "rasterChecked.h"
 #include "support/recordedMessages.h"
-#include "support/viewImages.h"
 
 namespace {
 
@@ -22,11 +21,7 @@ using tests::PixelFormat;
 using tests::Random;
 
 ImageUtilImage imageOf(Random& random, const RasterView& view) {
-  ImageUtilImage image = tests::imageOn(view);
-  image.flags = random.below(2);
-  image.numColors = view.bpp == 8 ? random.below(257) : 0;
-  for (ImageUtilColor& color : image.palette) color.green = static_cast<uint8>(random.word());
-  return image;
+  return tests::imageOf(random, view, random.below(257));
 }
 
 /// The same picture in rows that reach to the next multiple of four bytes, with zeros there.
@@ -46,8 +41,7 @@ struct PaddedCopy {
 TEST(RasterChecked_EncodeBmp, MakesTheFileOfTheExactEncoder) {
   Random random(101);
   for (int round = 0; round < 2000; ++round) {
-    const GuardedView view(random, tests::someFormat(random), 1 + random.below(40),
-                           1 + random.below(40));
+    const GuardedView view = tests::somePicture(random);
     const ImageUtilImage image = imageOf(random, view.view());
     uint8* file = nullptr;
     size_t size = 0;

@@ -9,11 +9,10 @@
 #include <cstring>
 #include <string>
 
-#include "checked/checkedScenes.h"
+#include "checked/checkedImages.h"
 #include "image/pngFiles.h"
 #include "imageUtil.h"
 #include "rasterChecked.h"
-#include "support/viewImages.h"
 
 namespace {
 
@@ -410,24 +409,11 @@ TEST(RasterChecked_PngInfo, RefusesHeadersOfNoPicture) {
 
 // ---- Encoding ----------------------------------------------------------------------------------
 
-/// An image on a view of its own.
-ImageUtilImage imageOf(Random& random, const RasterView& view) {
-  ImageUtilImage image = tests::imageOn(view);
-  image.flags = random.below(2);
-  image.numColors = view.bpp == 8 ? 256 : 0;
-  for (ImageUtilColor& color : image.palette) {
-    const Bytes bytes = random.bytes(3);
-    color = {bytes[0], bytes[1], bytes[2], 0};
-  }
-  return image;
-}
-
 TEST(RasterChecked_EncodePng, MakesTheBytesOfTheExactEncoder) {
   Random random(81);
   for (int round = 0; round < 1500; ++round) {
-    const GuardedView view(random, tests::someFormat(random), 1 + random.below(40),
-                           1 + random.below(40));
-    const ImageUtilImage image = imageOf(random, view.view());
+    const GuardedView view = tests::somePicture(random);
+    const ImageUtilImage image = tests::imageOf(random, view.view(), 256);
     const ImageUtilPNGWriteParams params = {random.between(-2, 11), random.below(2) == 0};
     const ImageUtilPNGWriteParams* given = random.below(4) == 0 ? nullptr : &params;
     uint8* file = nullptr;
@@ -445,7 +431,7 @@ TEST(RasterChecked_EncodePng, MakesTheBytesOfTheExactEncoder) {
 TEST(RasterChecked_EncodePng, RefusesWhatNoFileCanHold) {
   Random random(82);
   const GuardedView view(random, {8, 8}, 10, 10);
-  ImageUtilImage image = imageOf(random, view.view());
+  ImageUtilImage image = tests::imageOf(random, view.view(), 256);
   const size_t bytes = view.view().bytes;
   uint8* file = nullptr;
   size_t size = 77;

@@ -28,26 +28,46 @@ using tests::someSize;
 /// has left. The source must stay as it is.
 void compareCalls(Scene& scene, const NaiveArea& area, RasterStatus expected,
                   const std::function<RasterStatus()>& checked,
-                  const std::function<void(const NaiveArea&)>& exact, int round) {
+                  const std::function<void(const NaiveArea&)>& exact) {
   const Bytes before = scene.dst.bytes();
   const Bytes source = scene.src.bytes();
   const RasterStatus status = checked();
-  ASSERT_EQ(status, expected) << "round " << round << " " << tests::describe(scene.dst.view())
-                              << " " << scene.rect << " from " << tests::describe(scene.src.view())
-                              << " at " << scene.srcX << "," << scene.srcY;
+  ASSERT_EQ(status, expected) << tests::describe(scene.dst.view()) << " " << scene.rect << " from "
+                              << tests::describe(scene.src.view()) << " at " << scene.srcX << ","
+                              << scene.srcY;
   const Bytes after = scene.dst.bytes();
   scene.dst.assign(before);
   if (status == RASTER_STATUS_OK && !area.drawsNothing()) exact(area);
-  ASSERT_EQ(after, scene.dst.bytes()) << "round " << round;
-  ASSERT_EQ(source, scene.src.bytes()) << "round " << round;
+  ASSERT_EQ(after, scene.dst.bytes());
+  ASSERT_EQ(source, scene.src.bytes());
 }
 
 constexpr int kRounds = 3000;
 
+/// The format of a scene's source: any, or mostly the one that a call takes.
+enum class Source { kAny, kLikeDestination, kBits, kWithAlpha };
+
+PixelFormat sourceFormat(Random& random, Source source, PixelFormat destination) {
+  if (source == Source::kAny || random.below(6) == 0) return tests::someFormat(random);
+  if (source == Source::kLikeDestination) return destination;
+  return source == Source::kBits ? PixelFormat{1, 1} : PixelFormat{24, 32};
+}
+
+/// Runs a test on random scenes, up to the first one in which it fails.
+void forScenes(uint32 seed, int rounds, Source source,
+               const std::function<void(Scene&, Random&)>& test) {
+  Random random(seed);
+  for (int round = 0; round < tests::rounds(rounds); ++round) {
+    SCOPED_TRACE("round " + std::to_string(round));
+    const PixelFormat format = tests::someFormat(random);
+    Scene scene(random, format, sourceFormat(random, source, format));
+    test(scene, random);
+    if (testing::Test::HasFatalFailure()) return;
+  }
+}
+
 TEST(RasterChecked_Fill, EqualsTheExactFill) {
-  Random random(11);
-  for (int round = 0; round < kRounds; ++round) {
-    Scene s(random, tests::someFormat(random), {8, 8});
+  forScenes(11, kRounds, Source::kAny, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const NaiveArea area = naiveArea(s.rect, d);
     const uint32 pixel = random.word();
@@ -56,15 +76,12 @@ TEST(RasterChecked_Fill, EqualsTheExactFill) {
         [&] { return RasterChecked_Fill(&s.dst, &s.rect, pixel, s.flags); },
         [&](const NaiveArea& a) {
           Raster_RectFill(d.data, d.pitch, d.bpp / 8, pixel, a.x.to, a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_FillAlpha, EqualsTheExactFill) {
-  Random random(12);
-  for (int round = 0; round < kRounds; ++round) {
-    Scene s(random, tests::someFormat(random), {8, 8});
+  forScenes(12, kRounds, Source::kAny, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const NaiveArea area = naiveArea(s.rect, d);
     const auto alpha = static_cast<uint8>(random.below(256));
@@ -75,15 +92,12 @@ TEST(RasterChecked_FillAlpha, EqualsTheExactFill) {
         [&] { return RasterChecked_FillAlpha(&s.dst, &s.rect, alpha, s.flags); },
         [&](const NaiveArea& a) {
           Raster_RectFillAlpha(d.data, d.pitch, alpha, a.x.to, a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_RopFill, EqualsTheExactFill) {
-  Random random(13);
-  for (int round = 0; round < kRounds; ++round) {
-    Scene s(random, tests::someFormat(random), {8, 8});
+  forScenes(13, kRounds, Source::kAny, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const NaiveArea area = naiveArea(s.rect, d);
     const uint32 pixel = random.word();
@@ -94,9 +108,8 @@ TEST(RasterChecked_RopFill, EqualsTheExactFill) {
         [&](const NaiveArea& a) {
           Raster_RectROPfill(d.data, static_cast<int32>(d.pitch), d.bpp / 8, pixel, rop, a.x.to,
                              a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 /// BAD_FORMAT for a pair of sizes that do not go together, unless the rectangle is refused.
@@ -106,10 +119,7 @@ RasterStatus statusForPair(const NaiveArea& area, uint32 flags, bool fits) {
 }
 
 TEST(RasterChecked_Copy, EqualsTheExactCopy) {
-  Random random(14);
-  for (int round = 0; round < kRounds; ++round) {
-    const PixelFormat format = tests::someFormat(random);
-    Scene s(random, format, random.below(4) == 0 ? tests::someFormat(random) : format);
+  forScenes(14, kRounds, Source::kLikeDestination, [](Scene& s, Random& /*random*/) {
     const RasterView& d = s.dst.view();
     const RasterView& from = s.src.view();
     const NaiveArea area = s.area();
@@ -119,16 +129,12 @@ TEST(RasterChecked_Copy, EqualsTheExactCopy) {
         [&](const NaiveArea& a) {
           Raster_RectCopy(d.data, d.pitch, from.data, from.pitch, d.bpp / 8, a.x.from, a.y.from,
                           a.x.to, a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_RopCopy, EqualsTheExactCopy) {
-  Random random(15);
-  for (int round = 0; round < kRounds; ++round) {
-    const PixelFormat format = tests::someFormat(random);
-    Scene s(random, format, random.below(4) == 0 ? tests::someFormat(random) : format);
+  forScenes(15, kRounds, Source::kLikeDestination, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const RasterView& from = s.src.view();
     const NaiveArea area = s.area();
@@ -143,9 +149,8 @@ TEST(RasterChecked_RopCopy, EqualsTheExactCopy) {
           Raster_RectROPcopy(d.data, static_cast<int32>(d.pitch), from.data,
                              static_cast<int32>(from.pitch), d.bpp / 8, a.x.from, a.y.from, rop,
                              a.x.to, a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_RopCopy, MovesWithinOneView) {
@@ -188,10 +193,7 @@ TEST(RasterChecked_Copy, RefusesOtherViewsOfTheSameMemory) {
 }
 
 TEST(RasterChecked_Tile, EqualsTheExactTiling) {
-  Random random(18);
-  for (int round = 0; round < kRounds; ++round) {
-    const PixelFormat format = tests::someFormat(random);
-    Scene s(random, format, random.below(4) == 0 ? tests::someFormat(random) : format);
+  forScenes(18, kRounds, Source::kLikeDestination, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const RasterView& tile = s.src.view();
     const NaiveArea area = naiveArea(s.rect, d);
@@ -212,9 +214,8 @@ TEST(RasterChecked_Tile, EqualsTheExactTiling) {
                                    static_cast<int32>(d.bpp / 8), static_cast<uint32>(x),
                                    static_cast<uint32>(y), tile.width, tile.height, rop, a.x.to,
                                    a.y.to, a.x.size, a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 /// Bit (x, y) of a plane, looked up by itself.
@@ -235,10 +236,7 @@ void drawBits(const RasterView& d, const RasterView& plane, const NaiveArea& a, 
 }
 
 TEST(RasterChecked_Bits, EqualsABitByBitExpansion) {
-  Random random(19);
-  for (int round = 0; round < 2 * kRounds; ++round) {
-    Scene s(random, tests::someFormat(random),
-            random.below(9) == 0 ? tests::someFormat(random) : PixelFormat{1, 1});
+  forScenes(19, 2 * kRounds, Source::kBits, [](Scene& s, Random& random) {
     const RasterView& plane = s.src.view();
     const NaiveArea area = s.area();
     const bool stencil = random.below(2) == 0;
@@ -254,9 +252,8 @@ TEST(RasterChecked_Bits, EqualsABitByBitExpansion) {
         },
         [&](const NaiveArea& a) {
           drawBits(s.dst.view(), plane, a, stencil, foreground, background);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_Bits, TakesLongRowsFromAnyBit) {
@@ -276,9 +273,7 @@ TEST(RasterChecked_Bits, TakesLongRowsFromAnyBit) {
 int32 codeOf(const RasterView& v) { return static_cast<int32>(Raster_GetBPPDepth(v.depth, v.bpp)); }
 
 TEST(RasterChecked_Convert, EqualsTheExactConversion) {
-  Random random(21);
-  for (int round = 0; round < 2 * kRounds; ++round) {
-    Scene s(random, tests::someFormat(random), tests::someFormat(random));
+  forScenes(21, 2 * kRounds, Source::kAny, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const RasterView& from = s.src.view();
     const NaiveArea area = s.area();
@@ -301,16 +296,12 @@ TEST(RasterChecked_Convert, EqualsTheExactConversion) {
           Raster_ConvertPixels(d.data, d.pitch, codeOf(d), from.data, from.pitch, codeOf(from),
                                pseudo, whole.data(), a.x.from, a.y.from, a.x.to, a.y.to, a.x.size,
                                a.y.size);
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_Blend, EqualsTheExactBlend) {
-  Random random(22);
-  for (int round = 0; round < 2 * kRounds; ++round) {
-    Scene s(random, tests::someFormat(random),
-            random.below(9) == 0 ? tests::someFormat(random) : PixelFormat{24, 32});
+  forScenes(22, 2 * kRounds, Source::kWithAlpha, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const RasterView& from = s.src.view();
     const NaiveArea area = s.area();
@@ -330,9 +321,8 @@ TEST(RasterChecked_Blend, EqualsTheExactBlend) {
           Raster_AlphaBlend(d.data, a.x.to, a.y.to, d.pitch, from.data, a.x.from, a.y.from,
                             from.pitch, a.x.size, a.y.size, d.depth, d.bpp, blend.op, blend.flags,
                             blend.srcAlpha, blend.dstAlpha, static_cast<uint8>(blend.staged));
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_Blend, IsOverWithoutABlend) {
@@ -369,10 +359,7 @@ double someFactor(Random& random) {
 bool isFactor(double f) { return std::isfinite(f) && f > 1.0 / 32767; }
 
 TEST(RasterChecked_Scale, EqualsTheExactScaling) {
-  Random random(24);
-  for (int round = 0; round < 2 * kRounds; ++round) {
-    const PixelFormat format = tests::someFormat(random);
-    Scene s(random, random.below(3) == 0 ? tests::someFormat(random) : format, format);
+  forScenes(24, 2 * kRounds, Source::kLikeDestination, [](Scene& s, Random& random) {
     const RasterView& d = s.dst.view();
     const RasterView& from = s.src.view();
     const NaiveArea area = naiveArea(s.rect, d);
@@ -395,9 +382,8 @@ TEST(RasterChecked_Scale, EqualsTheExactScaling) {
               static_cast<int32>(a.y.to + a.y.size), from.data, static_cast<int32>(from.pitch),
               from.bpp, static_cast<int32>(from.depth), 0, from.width, from.height, 0, x, y,
               static_cast<int32>(smooth)));
-        },
-        round);
-  }
+        });
+  });
 }
 
 TEST(RasterChecked_Scale, RefusesSidesOf32768) {
@@ -414,10 +400,7 @@ TEST(RasterChecked_Scale, RefusesSidesOf32768) {
 // ---- Comparison --------------------------------------------------------------------------------
 
 TEST(RasterChecked_Compare, EqualsTheExactComparison) {
-  Random random(26);
-  for (int round = 0; round < kRounds; ++round) {
-    const PixelFormat format = tests::someFormat(random);
-    Scene s(random, format, random.below(6) == 0 ? tests::someFormat(random) : format);
+  forScenes(26, kRounds, Source::kLikeDestination, [](Scene& s, Random& random) {
     const RasterView& a = s.dst.view();
     const RasterView& b = s.src.view();
     if (random.below(2) == 0) {  // equal but for a byte
@@ -437,8 +420,8 @@ TEST(RasterChecked_Compare, EqualsTheExactComparison) {
                                       static_cast<int32>(b.bpp), area.x.to, area.y.to, area.x.from,
                                       area.y.from, area.x.size, area.y.size);
     }
-    ASSERT_EQ(difference, expected) << "round " << round;
-  }
+    ASSERT_EQ(difference, expected);
+  });
 }
 
 TEST(RasterChecked_CompareRects, LooksAtSixteenEntriesAtMost) {

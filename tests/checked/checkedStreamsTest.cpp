@@ -4,27 +4,22 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <cstring>
-#include <memory>
 
 #include "checked/checkedScenes.h"
 #include "rasterChecked.h"
+#include "support/allocated.h"
 #include "support/recordedMessages.h"
 #include "support/someValues.h"
 
 namespace {
 
+using tests::Allocated;
 using tests::Bytes;
 using tests::GuardedBuffer;
 using tests::GuardedView;
 using tests::PixelFormat;
 using tests::Random;
-
-struct Free {
-  void operator()(uint8* block) const { free(block); }
-};
-using Owned = std::unique_ptr<uint8, Free>;
 
 /// Pixels with runs in them.
 void makeRuns(Random& random, GuardedView& view) {
@@ -48,7 +43,7 @@ Bytes exactBlock(const RasterView& v) {
   uint8* block = nullptr;
   uint32 size = 0;
   Raster_Compress(v.data, v.pitch, v.bpp, v.width, v.height, &block, &size);
-  const Owned owned(block);
+  const Allocated owned(block);
   return {block, block + size};
 }
 
@@ -60,7 +55,7 @@ TEST(RasterChecked_Compress, EqualsTheExactCompression) {
     uint8* block = nullptr;
     size_t size = 0;
     ASSERT_EQ(RasterChecked_Compress(&view, &block, &size), RASTER_STATUS_OK);
-    const Owned owned(block);
+    const Allocated owned(block);
     ASSERT_EQ(Bytes(block, block + size), exactBlock(view.view()));
   }
 }
@@ -99,7 +94,7 @@ TEST(RasterChecked_Decompress, GivesThePixelsBack) {
     RasterView pixels = {};
     ASSERT_EQ(RasterChecked_Decompress(block.data(), block.size(), nullptr, &pixels),
               RASTER_STATUS_OK);
-    const Owned owned(pixels.data);
+    const Allocated owned(pixels.data);
     ASSERT_EQ(RasterChecked_View(&pixels), RASTER_STATUS_OK);
     ASSERT_EQ(pixels.depth, std::min(24u, info.bpp));
     ASSERT_EQ(Bytes(pixels.data, pixels.data + pixels.bytes), view.bytes());
@@ -107,7 +102,7 @@ TEST(RasterChecked_Decompress, GivesThePixelsBack) {
     uint8* exact = nullptr;
     uint32 ignored = 0;
     Raster_Decompress(block.data(), &exact, &ignored, &ignored, &ignored, &ignored);
-    const Owned exactOwned(exact);
+    const Allocated exactOwned(exact);
     ASSERT_EQ(0, memcmp(exact, pixels.data, pixels.bytes));
   }
 }
@@ -118,11 +113,11 @@ TEST(RasterChecked_Decompress, FillsWhatIsNoWholePixelWithZeros) {
   uint8* block = nullptr;
   uint32 size = 0;
   Raster_Compress(bytes.data(), 5, 24, 1, 2, &block, &size);  // 10 bytes: three pixels
-  const Owned owned(block);
+  const Allocated owned(block);
   ASSERT_EQ(size, 20u + 9);
   RasterView pixels = {};
   ASSERT_EQ(RasterChecked_Decompress(block, size, nullptr, &pixels), RASTER_STATUS_OK);
-  const Owned made(pixels.data);
+  const Allocated made(pixels.data);
   EXPECT_EQ(pixels.bytes, 10u);
   EXPECT_EQ(pixels.data[8], 9);
   EXPECT_EQ(pixels.data[9], 0);

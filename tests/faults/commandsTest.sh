@@ -2,13 +2,14 @@
 # Every command that reads and writes files, while single calls of the system fail or memory is short: one
 # line and the exit status of a failure, or the same result as ever; an old file as it was or whole.
 # In the environment: FAULT_SHIM, the library that makes calls fail.
-data=$(cd "$(dirname "$0")/../data" && pwd)
-. "$(dirname "$0")/../tools/common.sh"
+here=$(cd "$(dirname "$0")" && pwd)
+. "$here/../tools/common.sh"
+. "$here/eachCall.sh"
 
 makePicture small.png 2 2 0xFF112233 0xFF445566 0xFF778899 0xFFAABBCC
 makePicture alpha.png 2 2 0x80112233 0xFF445566 0x00000000 0xFFAABBCC
 makePicture other.png 1 1 0xFF000000
-cp "$data/clients.png" large.png
+cp "$here/../data/clients.png" large.png
 rm -f picture.rblk out err
 ok pack small.png small.rblk
 printf '\020\200\360\200' >frame.yuv
@@ -45,7 +46,13 @@ judge() {
   [ "$(find folder -mindepth 1 ! -name made.png | wc -l)" = 0 ] || fail "$1: left $(ls -A folder)"
 }
 
-tried=0
+# once CALL WHAT NUMBER: false when there is no such call.
+once() {
+  run "$command" LD_PRELOAD="$FAULT_SHIM" FAULT="$1:$3:$2" FAULT_SEEN=../seen
+  [ -e seen ] || return 1
+  judge "$command, $1:$3:$2"
+}
+
 for command in "$@"; do
   run "$command" LD_PRELOAD="$FAULT_SHIM" FAULT=none:1:5
   [ "$status" = 0 ] || { fail "$command: $(cat err)"; continue; }
@@ -53,15 +60,7 @@ for command in "$@"; do
   cp out wantedOut
   for call in open read write close; do
     for what in 5 28; do
-      number=1
-      while
-        run "$command" LD_PRELOAD="$FAULT_SHIM" FAULT="$call:$number:$what" FAULT_SEEN=../seen
-        [ -e seen ]
-      do
-        judge "$command, $call:$number:$what"
-        number=$((number + 1))
-        tried=$((tried + 1))
-      done
+      eachCall once "$call" "$what"
     done
   done
 done

@@ -6,9 +6,12 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
+#include <initializer_list>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "fileIO.h"
@@ -258,6 +261,16 @@ void combine(const std::vector<Placed>& placed, Result* result) {
                                    static_cast<uint32>(images.size()), &result->image);
 }
 
+/// Images of one height beside each other, of these widths at these columns.
+std::vector<Placed> inARow(uint64 seed, uint32 height, uint32 bpp,
+                           std::initializer_list<std::pair<uint32, int32>> widthsAndColumns) {
+  Random random(seed);
+  std::vector<Placed> placed;
+  for (const auto& [width, column] : widthsAndColumns)
+    placed.push_back({noise(random, width, height, std::min(bpp, 24u), bpp), column, 0});
+  return placed;
+}
+
 /// A pixel of a 15-, 16-, 24- or 32-bit image as an opaque 32-bit one.
 uint32 opaquePixel(const ImageUtilImage& image, uint32 x, uint32 y) {
   uint32 pixel = 0;
@@ -350,10 +363,7 @@ TEST_F(ImageUtil_Combine, EqualsTheModel) {
 }
 
 TEST_F(ImageUtil_Combine, CopiesTwoNeighboursOf32Bits) {
-  Random random(4);
-  std::vector<Placed> placed;
-  placed.push_back({noise(random, 10, 10, 24, 32), 0, 0});
-  placed.push_back({noise(random, 10, 10, 24, 32), 10, 0});
+  const std::vector<Placed> placed = inARow(4, 10, 32, {{10, 0}, {10, 10}});
   Result result;
   combine(placed, &result);
   ASSERT_TRUE(result.ok);
@@ -380,11 +390,7 @@ TEST_F(ImageUtil_Combine, MarksGapsOf24BitsTransparent) {
 
 // Deliberate: only the areas are compared.
 TEST_F(ImageUtil_Combine, TakesAGapAndAnOverlapOfEqualAreaForACover) {
-  Random random(6);
-  std::vector<Placed> placed;
-  placed.push_back({noise(random, 2, 1, 24, 24), 0, 0});
-  placed.push_back({noise(random, 2, 1, 24, 24), 0, 0});
-  placed.push_back({noise(random, 2, 1, 24, 24), 4, 0});
+  const std::vector<Placed> placed = inARow(6, 1, 24, {{2, 0}, {2, 0}, {2, 4}});
   Result result;
   combine(placed, &result);
   ASSERT_TRUE(result.ok);
@@ -401,10 +407,7 @@ TEST_F(ImageUtil_Combine, GivesAZeroedRecordForNoImages) {
 }
 
 TEST_F(ImageUtil_Combine, CountsImagesWithoutData) {
-  Random random(7);
-  std::vector<Placed> placed;
-  placed.push_back({noise(random, 2, 1, 16, 16), 0, 0});
-  placed.push_back({noise(random, 3, 1, 16, 16), 2, 0});
+  std::vector<Placed> placed = inARow(7, 1, 16, {{2, 0}, {3, 2}});
   placed[1].picture.image.data = nullptr;
   Result result;
   combine(placed, &result);
@@ -576,29 +579,18 @@ TEST_F(ImageUtil_CropAndScaleImage, ScalesAsTheScalerDoes) {
 TEST_F(ImageUtil_CropAndScaleImage, KeepsTheShapeWhenOneSizeIsGiven) {
   Random random(14);
   const Picture picture = noise(random, 100, 50, 24, 32);
-  Crop c;
-  c.newWidth = 50;
-  {
+  const auto expectSize = [&](int32 Crop::*given, int32 value, uint32 width, uint32 height) {
+    Crop c;
+    c.*given = value;
     Result result;
     cropAndScale(picture.image, c, &result);
     ASSERT_TRUE(result.ok);
-    expectForm(result.image, 50, 25, 24, 32);
-  }
-  c = {};
-  c.newHeight = 20;
-  {
-    Result result;
-    cropAndScale(picture.image, c, &result);
-    ASSERT_TRUE(result.ok);
-    expectForm(result.image, 40, 20, 24, 32);
-  }
-  c = {};
-  c.newWidth = 1;  // a height of half a pixel
-  Result result;
-  cropAndScale(picture.image, c, &result);
-  ASSERT_TRUE(result.ok);
-  expectForm(result.image, 1, 0, 24, 32);
-  EXPECT_NE(result.image.data, nullptr);
+    expectForm(result.image, width, height, 24, 32);
+    EXPECT_NE(result.image.data, nullptr);
+  };
+  expectSize(&Crop::newWidth, 50, 50, 25);
+  expectSize(&Crop::newHeight, 20, 40, 20);
+  expectSize(&Crop::newWidth, 1, 1, 0);  // a height of half a pixel
 }
 
 // Deliberate: the scaler's refusal is not reported.

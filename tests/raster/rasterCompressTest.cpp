@@ -12,6 +12,7 @@
 #include "imageUtil.h"
 #include "raster.h"
 #include "reference/rasterCompressReference.h"
+#include "support/allocated.h"
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 #include "support/recordedMessages.h"
@@ -20,6 +21,7 @@
 
 namespace {
 
+using tests::Allocated;
 /// What the library asked for last.
 size_t lastAllocation = 0;
 /// A block that is handed out instead of fresh memory.
@@ -46,11 +48,6 @@ using tests::Guard;
 using tests::GuardedBuffer;
 using tests::Messages;
 using tests::Random;
-
-struct Free {
-  void operator()(uint8* block) const { free(block); }
-};
-using Owned = std::unique_ptr<uint8, Free>;
 
 /// Compresses `src`, which is placed between guards, into memory that ends at a guard, and returns
 /// the block.
@@ -152,7 +149,7 @@ TEST(Raster_Compress, EqualsTheModelForEveryImageOfTenPixelsAndThreeColors) {
     uint8* block = nullptr;
     uint32 size = 0;
     Raster_Compress(pixels.data(), 0, 32, 10, 1, &block, &size);
-    const Owned owned(block);
+    const Allocated owned(block);
     ASSERT_EQ(Bytes(block, block + size),
               reference::compress(reference::toBytes(pixels), 0, 32, 10, 1))
         << describe(pixels);
@@ -219,7 +216,7 @@ TEST(Raster_Compress, StoresAnEmptyImage) {
     uint8* block = nullptr;
     uint32 size = 0;
     Raster_Compress(nullptr, 0, bpp, 0, 7, &block, &size);
-    const Owned owned(block);
+    const Allocated owned(block);
     EXPECT_EQ(Bytes(block, block + size), reference::toBytes({0, 7, 0, bpp, 0}));
     EXPECT_EQ(lastAllocation, 32u);
   }
@@ -268,7 +265,7 @@ TEST(Raster_Compress, PanicsForOtherDepthsAtLine114) {
     uint32 size = 0;
     const Messages said =
         tests::messagesOf([&] { Raster_Compress(nullptr, 4, bpp, 1, 1, &block, &size); });
-    const Owned owned(block);
+    const Allocated owned(block);
     EXPECT_EQ(said.panic, "NOT_IMPLEMENTED lib/raster/rasterCompress:114\n") << bpp;
     EXPECT_EQ(said.warning, "");
   }
@@ -348,7 +345,7 @@ TEST(Raster_Decompress, PanicsForACodeOfAStoredDepthAtLine187) {
     uint32 pitch, bits, width, height;
     const Messages said = tests::messagesOf(
         [&] { Raster_Decompress(block.data(), &data, &pitch, &bits, &width, &height); });
-    const Owned owned(data);
+    const Allocated owned(data);
     EXPECT_EQ(said.panic, "NOT_IMPLEMENTED lib/raster/rasterCompress:187\n");
     EXPECT_EQ(bits, bpp);
   }
@@ -389,7 +386,7 @@ TEST(Raster_Decompress, ReadsAStoredBlockOfAnOddPitchWithinItsAllocation) {
   uint8* block = nullptr;
   uint32 size = 0;
   Raster_Compress(src.data(), 13, 24, 4, 3, &block, &size);
-  const Owned owned(block);
+  const Allocated owned(block);
   EXPECT_EQ(size, 59u);
   uint8* place[16] = {};
   uint32 pitch, bpp, width, height;

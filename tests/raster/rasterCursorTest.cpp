@@ -164,6 +164,15 @@ TEST(Raster_ExpandPlanarCursorData, PanicsForOtherDepthsAfterTheAndPlane) {
   EXPECT_EQ(Bytes(dst.begin(), dst.begin() + 128), plane);
 }
 
+void expectBoxOfModel(const RasterFrameBufferDesc& fb, const RasterCursor& cursor, int32 x,
+                      int32 y) {
+  RasterCursorBox expected = {-1, -2, -3, -4, -5, -6};
+  RasterCursorBox actual = expected;  // written only when visible
+  const bool isVisible = reference::cursorBox(fb, cursor, x, y, &expected);
+  ASSERT_EQ(Raster_ComputeCursorBox(&fb, &cursor, x, y, &actual), isVisible) << x << "," << y;
+  ASSERT_EQ(0, memcmp(&actual, &expected, sizeof actual)) << x << "," << y;
+}
+
 TEST(Raster_ComputeCursorBox, EqualsTheModelForEveryPosition) {
   const RasterFrameBufferDesc fb = {10, 8, 24, 32, 40};
   for (const auto& [width, height] : {std::array{4u, 3u}, std::array{1u, 1u}, std::array{12u, 9u},
@@ -174,16 +183,8 @@ TEST(Raster_ComputeCursorBox, EqualsTheModelForEveryPosition) {
       cursor.hotY = hot / 2;
       cursor.width = width;
       cursor.height = height;
-      for (int32 y = -20; y < 25; ++y) {
-        for (int32 x = -20; x < 28; ++x) {
-          RasterCursorBox expected{-1, -2, -3, -4, -5, -6};
-          RasterCursorBox actual = expected;  // written only when visible
-          ASSERT_EQ(Raster_ComputeCursorBox(&fb, &cursor, x, y, &actual),
-                    reference::cursorBox(fb, cursor, x, y, &expected))
-              << x << "," << y;
-          ASSERT_EQ(0, memcmp(&actual, &expected, sizeof actual)) << x << "," << y;
-        }
-      }
+      for (int32 y = -20; y < 25; ++y)
+        for (int32 x = -20; x < 28; ++x) expectBoxOfModel(fb, cursor, x, y);
     }
   }
 }
@@ -209,14 +210,9 @@ TEST(Raster_ComputeCursorBox, TakesTheFrameBufferSizeAsUnsigned) {
   cursor.height = 8;
   for (const uint32 size : {0x7FFFFFFFu, 0x80000000u, 0x80000001u, 0xFFFFFFFFu}) {
     const RasterFrameBufferDesc fb = {size, size, 24, 32, 0};
-    for (const int32 at : {-3, 100, 0x7FFFFFF0, 0x7FFFFFFC, INT32_MAX}) {
-      RasterCursorBox expected{};
-      RasterCursorBox actual{};
-      ASSERT_EQ(Raster_ComputeCursorBox(&fb, &cursor, at, at, &actual),
-                reference::cursorBox(fb, cursor, at, at, &expected))
-          << size << " " << at;
-      ASSERT_EQ(0, memcmp(&actual, &expected, sizeof actual)) << size << " " << at;
-    }
+    SCOPED_TRACE(size);
+    for (const int32 at : {-3, 100, 0x7FFFFFF0, 0x7FFFFFFC, INT32_MAX})
+      expectBoxOfModel(fb, cursor, at, at);
   }
 }
 
@@ -253,7 +249,9 @@ struct Scene {
 };
 
 /// Any visible cursor on any of the formats; pitches may be odd.
-Scene someScene(Random& random, uint32 type, const Format& format) {
+Scene someScene(Random& random) {
+  const Format& format = kFormats[random.below(5)];
+  const uint32 type = random.below(2);
   Scene s{};
   do {
     s.fb = {1 + random.below(60), 1 + random.below(20), format.depth, format.bpp, 0};
@@ -317,33 +315,32 @@ Bytes drawn(const Scene& s, Bytes into, uint32 pitch, uint32 x, uint32 y) {
 TEST(Raster_DrawCursor, DrawsBothKindsIntoTheFrameBuffer) {
   Random random(4);
   for (int round = 0; round < tests::rounds(1500); ++round) {
-    const Format& format = kFormats[random.below(5)];
-    Scene s = someScene(random, random.below(2), format);
+    Scene s = someScene(random);
     const Planes planes(s);
     GuardedBuffer fb(s.screen.size(), tests::someGuard(random));
     fb.assign(s.screen);
     Raster_DrawCursor(fb.data(), &s.fb, nullptr, 0, &s.cursor, &s.box);
     ASSERT_EQ(fb.bytes(), drawn(s, s.screen, s.fb.pitch, static_cast<uint32>(s.box.x),
                                 static_cast<uint32>(s.box.y)))
-        << "round " << round << " type " << s.cursor.type << " depth " << format.depth;
+        << "round " << round << " type " << s.cursor.type << " depth " << s.fb.depth;
   }
 }
 
 TEST(Raster_DrawCursor, DrawsIntoACopyAndLeavesTheFrameBufferUnchanged) {
   Random random(5);
   for (int round = 0; round < tests::rounds(1500); ++round) {
-    const Format& format = kFormats[random.below(5)];
-    Scene s = someScene(random, random.below(2), format);
+    Scene s = someScene(random);
     const Planes planes(s);
-    const uint32 savePitch = (static_cast<uint32>(s.box.width) + random.below(3)) * format.bytes();
+    const uint32 bytes = s.fb.bpp / 8;
+    const uint32 savePitch = (static_cast<uint32>(s.box.width) + random.below(3)) * bytes;
     Bytes save = random.bytes((static_cast<size_t>(s.box.height) - 1) * savePitch +
-                              static_cast<size_t>(s.box.width) * format.bytes());
+                              static_cast<size_t>(s.box.width) * bytes);
     GuardedBuffer fb(s.screen.size());
     GuardedBuffer copy(save.size());
     fb.assign(s.screen);
     copy.assign(save);
     Raster_DrawCursor(fb.data(), &s.fb, copy.data(), savePitch, &s.cursor, &s.box);
-    save = savedArea(s, format.bytes(), savePitch, save);
+    save = savedArea(s, bytes, savePitch, save);
     ASSERT_EQ(copy.bytes(), drawn(s, save, savePitch, 0, 0)) << "round " << round;
     ASSERT_EQ(fb.bytes(), s.screen);
   }

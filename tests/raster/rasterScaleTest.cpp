@@ -136,16 +136,23 @@ uint32 someSize(Random& random, uint32 large) {
   return random.below(6) == 0 ? 1 + random.below(large) : 1 + random.below(40);
 }
 
+/// Any formats, sizes, factors and smoothing.
+ScaleCall someCall(Random& random, uint32 largestWidth) {
+  ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
+  c.dstWidth = someSize(random, largestWidth);
+  c.dstHeight = someSize(random, 50);
+  c.srcWidth = someSize(random, largestWidth);
+  c.srcHeight = someSize(random, 50);
+  c.scaleX = someScale(random);
+  c.scaleY = someScale(random);
+  c.smooth = random.between(0, 1);
+  return c;
+}
+
 void checkRandomCalls(uint64 seed, int rounds, int32 smooth) {
   Random random(seed);
   for (int round = 0; round < rounds; ++round) {
-    ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
-    c.dstWidth = someSize(random, 700);
-    c.dstHeight = someSize(random, 50);
-    c.srcWidth = someSize(random, 700);
-    c.srcHeight = someSize(random, 50);
-    c.scaleX = someScale(random);
-    c.scaleY = someScale(random);
+    ScaleCall c = someCall(random, 700);
     if (random.below(4) == 0) c.scaleY = c.scaleX;
     if (random.below(6) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25});
     if (random.below(4) == 0) c.scaleX = double{1} * c.dstWidth / c.srcWidth;
@@ -185,15 +192,9 @@ uint32 somePitch(Random& random, uint32 rowBytes) {
 TEST(Raster_Scale, EqualsTheModelWhereTheFrameBuffersOverlap) {
   Random random(10);
   for (int round = 0; round < 12000; ++round) {
-    ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
-    c.dstWidth = someSize(random, 200);
-    c.dstHeight = someSize(random, 50);
-    c.srcWidth = someSize(random, 200);
-    c.srcHeight = someSize(random, 50);
-    c.scaleX = someScale(random);
-    c.scaleY = random.below(3) == 0 ? c.scaleX : someScale(random);
+    ScaleCall c = someCall(random, 200);
+    if (random.below(3) == 0) c.scaleY = c.scaleX;
     if (random.below(4) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25, 1.0, 2.0});
-    c.smooth = random.between(0, 1);
     someRectangle(random, c);
     const uint32 srcPitch = somePitch(random, c.srcWidth * (c.srcBpp / 8));
     c.srcPitch = static_cast<int32>(srcPitch);
@@ -212,14 +213,7 @@ TEST(Raster_Scale, EqualsTheModelWhereTheFrameBuffersOverlap) {
 TEST(Raster_Scale, EqualsTheModelWhereDestinationRowsOverlap) {
   Random random(11);
   for (int round = 0; round < 6000; ++round) {
-    ScaleCall c = withFormats(kFormats[random.below(std::size(kFormats))]);
-    c.dstWidth = someSize(random, 200);
-    c.dstHeight = someSize(random, 50);
-    c.srcWidth = someSize(random, 200);
-    c.srcHeight = someSize(random, 20);
-    c.scaleX = someScale(random);
-    c.scaleY = someScale(random);
-    c.smooth = random.between(0, 1);
+    ScaleCall c = someCall(random, 200);
     someRectangle(random, c);
     placeBuffers(random, c);
     c.dstPitch = random.below(c.dstWidth * (c.dstBpp / 8) + 1);

@@ -16,44 +16,32 @@ ok cursorWidth=0 cursorHeight=0 cursorSent=0 -- "$tool" screenshot shot.png --cu
 ok hotX=65535 hotY=65535 -- "$tool" screenshot shot.png --cursor --cursor-scale 16
 rm -f shot.png
 
-# lies TEXT NAME=VALUE...: a display that a screenshot with its cursor is refused of.
+# lies TEXT "NAME=VALUE..."...: displays that a screenshot with its cursor is refused of.
 lies() {
   text=$1
   shift
-  refused 1 "$text" "$@" -- "$tool" screenshot no.png --cursor --cursor-scale 16
-  absent no.png
+  for display in "$@"; do
+    # shellcheck disable=SC2086  # words
+    refused 1 "$text" $display -- "$tool" screenshot no.png --cursor --cursor-scale 16
+    absent no.png
+  done
 }
 
 # More colours than an index has values, and fewer than the reply says.
-lies 'colours' depth=8 bpp=8 colours=257 coloursSent=257
-lies 'colours' depth=8 bpp=8 colours=65535 coloursSent=65535
-lies 'colours' depth=8 bpp=8 colours=256 coloursSent=0
-lies 'colours' depth=8 bpp=8 colours=3 coloursSent=2
+lies 'colours' 'depth=8 bpp=8 colours=257 coloursSent=257' 'depth=8 bpp=8 colours=65535 coloursSent=65535' \
+  'depth=8 bpp=8 colours=256 coloursSent=0' 'depth=8 bpp=8 colours=3 coloursSent=2'
 
 # Fewer pixels than were asked for, and rows that are padded to nothing.
-lies 'fewer pixels' imageCut=4
-lies 'fewer pixels' imageCut=100000
-lies 'not supported' pad=0
-lies 'not supported' pad=1
-lies 'not supported' pad=33
-lies 'not supported' pad=255
-lies 'has no pixels' width=0
-lies 'has no pixels' height=0
+lies 'fewer pixels' imageCut=4 imageCut=100000
+lies 'not supported' pad=0 pad=1 pad=33 pad=255
+lies 'has no pixels' width=0 height=0
 
 # A cursor that is larger than its reply, or than any cursor.
-lies 'cursor' cursorSent=15
-lies 'cursor' cursorSent=0
-lies 'cursor' cursorWidth=1000 cursorHeight=1000
-lies 'cursor' cursorWidth=65535 cursorHeight=65535
-lies 'cursor' cursorWidth=65535 cursorHeight=100 cursorSent=6553500
+lies 'cursor' cursorSent=15 cursorSent=0 'cursorWidth=1000 cursorHeight=1000' \
+  'cursorWidth=65535 cursorHeight=65535' 'cursorWidth=65535 cursorHeight=100 cursorSent=6553500'
 
 # A greeting whose counts lead beyond its end.
-lies 'its screens' roots=255 depths=255
-lies 'its screens' formats=255
-lies 'its screens' depths=255
-lies 'its screens' visuals=65535
-lies 'its screens' vendor=65535
-lies 'its screens' setupCut=4
-lies 'its screens' setupCut=80
+lies 'its screens' 'roots=255 depths=255' formats=255 depths=255 visuals=65535 vendor=65535 setupCut=4 \
+  setupCut=80
 lies 'cannot connect' roots=0
 finish
