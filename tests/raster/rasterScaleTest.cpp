@@ -151,7 +151,7 @@ ScaleCall someCall(Random& random, uint32 largestWidth) {
 
 void checkRandomCalls(uint64 seed, int rounds, int32 smooth) {
   Random random(seed);
-  for (int round = 0; round < rounds; ++round) {
+  for (int round = 0; round < tests::rounds(rounds); ++round) {
     ScaleCall c = someCall(random, 700);
     if (random.below(4) == 0) c.scaleY = c.scaleX;
     if (random.below(6) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25});
@@ -191,7 +191,7 @@ uint32 somePitch(Random& random, uint32 rowBytes) {
 /// The row cache decides: a source row is resampled whole when it is first needed, and stays so.
 TEST(Raster_Scale, EqualsTheModelWhereTheFrameBuffersOverlap) {
   Random random(10);
-  for (int round = 0; round < 12000; ++round) {
+  for (int round = 0; round < tests::rounds(12000); ++round) {
     ScaleCall c = someCall(random, 200);
     if (random.below(3) == 0) c.scaleY = c.scaleX;
     if (random.below(4) == 0) c.scaleX = c.scaleY = random.oneOf({0.5, 0.25, 1.0, 2.0});
@@ -212,7 +212,7 @@ TEST(Raster_Scale, EqualsTheModelWhereTheFrameBuffersOverlap) {
 
 TEST(Raster_Scale, EqualsTheModelWhereDestinationRowsOverlap) {
   Random random(11);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     ScaleCall c = someCall(random, 200);
     someRectangle(random, c);
     placeBuffers(random, c);
