@@ -11,6 +11,8 @@
 namespace tool {
 namespace {
 
+constexpr RasterLimits kLimits = {kLargestSide, kLargestSide, kLargestPicture, UINT64_MAX, 0, 0};
+
 /// Pixel units of the image, row padding included.
 uint64 unitsOf(const BlockHeader& header) {
   return uint64{header.pitch} * header.height / (header.bpp / 8);
@@ -36,7 +38,6 @@ bool countPixels(const uint8* code, uint32 codeWords, uint64& pixels) {
 }
 
 std::string codeFault(const uint8* code, size_t size, const BlockHeader& header) {
-  if (header.bpp != 32) return "only pixels of 32 bits can be coded";
   if (header.payload() != size) return "its code is not as long as its header says";
   uint64 pixels = 0;
   if (!countPixels(code, header.codeWords, pixels)) return "its code ends where a count should be";
@@ -53,6 +54,24 @@ std::string storedFault(size_t size, const BlockHeader& header) {
   return {};
 }
 
+std::string wrongSize(const BlockHeader& header) {
+  return "it is of " + std::to_string(header.width) + "x" + std::to_string(header.height) +
+         " pixels";
+}
+
+/// In our words, why the library does not take a header.
+std::string reasonAgainst(const BlockHeader& header, RasterStatus status) {
+  const uint32 bpp = header.bpp;
+  if (bpp != 8 && bpp != 16 && bpp != 24 && bpp != 32)
+    return "it has " + std::to_string(bpp) + " bits per pixel";
+  if (header.width > kLargestSide || header.height > kLargestSide) return wrongSize(header);
+  if (header.pitch < header.width * (bpp / 8)) return "its rows are longer than its pitch";
+  if (uint64{header.pitch} * header.height > kLargestPicture) return "it is too large";
+  if (header.pitch % (bpp / 8) != 0 && bpp != 24) return "its rows do not begin at whole pixels";
+  if (header.isCoded() && bpp != 32) return "only pixels of 32 bits can be coded";
+  return RasterChecked_Text(status);
+}
+
 }  // namespace
 
 uint64 BlockHeader::payload() const {
@@ -60,16 +79,13 @@ uint64 BlockHeader::payload() const {
 }
 
 std::string headerFault(const BlockHeader& header) {
-  const uint32 bpp = header.bpp;
-  if (bpp != 8 && bpp != 16 && bpp != 24 && bpp != 32)
-    return "it has " + std::to_string(bpp) + " bits per pixel";
-  if (header.width == 0 || header.height == 0 || header.width > kLargestSide ||
-      header.height > kLargestSide)
-    return "it is of " + std::to_string(header.width) + "x" + std::to_string(header.height) +
-           " pixels";
-  if (header.pitch < header.width * (bpp / 8)) return "its rows are longer than its pitch";
-  if (uint64{header.pitch} * header.height > kLargestPicture) return "it is too large";
-  return {};
+  uint8 bytes[sizeof header];
+  memcpy(bytes, &header, sizeof header);
+  RasterBlockInfo info;
+  const RasterStatus status = RasterChecked_BlockInfo(bytes, sizeof bytes, &kLimits, &info);
+  const bool isSound = status == RASTER_STATUS_OK || status == RASTER_STATUS_TRUNCATED;
+  if (!isSound) return reasonAgainst(header, status);
+  return header.width == 0 || header.height == 0 ? wrongSize(header) : "";
 }
 
 std::string blockFault(const uint8* block, size_t size, BlockHeader& header) {
@@ -84,7 +100,6 @@ std::string blockFault(const uint8* block, size_t size, BlockHeader& header) {
 }
 
 std::string drawBlock(const uint8* block, size_t size, const RasterView& to) {
-  constexpr RasterLimits kLimits = {kLargestSide, kLargestSide, kLargestPicture, UINT64_MAX, 0, 0};
   RasterView pixels;
   RasterStatus status = RasterChecked_Decompress(block, size, &kLimits, &pixels);
   if (status != RASTER_STATUS_OK) return RasterChecked_Text(status);

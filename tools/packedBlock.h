@@ -24,7 +24,8 @@ struct BlockHeader {
   uint64 payload() const;
 };
 
-/// What is wrong with a header, or nothing.
+/// What is wrong with a header, or nothing: what libraster-checked refuses, and pictures without
+/// pixels.
 std::string headerFault(const BlockHeader& header);
 
 /// Reads the header of a block and checks all of it: what is wrong, or nothing.
