@@ -6,6 +6,7 @@
 #define RASTER_REGION_RECT_LIST_H
 
 #include "raster.h"
+#include "rectArithmetic.h"
 
 namespace raster {
 
@@ -14,13 +15,6 @@ inline constexpr char kRectListSource[] = "lib/raster/rasterRect";
 inline constexpr uint32 kListSize = RASTER_RECT_LIST_SIZE;
 /// Deliberate: a sweep leaves one entry of the list unused, so its result always ends by itself.
 inline constexpr uint32 kMaxResult = kListSize - 1;
-
-inline int32 addWrap(int32 a, int32 b) {
-  return static_cast<int32>(static_cast<uint32>(a) + static_cast<uint32>(b));
-}
-inline int32 subWrap(int32 a, int32 b) {
-  return static_cast<int32>(static_cast<uint32>(a) - static_cast<uint32>(b));
-}
 
 inline int32 rightOf(const RectListEntry& r) { return addWrap(r.x, r.width); }
 inline int32 bottomOf(const RectListEntry& r) { return addWrap(r.y, r.height); }
