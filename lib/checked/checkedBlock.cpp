@@ -25,11 +25,11 @@ RasterBlockInfo headerOf(const uint8* block) {
 
 uint32 depthOf(uint32 bpp) { return std::min(bpp, 24u); }
 
-uint64 bytesOf(const RasterBlockInfo& info) { return uint64{info.pitch} * info.height; }
+uint64 pixelBytesOf(const RasterBlockInfo& info) { return uint64{info.pitch} * info.height; }
 
 /// The pixels that a header describes, in memory that is large enough.
 RasterView viewOf(const RasterBlockInfo& info, uint8* data) {
-  const auto bytes = static_cast<size_t>(std::min<uint64>(bytesOf(info), SIZE_MAX));
+  const auto bytes = static_cast<size_t>(std::min<uint64>(pixelBytesOf(info), SIZE_MAX));
   return {data, bytes, info.pitch, info.width, info.height, depthOf(info.bpp), info.bpp};
 }
 
@@ -37,7 +37,7 @@ RasterView viewOf(const RasterBlockInfo& info, uint8* data) {
 /// of them than any memory holds are not its fault: then a row is looked at.
 bool isHeader(const RasterBlockInfo& info) {
   RasterBlockInfo fitting = info;
-  if (bytesOf(info) > SIZE_MAX) fitting.height = 1;
+  if (pixelBytesOf(info) > SIZE_MAX) fitting.height = 1;
   uint8 anything = 0;
   const RasterView view = viewOf(fitting, &anything);
   return info.height <= INT32_MAX && checkPixels(&view) == RASTER_STATUS_OK &&
@@ -48,12 +48,12 @@ bool isHeader(const RasterBlockInfo& info) {
 /// row's gap has beyond whole pixels.
 uint64 payloadOf(const RasterBlockInfo& info) {
   if (info.codeWords != 0) return uint64{info.codeWords} * 4;
-  return bytesOf(info) - bytesOf(info) % (info.bpp / 8);
+  return pixelBytesOf(info) - pixelBytesOf(info) % (info.bpp / 8);
 }
 
 RasterStatus checkLimits(const RasterBlockInfo& info, uint64 size, const RasterLimits& limits) {
   const bool keeps = info.width <= limits.width && info.height <= limits.height &&
-                     bytesOf(info) <= std::min<uint64>(limits.pixelBytes, PTRDIFF_MAX) &&
+                     pixelBytesOf(info) <= std::min<uint64>(limits.pixelBytes, PTRDIFF_MAX) &&
                      size <= limits.inputBytes;
   return keeps ? RASTER_STATUS_OK : RASTER_STATUS_LIMIT;
 }
@@ -115,7 +115,7 @@ RasterStatus RasterChecked_Decompress(const uint8* block, size_t size, const Ras
   RasterView made = viewOf(info, nullptr);
   if (info.codeWords == 0) {
     // Raster_Decompress has another place for these.
-    made.data = Block::ofZeros(made.bytes).release();
+    made.data = OwnedBytes::ofZeros(made.bytes).release();
     if (made.data == nullptr) return RASTER_STATUS_NO_MEMORY;
     memcpy(made.data, block + kHeaderBytes, static_cast<size_t>(payloadOf(info)));
   } else {

@@ -46,12 +46,12 @@ RasterView planeView(const RasterCursor& cursor, uint8* data, size_t bytes) {
 }
 
 /// The planes of a cursor as views; both are the same for one with alpha.
-struct Planes {
+struct CursorPlanes {
   RasterView first;
   RasterView second;
 };
 
-RasterStatus takePlanes(const RasterCursor* cursor, size_t planeBytes, Planes* planes) {
+RasterStatus takePlanes(const RasterCursor* cursor, size_t planeBytes, CursorPlanes* planes) {
   if (cursor == nullptr) return RASTER_STATUS_NULL;
   if (cursor->type > RASTER_CURSOR_ALPHA) return RASTER_STATUS_BAD_ARGUMENT;
   const bool mask = isMask(*cursor);
@@ -125,7 +125,7 @@ RasterStatus scalePlane(const RasterView& plane, const RasterScaledCursor& size,
 }
 
 /// Both planes of a mask cursor, or the one of a cursor with alpha.
-RasterStatus scalePlanes(const RasterCursor& cursor, const Planes& planes,
+RasterStatus scalePlanes(const RasterCursor& cursor, const CursorPlanes& planes,
                          const RasterScaledCursor& size, Factors factors, uint8* padded,
                          uint8* dst) {
   if (!isMask(cursor)) return scalePlane(planes.first, size, factors, 0, true, padded, dst);
@@ -167,7 +167,7 @@ RasterStatus RasterChecked_DrawCursor(const RasterView* fb, const RasterView* sa
                                       const RasterCursor* cursor, size_t planeBytes, int32 x,
                                       int32 y, RasterCursorBox* box) {
   using namespace raster::checked;
-  Planes planes{};
+  CursorPlanes planes{};
   RasterStatus status = checkPixels(fb);
   if (status == RASTER_STATUS_OK) status = takePlanes(cursor, planeBytes, &planes);
   if (status == RASTER_STATUS_OK) status = checkFormats(*fb, save, *cursor, planes.first);
@@ -201,7 +201,7 @@ RasterStatus RasterChecked_ScaleCursor(const RasterCursor* cursor, size_t planeB
                                        double scaleY, const RasterLimits* limits, uint8* dst,
                                        size_t dstBytes, RasterScaledCursor* scaled) {
   using namespace raster::checked;
-  Planes planes{};
+  CursorPlanes planes{};
   RasterScaledCursor size{};
   RasterStatus status = takePlanes(cursor, planeBytes, &planes);
   if (status != RASTER_STATUS_OK) return status;
@@ -216,9 +216,9 @@ RasterStatus RasterChecked_ScaleCursor(const RasterCursor* cursor, size_t planeB
   const Span made(dst, bytes);
   if (made.overlaps(Span(planes.first)) || made.overlaps(Span(planes.second)))
     return RASTER_STATUS_OVERLAP;
-  const Block padded = Block::ofSize(uint64{4} * size.paddedWidth * size.paddedHeight);
+  const OwnedBytes padded = OwnedBytes::ofSize(uint64{4} * size.paddedWidth * size.paddedHeight);
   // Made elsewhere first: the second plane may find no memory.
-  const Block planesMade = Block::ofSize(bytes);
+  const OwnedBytes planesMade = OwnedBytes::ofSize(bytes);
   if (!padded || !planesMade) return RASTER_STATUS_NO_MEMORY;
   status = scalePlanes(*cursor, planes, size, factors, padded.get(), planesMade.get());
   if (status != RASTER_STATUS_OK) return status;

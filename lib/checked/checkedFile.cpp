@@ -100,13 +100,13 @@ RasterStatus readFile(const char* path, uint64 limit, uint8** bytes, size_t* siz
   if (!S_ISREG(status.st_mode)) return RASTER_STATUS_NOT_REGULAR;
   const auto fileSize = static_cast<uint64>(status.st_size);
   if (fileSize > limit) return RASTER_STATUS_LIMIT;
-  Block block = Block::ofSize(fileSize);
-  if (!block) return RASTER_STATUS_NO_MEMORY;
+  OwnedBytes content = OwnedBytes::ofSize(fileSize);
+  if (!content) return RASTER_STATUS_NO_MEMORY;
   size_t actual = 0;
   const FileIOResult result =
-      FileIO_Read(file.io(), block.get(), static_cast<size_t>(fileSize), &actual);
+      FileIO_Read(file.io(), content.get(), static_cast<size_t>(fileSize), &actual);
   if (result != FILEIO_SUCCESS && result != FILEIO_END_OF_FILE) return RASTER_STATUS_FILE;
-  *bytes = block.release();
+  *bytes = content.release();
   *size = actual;
   return RASTER_STATUS_OK;
 }
@@ -215,7 +215,7 @@ struct Content {
 /// Until it is complete, nobody else reads what takes the place of a private file.
 mode_t firstMode(const Target& target) { return target.exists ? kPrivateMode : kNewMode; }
 
-RasterStatus fill(const OpenFile& file, const Target& target, const Content& content) {
+RasterStatus writeContent(const OpenFile& file, const Target& target, const Content& content) {
   const FileIOResult result = FileIO_Write(file.io(), content.bytes, content.size, nullptr);
   if (result != FILEIO_SUCCESS) return statusOfResult(result);
   if (target.exists && fchmod(file.descriptor(), target.mode) != 0) return statusOfErrno(errno);
@@ -238,7 +238,7 @@ RasterStatus writeNamed(const Target& target, const Content& content) {
     return open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, firstMode(target));
   }));
   if (!file.isOpen()) return statusOfErrno(errno);
-  RasterStatus status = fill(file, target, content);
+  RasterStatus status = writeContent(file, target, content);
   const FileIOResult closed = file.close();
   if (status == RASTER_STATUS_OK) status = statusOfResult(closed);
   if (status == RASTER_STATUS_OK) return settle(name.path, target, content.replaces());
@@ -275,7 +275,7 @@ RasterStatus writeUnnamed(const Target& target, const Content& content, bool* do
       [&] { return open(target.folder, O_TMPFILE | O_WRONLY | O_CLOEXEC, firstMode(target)); }));
   *done = file.isOpen();
   if (!*done) return RASTER_STATUS_FILE;
-  const RasterStatus status = fill(file, target, content);
+  const RasterStatus status = writeContent(file, target, content);
   return status == RASTER_STATUS_OK ? giveName(file, target, content, done) : status;
 }
 

@@ -32,7 +32,7 @@ bool makeImage(const RasterView& like, uint32 width, uint32 height, ImageUtilIma
                RasterView* view) {
   const auto pitch = static_cast<uint32>(paddedRow(width, like.bpp));
   const size_t bytes = size_t{pitch} * height;
-  uint8* const data = Block::ofZeros(bytes).release();
+  uint8* const data = OwnedBytes::ofZeros(bytes).release();
   if (data == nullptr) return false;
   *view = {data, bytes, pitch, width, height, like.depth, like.bpp};
   *image = {};
@@ -78,7 +78,7 @@ RasterStatus encodePadded(const ImageUtilImage& image, const RasterView& view, u
   ImageUtilImage padded;
   RasterView to;
   if (!makeImage(view, view.width, view.height, &padded, &to)) return RASTER_STATUS_NO_MEMORY;
-  const Block owner(padded.data);
+  const OwnedBytes owner(padded.data);
   copyRows(to, view);
   padded.flags = image.flags;
   padded.numColors = image.numColors;
@@ -244,7 +244,7 @@ RasterStatus RasterChecked_CropAndScale(const ImageUtilImage* image, size_t byte
   ImageUtilImage made;
   RasterView to;
   if (!makeImage(view, size.width, size.height, &made, &to)) return RASTER_STATUS_NO_MEMORY;
-  Block owner(made.data);
+  OwnedBytes owner(made.data);
   status = draw(to, viewOf(view, static_cast<uint32>(left), static_cast<uint32>(top), crop));
   if (status != RASTER_STATUS_OK) return status;
   owner.release();
@@ -263,7 +263,7 @@ RasterStatus RasterChecked_WriteImage(const ImageUtilImage* image, size_t bytes,
                                   ? RasterChecked_EncodePng(image, bytes, params, &file, &size)
                                   : RasterChecked_EncodeBmp(image, bytes, &file, &size);
   if (status != RASTER_STATUS_OK) return status;
-  const Block owner(file);
+  const OwnedBytes owner(file);
   return RasterChecked_WriteFile(path, file, size, flags);
 }
 

@@ -18,17 +18,17 @@ template <class Body> bool attempt(Body body) {
   return UtilSafeAttempt([](void* context) { (*static_cast<Body*>(context))(); }, &body);
 }
 
-/// A block that is released unless it is handed over.
-class Block {
+/// Memory that is released unless it is handed over.
+class OwnedBytes {
  public:
   /// `size` bytes, not initialised; none when there is no memory for them. No bytes need no memory.
-  static Block ofSize(uint64 size) { return Block(allocate(size, false)); }
-  static Block ofZeros(uint64 size) { return Block(allocate(size, true)); }
+  static OwnedBytes ofSize(uint64 size) { return OwnedBytes(allocate(size, false)); }
+  static OwnedBytes ofZeros(uint64 size) { return OwnedBytes(allocate(size, true)); }
 
-  explicit Block(uint8* bytes) : bytes_(bytes) {}
-  ~Block() { free(bytes_); }
-  Block(const Block&) = delete;
-  Block& operator=(const Block&) = delete;
+  explicit OwnedBytes(uint8* bytes) : bytes_(bytes) {}
+  ~OwnedBytes() { free(bytes_); }
+  OwnedBytes(const OwnedBytes&) = delete;
+  OwnedBytes& operator=(const OwnedBytes&) = delete;
 
   explicit operator bool() const { return bytes_ != nullptr; }
   uint8* get() const { return bytes_; }

@@ -194,7 +194,7 @@ RasterStatus RasterChecked_ReadPng(const char* path, uint32 flags, const RasterL
   size_t size = 0;
   const RasterStatus status = RasterChecked_ReadFile(path, limits, &bytes, &size);
   if (status != RASTER_STATUS_OK) return status;
-  const Block file(bytes);
+  const OwnedBytes file(bytes);
   return RasterChecked_ReadPngBuffer(bytes, size, flags, limits, image, message, messageBytes);
 }
 

@@ -123,8 +123,8 @@ RasterStatus RasterChecked_EncodePng(const ImageUtilImage* image, size_t bytes,
   Writer writer = {};
   RasterStatus status = checkImage(image, bytes, &writer.view);
   if (status != RASTER_STATUS_OK) return status;
-  const Block row(isConverted(writer) ? Block::ofSize(uint64{3} * writer.view.width).release()
-                                      : nullptr);
+  const OwnedBytes row(
+      isConverted(writer) ? OwnedBytes::ofSize(uint64{3} * writer.view.width).release() : nullptr);
   if (isConverted(writer) && !row) return RASTER_STATUS_NO_MEMORY;
   writer.use.failure = RASTER_STATUS_NO_MEMORY;
   writer.image = image;

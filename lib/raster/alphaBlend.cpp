@@ -20,7 +20,7 @@ constexpr int kBadFormatBug = 19864;
 
 /// A destination format: the depth and the bits per pixel (0: any) that ask for it, the size of its
 /// pixels, and its kernels.
-struct Format {
+struct DestinationFormat {
   uint32 depth;
   uint32 bpp;
   uint32 bytes;
@@ -31,13 +31,13 @@ template <auto kLookUp, size_t kIndex> const FormatKernels& kernelsAt() {
 }
 
 /// Formats by operators by flags. Deliberate: bits per pixel decide for depth 24 only.
-constexpr Format kFormats[] = {
+constexpr DestinationFormat kFormats[] = {
     {6, 0, 1, kernelsAt<lookUpBlend8, 0>},    {8, 0, 1, kernelsAt<lookUpBlend8, 1>},
     {15, 0, 2, kernelsAt<lookUpBlend16, 0>},  {16, 0, 2, kernelsAt<lookUpBlend16, 1>},
     {24, 24, 3, kernelsAt<lookUpBlend32, 0>}, {24, 32, 4, kernelsAt<lookUpBlend32, 1>}};
 
-const Format& formatFor(uint32 depth, uint32 bpp) {
-  for (const Format& format : kFormats) {
+const DestinationFormat& formatFor(uint32 depth, uint32 bpp) {
+  for (const DestinationFormat& format : kFormats) {
     if (format.depth == depth && (format.bpp == 0 || format.bpp == bpp)) return format;
   }
   assertFailed({kSource, kBadFormatLine}, kBadFormatBug);
@@ -200,7 +200,7 @@ void blendStaged(const BlendRect& rect, uint32 bytes, const BlendKernel& kernel)
 }  // namespace
 
 void alphaBlend(const BlendCall& call) {
-  const Format& format = formatFor(call.depth, call.bpp);
+  const DestinationFormat& format = formatFor(call.depth, call.bpp);
   if (call.width == 0 || call.height == 0) return;
   const BlendRect rect = rowsOf(call, format.bytes);
   const BlendKernel& kernel = kernelFor(format.kernels(), call.op, rect);

@@ -17,10 +17,10 @@ constexpr char kSource[] = "lib/raster/rasterConv";
 
 constexpr int32 kMaxPseudoColorDepth = 8;
 
-const uint8* bytesOf(const void* memory) { return static_cast<const uint8*>(memory); }
-uint8* bytesOf(void* memory) { return static_cast<uint8*>(memory); }
+const uint8* asBytes(const void* memory) { return static_cast<const uint8*>(memory); }
+uint8* asBytes(void* memory) { return static_cast<uint8*>(memory); }
 
-[[noreturn]] void badPseudoColorDepth(int32 depth, Place at) {
+[[noreturn]] void badPseudoColorDepth(int32 depth, PanicPlace at) {
   unsupportedNumber("Raster convert pixels invalid depth for pseudo color %d\n", depth, at);
 }
 
@@ -58,7 +58,7 @@ template <class From, class Read> uint32 convertOneFrom(int32 dstDepth, Read rea
 uint32 convertPaletteEntry(uint32 pixel, int32 srcDepth, int32 dstDepth, const uint32* palette) {
   if (srcDepth != kMaxPseudoColorDepth) badPseudoColorDepth(srcDepth, kSource);
   return convertOneFrom<Code32>(dstDepth,
-                                [=] { return loadPixel<4>(entryAt(bytesOf(palette), pixel)); });
+                                [=] { return loadPixel<4>(entryAt(asBytes(palette), pixel)); });
 }
 
 uint32 convertColorPixel(uint32 pixel, int32 srcDepth, int32 dstDepth) {
@@ -123,7 +123,7 @@ void convertRectangle(const Rectangle& r, size_t srcIndex, uint32 srcBytes, size
                         .srcStep = srcStep,
                         .bytes = size_t{r.width} * dstBytes,
                         .rows = r.height};
-  kernel(rows.joined(size_t{r.width} * srcBytes), bytesOf(palette));
+  kernel(rows.joined(size_t{r.width} * srcBytes), asBytes(palette));
 }
 
 /// Converts to a destination format that is one of the list; returns false otherwise.
@@ -134,11 +134,11 @@ bool convertTo(const Rectangle& r, int32 dstDepth, size_t srcIndex, uint32 srcBy
   });
 }
 
-[[noreturn]] void badSourceDepth(int32 depth, Place at) {
+[[noreturn]] void badSourceDepth(int32 depth, PanicPlace at) {
   unsupportedNumber("Raster convert pixels invalid source depth %d\n", depth, at);
 }
 
-[[noreturn]] void badDepth(int32 depth, Place at) {
+[[noreturn]] void badDepth(int32 depth, PanicPlace at) {
   unsupportedNumber("Raster convert pixels invalid depth %d\n", depth, at);
 }
 
@@ -193,7 +193,7 @@ void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth, const void
                           uint32 srcPitch, int32 srcDepth, bool pseudoColor, const uint32* palette,
                           uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
                           uint32 height) {
-  raster::convertPixels({raster::bytesOf(dst), dstPitch, raster::bytesOf(src), srcPitch, srcX, srcY,
+  raster::convertPixels({raster::asBytes(dst), dstPitch, raster::asBytes(src), srcPitch, srcX, srcY,
                          dstX, dstY, width, height},
                         dstDepth, srcDepth, pseudoColor, palette);
 }
@@ -201,7 +201,7 @@ void Raster_ConvertPixels(void* dst, uint32 dstPitch, int32 dstDepth, const void
 void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src, uint32 srcPitch,
                               int32 srcDepth, bool pseudoColor, const uint32* palette, uint32 srcX,
                               uint32 srcY, uint32 dstX, uint32 dstY, uint32 width, uint32 height) {
-  raster::convertPixels({raster::bytesOf(dst), dstPitch, raster::bytesOf(src), srcPitch, srcX, srcY,
+  raster::convertPixels({raster::asBytes(dst), dstPitch, raster::asBytes(src), srcPitch, srcX, srcY,
                          dstX, dstY, width, height},
                         raster::Code32::kCode, srcDepth, pseudoColor, palette);
 }
@@ -209,7 +209,7 @@ void Raster_ConvertPixelsTo32(uint32* dst, uint32 dstPitch, const void* src, uin
 void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth, const uint32* src,
                                 uint32 srcPitch, uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY,
                                 uint32 width, uint32 height) {
-  raster::convertPixels({raster::bytesOf(dst), dstPitch, raster::bytesOf(src), srcPitch, srcX, srcY,
+  raster::convertPixels({raster::asBytes(dst), dstPitch, raster::asBytes(src), srcPitch, srcX, srcY,
                          dstX, dstY, width, height},
                         dstDepth, raster::Code32::kCode, false, nullptr);
 }
@@ -217,7 +217,7 @@ void Raster_ConvertPixelsFrom32(void* dst, uint32 dstPitch, int32 dstDepth, cons
 void Raster_CopyPixels(void* dst, uint32 dstPitch, const void* src, uint32 srcPitch, int32 depth,
                        uint32 srcX, uint32 srcY, uint32 dstX, uint32 dstY, uint32 width,
                        uint32 height) {
-  raster::copyPixels({raster::bytesOf(dst), dstPitch, raster::bytesOf(src), srcPitch, srcX, srcY,
+  raster::copyPixels({raster::asBytes(dst), dstPitch, raster::asBytes(src), srcPitch, srcX, srcY,
                       dstX, dstY, width, height},
                      depth);
 }

@@ -30,10 +30,10 @@ constexpr uint8 kKeepScreen = 0xFF;
 constexpr uint8 kInvertNothing = 0;
 
 /// A number toward zero; one that does not fit, or is none, gives the smallest integer.
-int32 truncated(double value) { return _mm_cvttsd_si32(_mm_set_sd(value)); }
+int32 truncatedOrLowest(double value) { return _mm_cvttsd_si32(_mm_set_sd(value)); }
 
 /// A length in pixels, modulo 2^32.
-uint32 pixelsOf(double length) {
+uint32 wholePixels(double length) {
   if (std::fabs(length) < 9223372036854775808.0)
     return static_cast<uint32>(static_cast<uint64>(static_cast<int64>(length)));
   return 0;
@@ -41,11 +41,12 @@ uint32 pixelsOf(double length) {
 
 /// How far smoothing reaches at a scale, in pixels of the cursor.
 uint32 marginOf(double scale) {
-  return static_cast<uint32>(std::max(truncated(1 / scale), truncated(scale))) + 1;
+  return static_cast<uint32>(std::max(truncatedOrLowest(1 / scale), truncatedOrLowest(scale))) + 1;
 }
 
 int32 scaledHotSpot(int32 hot, double scale) {
-  return truncated(static_cast<double>(int64{hot} + static_cast<int32>(marginOf(scale))) * scale);
+  return truncatedOrLowest(static_cast<double>(int64{hot} + static_cast<int32>(marginOf(scale))) *
+                           scale);
 }
 
 /// The sizes and factors of a scaled cursor.
@@ -100,8 +101,8 @@ uint32 Raster_GetScaledCursorSize(uint32* paddedWidth, uint32* paddedHeight, uin
                                   int32 hotY) {
   *paddedWidth = width + 2 * raster::marginOf(scaleX);
   *paddedHeight = height + 2 * raster::marginOf(scaleY);
-  *scaledWidth = raster::pixelsOf(std::ceil(*paddedWidth * scaleX));
-  *scaledHeight = raster::pixelsOf(std::ceil(*paddedHeight * scaleY));
+  *scaledWidth = raster::wholePixels(std::ceil(*paddedWidth * scaleX));
+  *scaledHeight = raster::wholePixels(std::ceil(*paddedHeight * scaleY));
   scaledHot[0] = raster::scaledHotSpot(hotX, scaleX);
   scaledHot[1] = raster::scaledHotSpot(hotY, scaleY);
   return *scaledWidth * raster::kBytesPerPixel * *scaledHeight;

@@ -21,15 +21,15 @@ constexpr char kFunction[] = "Raster_Scale";
 constexpr uint32 kSizeEnd = 32768;
 constexpr double kScaleLimit = 1.0 / 32767;
 
-struct Format {
+struct DepthAndBpp {
   uint32 depth;
   uint32 bpp;
-  bool operator==(const Format& other) const { return depth == other.depth && bpp == other.bpp; }
+  bool operator==(const DepthAndBpp&) const = default;
 };
 
 /// Source and destination formats that the scaler can pair: equal ones, and 24-bit colour in 32
 /// bits onto depths 24 and 16. Everything else is refused, with one message per kind and process.
-bool formatsFit(Format dst, Format src) {
+bool formatsFit(DepthAndBpp dst, DepthAndBpp src) {
   static constinit std::atomic<bool> saidFormat{false};
   static constinit std::atomic<bool> saidConversion{false};
   static constinit std::atomic<bool> saidDepth{false};
@@ -40,7 +40,7 @@ bool formatsFit(Format dst, Format src) {
     }
     return false;
   }
-  const bool pairs = src == Format{24, 32} ? dst.depth == 24 || dst.depth == 16 : src == dst;
+  const bool pairs = src == DepthAndBpp{24, 32} ? dst.depth == 24 || dst.depth == 16 : src == dst;
   if (!pairs) {
     if (firstTime(saidConversion)) {
       Log("%s: Color depth conversion from D%dB%d to D%dB%d is not supported.\n", kFunction,
@@ -61,7 +61,7 @@ bool formatsFit(Format dst, Format src) {
 uint32 stepOf(double scale) { return static_cast<uint32>(65536.0 / scale); }
 
 /// The integer part, at the nearest end of the range when it is beyond, 0 for no number.
-int32 truncated(double value) {
+int32 truncatedWithin32Bits(double value) {
   constexpr double kLow = std::numeric_limits<int32>::min();
   constexpr double kHigh = std::numeric_limits<int32>::max();
   if (value >= kHigh) return std::numeric_limits<int32>::max();
@@ -76,9 +76,9 @@ struct Interval {
 };
 Interval sourceInterval(Interval scaled, uint32 size, double invScale) {
   const double margin = invScale > 1.0 ? invScale : 1.0;
-  const int32 from = truncated(scaled.from * invScale - margin);
-  const int32 to = truncated(std::ceil(invScale * scaled.to + margin));
-  const int32 extent = truncated(size * invScale);
+  const int32 from = truncatedWithin32Bits(scaled.from * invScale - margin);
+  const int32 to = truncatedWithin32Bits(std::ceil(invScale * scaled.to + margin));
+  const int32 extent = truncatedWithin32Bits(size * invScale);
   return {from < 0 ? 0 : from, to < extent ? to : extent};
 }
 
@@ -99,8 +99,8 @@ bool Raster_Scale(void* dstBits, uint32 dstPitch, uint32 dstBpp, uint32 dstDepth
   using raster::kScaleLimit;
   using raster::kSizeEnd;
   if (x1 < 0 || y1 < 0 || int64{dstWidth} < x2 || int64{dstHeight} < y2) return false;
-  const raster::Format dst = {dstDepth, dstBpp};
-  const raster::Format src = {static_cast<uint32>(srcDepth), srcBpp};
+  const raster::DepthAndBpp dst = {dstDepth, dstBpp};
+  const raster::DepthAndBpp src = {static_cast<uint32>(srcDepth), srcBpp};
   if (!raster::formatsFit(dst, src)) return false;
   if (srcHeight >= kSizeEnd || srcWidth >= kSizeEnd || dstHeight >= kSizeEnd ||
       dstWidth >= kSizeEnd)

@@ -97,19 +97,19 @@ HWY_INLINE size_t samePixels(const uint8* a, const uint8* b, size_t pixels) {
 }
 
 // What a mask lets through: each line gives the bits of a lane that differ and count.
-struct WholeBytes {
+struct ByteMask {
   using Lane = uint8;
   template <class D, class V> static HWY_INLINE V differing(D d, V a, V b, V mask) {
     return hn::IfThenZeroElse(hn::Eq(mask, hn::Zero(d)), hn::Xor(a, b));
   }
 };
-struct Bits {
+struct BitMask {
   using Lane = uint8;
   template <class D, class V> static HWY_INLINE V differing(D /*d*/, V a, V b, V mask) {
     return hn::And(hn::Xor(a, b), mask);
   }
 };
-struct Colors {
+struct ColorMask {
   using Lane = uint32;
   template <class D, class V> static HWY_INLINE V differing(D d, V a, V b, V mask) {
     return hn::And(hn::And(hn::Xor(a, b), mask), hn::Set(d, kColorBits));
@@ -172,8 +172,8 @@ int32 compareColors(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bSt
 constexpr RasterCompKernels kKernels = {compareColors, withinLimit<kWholeBytes>, withinLimit<kBits>,
                                         withinLimit<kColors>};
 #else
-constexpr RasterCompKernels kKernels = {compareColors, withinLimit<WholeBytes>, withinLimit<Bits>,
-                                        withinLimit<Colors>};
+constexpr RasterCompKernels kKernels = {compareColors, withinLimit<ByteMask>, withinLimit<BitMask>,
+                                        withinLimit<ColorMask>};
 #endif
 
 }  // namespace

@@ -23,8 +23,8 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
-using Words = hn::ScalableTag<uint32>;
-using Word = hn::Vec<Words>;
+using WordLanes = hn::ScalableTag<uint32>;
+using Word = hn::Vec<WordLanes>;
 
 HWY_INLINE uint32 wordAt(const uint8* words, size_t i) { return loadPixel<4>(words + 4 * i); }
 HWY_INLINE void putWord(uint8* words, size_t i, uint32 word) { storePixel<4>(words + 4 * i, word); }
@@ -35,7 +35,7 @@ HWY_INLINE void putWord(uint8* words, size_t i, uint32 word) { storePixel<4>(wor
 HWY_INLINE size_t copyUpToPair(const uint8* src, uint8* dst, size_t count, size_t room) {
   size_t i = 0;
 #if HWY_TARGET != HWY_SCALAR
-  const Words d;
+  const WordLanes d;
   const size_t most = std::min(count, room);
   for (; most - i >= hn::Lanes(d); i += hn::Lanes(d)) {
     const Word words = loadLanes(d, src + 4 * i);
@@ -55,7 +55,7 @@ HWY_INLINE size_t copyUpToPair(const uint8* src, uint8* dst, size_t count, size_
 HWY_INLINE size_t runLength(const uint8* words, size_t count, uint32 word) {
   size_t i = 0;
 #if HWY_TARGET != HWY_SCALAR
-  const Words d;
+  const WordLanes d;
   const size_t n = hn::Lanes(d);
   const Word same = hn::Set(d, word);
   const auto differ = [&](size_t at)
@@ -79,7 +79,7 @@ HWY_INLINE size_t runLength(const uint8* words, size_t count, uint32 word) {
 HWY_INLINE void writeRun(uint8* dst, size_t count, size_t room, uint32 word) {
   size_t i = 0;
 #if HWY_TARGET != HWY_SCALAR
-  const Words d;
+  const WordLanes d;
   const size_t n = hn::Lanes(d);
   const Word same = hn::Set(d, word);
   const size_t whole = std::min(count, room / n * n);
@@ -144,8 +144,8 @@ void decodeStep(const uint8* code, size_t codeWords, uint8* dst, size_t room, Pr
 // each; then the steps are taken from the bits, without a look at the words and, as literals are
 // copied in whole chunks, mostly without a branch that depends on them.
 
-using Bits = uintptr_t;
-constexpr size_t kBlock = 8 * sizeof(Bits);
+using PairBits = uintptr_t;
+constexpr size_t kBlock = 8 * sizeof(PairBits);
 constexpr size_t kChunk = 16;
 
 /// What a block may read, or write, at most: its own words, a count to each pair, and the rest of a
@@ -154,9 +154,9 @@ constexpr size_t kBlockReads = kBlock + kChunk + 2;
 constexpr size_t kBlockWrites = 2 * kBlock + kChunk;
 
 /// Copies a block and returns which of its words equal the next one.
-HWY_INLINE Bits copyAndFindPairs(const uint8* src, uint8* dst) {
-  const Words d;
-  Bits pairs = 0;
+HWY_INLINE PairBits copyAndFindPairs(const uint8* src, uint8* dst) {
+  const WordLanes d;
+  PairBits pairs = 0;
   for (size_t i = 0; i < kBlock; i += hn::Lanes(d)) {
     const Word words = loadLanes(d, src + 4 * i);
     storeLanes(d, words, dst + 4 * i);
@@ -164,13 +164,13 @@ HWY_INLINE Bits copyAndFindPairs(const uint8* src, uint8* dst) {
     hn::StoreMaskBits(d, hn::Eq(words, loadLanes(d, src + 4 * i + 4)), bits);
     uint32 low = 0;
     memcpy(&low, bits, sizeof low);
-    pairs |= Bits{low} << i;
+    pairs |= PairBits{low} << i;
   }
   return pairs;
 }
 
 HWY_INLINE void copyChunks(const uint8* src, uint8* dst, size_t count) {
-  const Words d;
+  const WordLanes d;
   for (size_t i = 0; i < count; i += kChunk) {
     for (size_t j = i; j < i + kChunk; j += hn::Lanes(d))
       storeLanes(d, loadLanes(d, src + 4 * j), dst + 4 * j);
@@ -180,10 +180,10 @@ HWY_INLINE void copyChunks(const uint8* src, uint8* dst, size_t count) {
 /// Encodes a block, and further if it ends within a run.
 HWY_INLINE void encodeBlock(const uint8* src, size_t total, uint8* code, EncoderProgress& at) {
   const uint8* const block = src + 4 * at.in;
-  const Bits pairs = copyAndFindPairs(block, code + 4 * at.out);
+  const PairBits pairs = copyAndFindPairs(block, code + 4 * at.out);
   size_t done = 0;
   while (done < kBlock) {
-    const Bits rest = pairs >> done;
+    const PairBits rest = pairs >> done;
     const size_t toPair = rest == 0 ? kBlock - done : static_cast<size_t>(std::countr_zero(rest));
     const size_t pair = done + toPair;
     if (toPair != kBlock) copyChunks(block + 4 * done, code + 4 * at.out, toPair + 2);
@@ -209,10 +209,10 @@ HWY_INLINE void encodeBlock(const uint8* src, size_t total, uint8* code, Encoder
 /// Decodes a block of the code as long as the output has room, at most `last` words before it.
 HWY_INLINE void decodeBlock(const uint8* code, uint8* dst, size_t room, size_t last, Progress& at) {
   const uint8* const block = code + 4 * at.in;
-  const Bits pairs = copyAndFindPairs(block, dst + 4 * at.out);
+  const PairBits pairs = copyAndFindPairs(block, dst + 4 * at.out);
   size_t done = 0;
   while (done < kBlock && at.out <= last) {
-    const Bits rest = pairs >> done;
+    const PairBits rest = pairs >> done;
     const size_t toPair = rest == 0 ? kBlock - done : static_cast<size_t>(std::countr_zero(rest));
     if (toPair != kBlock) copyChunks(block + 4 * done, dst + 4 * at.out, toPair + 2);
     at.out += toPair;

@@ -14,24 +14,24 @@
 namespace raster {
 
 /// The place that a panic names: by default the line of the call itself.
-struct Place {
+struct PanicPlace {
   const char* source;
   int line;
   // Implicit, so that a call site names its module only.
-  constexpr Place(const char* path,
-                  int at = __builtin_LINE())  // NOLINT(google-explicit-constructor)
+  constexpr PanicPlace(const char* path,
+                       int at = __builtin_LINE())  // NOLINT(google-explicit-constructor)
       : source(path), line(at) {}
 };
 
-[[noreturn]] void notImplemented(Place at);
-[[noreturn]] void notReached(Place at);
-[[noreturn]] void assertFailed(Place at, int bugNr);
+[[noreturn]] void notImplemented(PanicPlace at);
+[[noreturn]] void notReached(PanicPlace at);
+[[noreturn]] void assertFailed(PanicPlace at, int bugNr);
 
 /// The common end of a raster operation with a pixel size other than 1, 2, 3 or 4.
-[[noreturn]] void unsupportedPixelSize(Place at);
+[[noreturn]] void unsupportedPixelSize(PanicPlace at);
 
 /// A warning about a number, for which `format` has a %d, and then notImplemented.
-[[noreturn]] void unsupportedNumber(const char* format, int32 number, Place at);
+[[noreturn]] void unsupportedNumber(const char* format, int32 number, PanicPlace at);
 
 }  // namespace raster
 
