@@ -51,12 +51,13 @@ int runSequence(Random& random, int32 size, int steps) {
 TEST(Raster_RectList, HoldsThePixelsOfPixmansRegion) {
   Random random(21);
   int64 total = 0;
-  for (int round = 0; round < tests::rounds(5000); ++round) {
+  const int rounds = tests::rounds(5000);
+  for (int round = 0; round < rounds; ++round) {
     const int32 size = random.oneOf({4, 12, 100, 5000});
     total += runSequence(random, size, 30);
     ASSERT_FALSE(HasFailure()) << "round " << round << " size " << size;
   }
-  EXPECT_GT(total, 5000 * 5);
+  EXPECT_GT(total, rounds * 5);
 }
 
 }  // namespace
