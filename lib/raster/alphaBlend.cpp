@@ -68,11 +68,10 @@ BlendRect rowsOf(const BlendCall& call, uint32 bytes) {
   return rect;
 }
 
-/// The kernel for the constants of a call: those of 255 change nothing.
-const BlendKernel& kernelFor(const FormatKernels& kernels, uint32 op, const BlendRect& rect) {
-  const uint32 flags = (rect.srcAlpha != 255 ? RASTER_BLEND_USE_SRC_ALPHA : 0) |
-                       (rect.dstAlpha != 255 ? RASTER_BLEND_USE_DST_ALPHA : 0);
-  return kernels[op][flags];
+/// Which constants of a call count: those of 255 change nothing.
+uint32 flagsThatCount(const BlendRect& rect) {
+  return (rect.srcAlpha != 255 ? RASTER_BLEND_USE_SRC_ALPHA : 0) |
+         (rect.dstAlpha != 255 ? RASTER_BLEND_USE_DST_ALPHA : 0);
 }
 
 /// Whether destination and source, with what lies between their rows, share no byte.
@@ -203,7 +202,8 @@ void alphaBlend(const BlendCall& call) {
   const DestinationFormat& format = formatFor(call.depth, call.bpp);
   if (call.width == 0 || call.height == 0) return;
   const BlendRect rect = rowsOf(call, format.bytes);
-  const BlendKernel& kernel = kernelFor(format.kernels(), call.op, rect);
+  const uint32 flags = flagsThatCount(rect);
+  const BlendKernel& kernel = format.kernels()[call.op][flags];
   (call.staged ? blendStaged : blendInPlace)(rect, format.bytes, kernel);
 }
 
