@@ -59,7 +59,7 @@ TEST(PackedBlock, FindsNothingWrongWithWhatTheLibraryUnpacks) {
                           random.oneOf({8u, 16u, 24u, 32u}), random.below(4)};
     std::vector<uint8> block(sizeof header);
     memcpy(block.data(), &header, sizeof header);
-    const size_t payload = headerFault(header).empty() ? header.payload() : random.below(40);
+    const uint64 payload = headerFault(header).empty() ? header.payload() : random.below(40);
     for (size_t i = 0; i < payload; ++i)
       block.push_back(i % 4 == 0 ? random.oneOf<uint8>({0, 1, 2}) : uint8{0});
     if (!blockFault(block.data(), block.size(), header).empty()) continue;
