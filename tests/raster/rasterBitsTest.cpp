@@ -107,6 +107,37 @@ TEST(Raster_BitsToPixels, EqualsTheModelAndReadsNoByteTooMany) {
   }
 }
 
+// Larger rectangles have loops of their own, which ask for memory ahead.
+TEST(Raster_BitsToPixels, EqualsTheModelBeyondTheInnerCaches) {
+  constexpr uint32 kInnerCaches = 512 * 1024;
+  Random random(5);
+  for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
+    for (const bool stencil : {false, true}) {
+      Plane p{};
+      p.bytesPerPixel = bytesPerPixel;
+      p.width = random.between(1000, 1100);
+      const uint32 rowBytes = static_cast<uint32>(p.width) * bytesPerPixel;
+      p.height = static_cast<int32>(kInnerCaches / rowBytes) + 1;
+      p.bitsPitch = 140;
+      p.dstPitch = rowBytes + random.below(40);
+      p.foreground = random.word();
+      p.background = random.word();
+      p.stencil = stencil;
+      const Bytes plane = random.bytes(p.bitsRange(0).size());
+      GuardedBuffer dst(p.dstRange(0).size());
+      Bytes expected = random.bytes(dst.size());
+      dst.assign(expected);
+      expected.insert(expected.end(), plane.begin(), plane.end());
+      reference::bitsToPixels(expected, static_cast<int64>(dst.size()), p.bitsPitch, 0, p.dstPitch,
+                              bytesPerPixel, p.width, p.height, p.foreground, p.background,
+                              stencil);
+      p.run(plane.data(), dst.data());
+      expected.resize(dst.size());
+      ASSERT_TRUE(dst.bytes() == expected) << p.text();
+    }
+  }
+}
+
 TEST(Raster_BitsToPixels, LooksAtThePlaneForEveryFourPixelsWhereItLiesInTheRectangle) {
   Random random(2);
   for (int round = 0; round < tests::rounds(6000); ++round) {
