@@ -93,6 +93,14 @@ needBuildTools() {
   esac
 }
 
+# What the tests compare with and draw on; a test says so when one of them is not there. Some programs of
+# netpbm are Perl scripts, which it does not depend on.
+needTestPackages() {
+  needPackages xvfb pngcheck netpbm perl imagemagick x11-apps x11-xserver-utils xterm xfonts-base ffmpeg \
+    x11vnc gvncviewer tigervnc-viewer xtightvncviewer libpixman-1-dev libswscale-dev libavutil-dev \
+    libsdl2-dev libcairo2-dev man-db python3
+}
+
 # Configures (once) and builds a preset; further arguments are targets.
 buildPreset() {
   local preset=$1
