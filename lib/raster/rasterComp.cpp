@@ -2,8 +2,8 @@
 //
 // Comparison of pixel rectangles: plain, over a rect list, and under a mask with a tolerance.
 //
-// Pixels of 1, 2 or 3 bytes are blocks of bytes for memcmp. The fourth byte of a 4-byte pixel never
-// counts; such rows, and everything under a mask, are compared by kernels.
+// Pixels of 1, 2 or 3 bytes are compared as bytes. The fourth byte of a 4-byte pixel never counts;
+// such rows, and everything under a mask, are compared by kernels.
 
 #include "vector/kernelChoice.h"
 #include "host/panicPlace.h"
@@ -24,8 +24,11 @@ struct Picture {
   int32 bpp;
 };
 
+/// Compares rows that are not empty as memcmp does. The C library's own is good where programs have
+/// 64 bits; for 32-bit ones few know wide vectors.
 int32 compareBytes(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep, RowRun run) {
-  if (run.bytes == 0) return 0;
+  if constexpr (sizeof(void*) == 4)
+    return kernels().compareBytes(a, aStep, b, bStep, run.bytes, run.rows);
   for (; run.rows != 0; --run.rows, a = nextRow(a, aStep), b = nextRow(b, bStep)) {
     const int32 order = memcmp(a, b, run.bytes);
     if (order != 0) return order;
@@ -45,6 +48,7 @@ int32 comparePixels(const Picture& a, const Picture& b, uint32 aX, uint32 aY, ui
   const intptr_t bStep = pitchOf(b.pitch);
   RowRun run = {size_t{width} * bytesPerPixel, height};
   if (aStep == bStep) run = joinRows(aStep, run.bytes, run.rows);
+  if (run.bytes == 0) return 0;
   if (bytesPerPixel != 4) return compareBytes(firstA, aStep, firstB, bStep, run);
   return kernels().compareColors(firstA, aStep, firstB, bStep, run.bytes / 4, run.rows);
 }

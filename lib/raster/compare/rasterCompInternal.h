@@ -16,11 +16,14 @@ inline constexpr uint32 kColorBits = 0x00FFFFFF;
 using CompareUnderMask = bool (*)(const uint8* a, const uint8* b, const uint8* mask, size_t bytes,
                                   size_t limit);
 
+/// Compares rows: 0, or the difference of the first two bytes that differ. `count` is the number of
+/// bytes, or pixels, of a row, which is not 0.
+using CompareRows = int32 (*)(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep,
+                              size_t count, uint32 height);
+
 struct RasterCompKernels {
-  /// Compares rows of 4-byte pixels without the fourth byte: 0, or the difference of the first two
-  /// bytes that differ.
-  int32 (*compareColors)(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep,
-                         size_t pixels, uint32 height);
+  CompareRows compareBytes;
+  CompareRows compareColors;    ///< of 4-byte pixels, without the fourth byte
   CompareUnderMask wholeBytes;  ///< a mask byte that is not 0 counts its whole byte
   CompareUnderMask bits;        ///< the bits of the mask count
   CompareUnderMask colorBits;   ///< the bits of the mask count, but none of a fourth byte

@@ -1,12 +1,14 @@
 // SPDX-License-Identifier: MIT
 //
-// Comparison of pixels without their fourth byte, and of bytes under a mask.
+// Comparison of bytes, of pixels without their fourth byte, and of bytes under a mask.
 
 #undef HWY_TARGET_INCLUDE
 #define HWY_TARGET_INCLUDE "raster/compare/rasterCompKernels.cpp"
 #include "vector/hwySetup.h"
 #include "hwy/foreach_target.h"
 #include "hwy/highway.h"
+
+#include <cstring>
 
 #include "compare/rasterCompInternal.h"
 #include "vector/rows-inl.h"
@@ -19,6 +21,14 @@ namespace {
 
 /// Bytes between two looks at whether anything differs.
 constexpr size_t kChunk = 256;
+
+/// The number of bytes up to the chunk that holds the first difference.
+size_t sameBytes(const uint8* a, const uint8* b, size_t bytes) {
+  size_t i = 0;
+  for (; bytes - i >= kChunk; i += kChunk)
+    if (memcmp(a + i, b + i, kChunk) != 0) return i;
+  return memcmp(a + i, b + i, bytes - i) == 0 ? bytes : i;
+}
 
 bool colorsDiffer(const uint8* a, const uint8* b, size_t pixels) {
   uint32 differing = 0;
@@ -68,32 +78,41 @@ template <class D> HWY_INLINE bool allZero(D d, hn::Vec<D> lanes) {
   return hn::AllTrue(d, hn::Eq(lanes, hn::Zero(d)));
 }
 
-/// The bits of the colours in which the pixels at a and b differ.
-template <class D> HWY_INLINE hn::Vec<D> colorDifference(D d, const uint8* a, const uint8* b) {
+/// The bits that count in which two lanes differ: of whole bytes, and of pixels without the fourth.
+constexpr auto kByteDifference = [](auto d, const uint8* a, const uint8* b)
+                                     HWY_ATTR { return hn::Xor(loadLanes(d, a), loadLanes(d, b)); };
+constexpr auto kColorDifference = [](auto d, const uint8* a, const uint8* b) HWY_ATTR {
   return hn::And(hn::Xor(loadLanes(d, a), loadLanes(d, b)), hn::Set(d, kColorBits));
-}
+};
 
-/// The number of pixels, from the left, up to the vectors that hold the first difference.
-HWY_INLINE size_t samePixels(const uint8* a, const uint8* b, size_t pixels) {
-  const hn::ScalableTag<uint32> d;
-  const size_t step = hn::Lanes(d);
-  const auto difference = [&](size_t x)
-                              HWY_ATTR { return colorDifference(d, a + 4 * x, b + 4 * x); };
+/// The number of lanes, from the left, up to the vectors that hold the first difference.
+template <auto kDifference, class D>
+HWY_INLINE size_t sameLanes(D d, const uint8* a, const uint8* b, size_t lanes) {
+  constexpr size_t kLaneBytes = sizeof(hn::TFromD<D>);
+  constexpr size_t kStep = kLanes<D>;
+  const auto difference = [&](auto tag, size_t x) HWY_ATTR {
+    return kDifference(tag, a + kLaneBytes * x, b + kLaneBytes * x);
+  };
   size_t x = 0;
-  for (; pixels - x >= 4 * step; x += 4 * step) {
-    const auto left = hn::Or(difference(x), difference(x + step));
-    const auto right = hn::Or(difference(x + 2 * step), difference(x + 3 * step));
+  for (; lanes - x >= 4 * kStep; x += 4 * kStep) {
+    const auto left = hn::Or(difference(d, x), difference(d, x + kStep));
+    const auto right = hn::Or(difference(d, x + 2 * kStep), difference(d, x + 3 * kStep));
     if (!allZero(d, hn::Or(left, right))) return x;
   }
-  for (; pixels - x >= step; x += step)
-    if (!allZero(d, difference(x))) return x;
-  size_t same = pixels;
-  forLanes(hn::Half<decltype(d)>(), pixels - x, [&](auto half, size_t i) HWY_ATTR {
-    const size_t at = x + i;
-    const auto rest = colorDifference(half, a + 4 * at, b + 4 * at);
-    if (same == pixels && !allZero(half, rest)) same = at;
+  for (; lanes - x >= kStep; x += kStep)
+    if (!allZero(d, difference(d, x))) return x;
+  size_t same = lanes;
+  forLanes(hn::Half<D>(), lanes - x, [&](auto half, size_t i) HWY_ATTR {
+    if (same == lanes && !allZero(half, difference(half, x + i))) same = x + i;
   });
   return same;
+}
+
+HWY_INLINE size_t sameBytes(const uint8* a, const uint8* b, size_t bytes) {
+  return sameLanes<kByteDifference>(hn::ScalableTag<uint8>(), a, b, bytes);
+}
+HWY_INLINE size_t samePixels(const uint8* a, const uint8* b, size_t pixels) {
+  return sameLanes<kColorDifference>(hn::ScalableTag<uint32>(), a, b, pixels);
 }
 
 // What a mask lets through: each line gives the bits of a lane that differ and count.
@@ -150,10 +169,19 @@ bool withinLimit(const uint8* a, const uint8* b, const uint8* mask, size_t bytes
 
 #endif
 
-/// The difference of the first bytes that differ, of two pixels that are not the same.
-int32 orderOfColors(const uint8* a, const uint8* b) {
+/// The difference of the first bytes that differ, of which there are some.
+int32 orderOfBytes(const uint8* a, const uint8* b) {
   while (*a == *b) ++a, ++b;
   return int32{*a} - int32{*b};
+}
+
+int32 compareBytes(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep, size_t bytes,
+                   uint32 height) {
+  for (; height != 0; --height, a = nextRow(a, aStep), b = nextRow(b, bStep)) {
+    const size_t same = sameBytes(a, b, bytes);
+    if (same != bytes) return orderOfBytes(a + same, b + same);
+  }
+  return 0;
 }
 
 int32 compareColors(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bStep, size_t pixels,
@@ -162,18 +190,18 @@ int32 compareColors(const uint8* a, intptr_t aStep, const uint8* b, intptr_t bSt
     size_t x = samePixels(a, b, pixels);
     for (; x != pixels; ++x) {
       const uint32 differing = loadPixel<4>(a + 4 * x) ^ loadPixel<4>(b + 4 * x);
-      if ((differing & kColorBits) != 0) return orderOfColors(a + 4 * x, b + 4 * x);
+      if ((differing & kColorBits) != 0) return orderOfBytes(a + 4 * x, b + 4 * x);
     }
   }
   return 0;
 }
 
 #if HWY_TARGET == HWY_SCALAR
-constexpr RasterCompKernels kKernels = {compareColors, withinLimit<kWholeBytes>, withinLimit<kBits>,
-                                        withinLimit<kColors>};
+constexpr RasterCompKernels kKernels = {compareBytes, compareColors, withinLimit<kWholeBytes>,
+                                        withinLimit<kBits>, withinLimit<kColors>};
 #else
-constexpr RasterCompKernels kKernels = {compareColors, withinLimit<ByteMask>, withinLimit<BitMask>,
-                                        withinLimit<ColorMask>};
+constexpr RasterCompKernels kKernels = {compareBytes, compareColors, withinLimit<ByteMask>,
+                                        withinLimit<BitMask>, withinLimit<ColorMask>};
 #endif
 
 }  // namespace
