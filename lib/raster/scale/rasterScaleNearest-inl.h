@@ -85,9 +85,10 @@ class Nearest {
 
   Nearest(const ScaleJob& job, ScaleMemory& memory)
       : job_(job), everyOther_(everyOtherOf(job)), places_(job, 1, memory) {
-    places_.forBlocks(job.startX, blockPixels(job), [&](size_t block, PixelVec at) HWY_ATTR {
-      places_.place(block, hn::ShiftRight<16>(at));
-    });
+    const int64 start = job.startX + int64{job.stepX} * static_cast<int64>(everyOther_);
+    places_.forBlocks(start, blockPixels(job) - everyOther_,
+                      [&](size_t block, PixelVec at)
+                          HWY_ATTR { places_.place(everyOther_ + block, hn::ShiftRight<16>(at)); });
   }
 
   /// `out` has room for whole vectors.
