@@ -200,6 +200,8 @@ TEST(RasterChecked_BlockInfo, RefusesHeadersOfNoPicture) {
   EXPECT_EQ(decompress(blockOf({8, 0x3C000000, 0x20000000, 0, 0, 5})), RASTER_STATUS_DAMAGED);
   EXPECT_EQ(decompress(blockOf({8, 0x80000000, 0x20000000, 32, 0, 5})), RASTER_STATUS_DAMAGED);
   EXPECT_EQ(decompress(blockOf({8, 0x3C000000, 0x20000000, 32, 0, 5})), RASTER_STATUS_LIMIT);
+  EXPECT_EQ(decompress(blockOf({8, 0x80000000, 32, 32, 0, 5})), RASTER_STATUS_DAMAGED);
+  EXPECT_EQ(decompress(blockOf({8, 0x7FFFFFFF, 32, 32, 0, 5})), RASTER_STATUS_LIMIT);
   EXPECT_EQ(decompress(blockOf({20000, 1, 80000, 32, 1, 5})), RASTER_STATUS_LIMIT);
   EXPECT_EQ(decompress(blockOf({1, 20000, 4, 32, 1, 5})), RASTER_STATUS_LIMIT);
   EXPECT_EQ(decompress(blockOf({16384, 16384, 65536, 32, 3, 5, 5, 6})), RASTER_STATUS_LIMIT);

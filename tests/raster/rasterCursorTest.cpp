@@ -568,6 +568,19 @@ TEST(Raster_ScaleAlphaCursor, CopiesNothingThatDoesNotFitThePaddedSize) {
   }
 }
 
+TEST(Raster_ScaleAlphaCursor, CopiesWhatJustFitsThePaddedSize) {
+  Bytes pixels(size_t{8} * 8 * 4, 0xFF);
+  for (const auto& [width, height] : {std::array{10u, 12u}, {12u, 10u}, {10u, 10u}}) {
+    GuardedBuffer dst(size_t{12} * 12 * 4);
+    memset(dst.data(), 0, dst.size());
+    RasterCursor cursor{RASTER_CURSOR_ALPHA, 0, 0, 8, 8, {}};
+    cursor.pixels = pixels.data();
+    Raster_ScaleAlphaCursor(dst.data(), &cursor, 1, 1, width, height, 12, 12);
+    const uint8* const middle = dst.data() + (size_t{5} * 12 + 5) * 4;
+    EXPECT_EQ(Bytes(middle, middle + 4), Bytes(4, 0xFF)) << width << "x" << height;
+  }
+}
+
 TEST(Raster_ScaleAlphaCursor, EndsInAPanicWhenThePaddedPlaneIsMoreThanMemory) {
   Bytes pixels(size_t{2} * 2 * 4, 1);
   GuardedBuffer dst(3 * 3 * 4);
