@@ -174,7 +174,7 @@ TEST(ChangeList, JoinsWhatIsNear) {
   tool::live::joinNear(rects, 10);
   ASSERT_EQ(rects.size(), 1u);
   const Rect all = {0, 0, 50, 10};
-  EXPECT_TRUE(Rect_IsEqual(&rects[0], &all));
+  EXPECT_TRUE(Rect_IsEqual(&rects.front(), &all));
 }
 
 TEST(ChangeList, JoinsAndLosesNothing) {
