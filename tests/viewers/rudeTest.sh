@@ -1,5 +1,6 @@
 #!/bin/sh
 # Viewers with bad manners are dropped with one line, delay nobody and cost little memory.
+export ASAN_OPTIONS="quarantine_size_mb=4:${ASAN_OPTIONS:-}" # of what is freed; memory is looked at here
 . "$(dirname "$0")/common.sh"
 
 # memory: what the server has in memory, in KiB.
