@@ -46,15 +46,32 @@ TEST(Pace, ForgetsWhatEarlierCapturesCost) {
   EXPECT_EQ(pace.restsUntil(), kStart + seconds(1) + milliseconds(20));
 }
 
-TEST(Pace, RestsBetweenTheTwoInProportion) {
+/// The rest that captures of a cost come to when one follows the other.
+Pace::Clock::duration restOfMany(Pace::Clock::duration cost) {
   Pace pace(50, 20);
-  pace.captured(kStart, microseconds(400));
-  const auto rest = pace.restsUntil() - kStart;
-  pace.captured(kStart, microseconds(400 + 500));
-  const auto longer = pace.restsUntil() - kStart;
+  Time now = kStart;
+  for (int i = 1; i <= 100; ++i) {
+    pace.captured(now, i * cost);
+    now = pace.restsUntil();
+  }
+  return now - pace.lastCapture();
+}
+
+TEST(Pace, RestsBetweenTheTwoInProportionWhereChangesGoOn) {
+  const auto rest = restOfMany(microseconds(400));
+  const auto longer = restOfMany(microseconds(500));
   EXPECT_GT(rest, milliseconds(20));
   EXPECT_LT(longer, milliseconds(50));
   EXPECT_EQ(rest * 5, longer * 4);
+}
+
+TEST(Pace, RestsAsShortAsItMayWhereChangesAreFew) {
+  Pace pace(50, 20);
+  Time now = kStart;
+  for (int i = 1; i <= 20; ++i, now += milliseconds(40)) {
+    pace.captured(now, i * microseconds(500));  // 40 ms of rest each
+    EXPECT_EQ(pace.restsUntil(), now + milliseconds(20)) << i;
+  }
 }
 
 TEST(Pace, KeepsToTheLowerRateWhenThatIsTheGreatest) {

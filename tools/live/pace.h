@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 //
-// How often the screen is captured: the first change after quiet at once, changes that go on the
+// How often the screen is captured: the first changes after quiet at once, changes that go on the
 // less often the more CPU time they cost.
 
 #ifndef RASTER_TOOLS_LIVE_PACE_H
@@ -24,8 +24,11 @@ class Pace {
   /// A capture began, and what came of it has been sent. `spent` is the CPU time so far, in which
   /// is what viewers that were late have cost.
   void captured(Clock::time_point began, Clock::duration spent) {
+    owed =
+        std::max(owed - (began - start), Clock::duration()) + kRestsPerCost * (spent - spentBefore);
+    owed = std::min(owed, 2 * longest);
+    rest = std::clamp(owed - longest, shortest, longest);
     start = began;
-    rest = std::clamp(kRestsPerCost * (spent - spentBefore), shortest, longest);
     spentBefore = spent;
   }
   /// The next capture is not due before that.
@@ -43,6 +46,7 @@ class Pace {
   Clock::duration shortest;
   Clock::duration longest;
   Clock::duration rest;
+  Clock::duration owed = {};  ///< of rests at the last capture; up to the longest one may wait
   Clock::time_point start;
   Clock::duration spentBefore = {};
 };
