@@ -13,6 +13,7 @@
 #include "image/pngFiles.h"
 #include "imageUtil.h"
 #include "rasterChecked.h"
+#include "support/random.h"
 
 namespace {
 
@@ -411,7 +412,7 @@ TEST(RasterChecked_PngInfo, RefusesHeadersOfNoPicture) {
 
 TEST(RasterChecked_EncodePng, MakesTheBytesOfTheExactEncoder) {
   Random random(81);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < tests::rounds(1500); ++round) {
     const GuardedView view = tests::somePicture(random);
     const ImageUtilImage image = tests::imageOf(random, view.view(), 256);
     const ImageUtilPNGWriteParams params = {random.between(-2, 11), random.below(2) == 0};

@@ -9,6 +9,7 @@
 #include "checked/checkedScenes.h"
 #include "rasterChecked.h"
 #include "support/allocated.h"
+#include "support/random.h"
 #include "support/recordedMessages.h"
 #include "support/someValues.h"
 
@@ -49,7 +50,7 @@ Bytes exactBlock(const RasterView& v) {
 
 TEST(RasterChecked_Compress, EqualsTheExactCompression) {
   Random random(61);
-  for (int round = 0; round < 2000; ++round) {
+  for (int round = 0; round < tests::rounds(2000); ++round) {
     GuardedView view(random, someBlockFormat(random), random.below(40), random.below(40), false);
     makeRuns(random, view);
     uint8* block = nullptr;
@@ -78,7 +79,7 @@ TEST(RasterChecked_Compress, WantsTheLastGap) {
 
 TEST(RasterChecked_Decompress, GivesThePixelsBack) {
   Random random(62);
-  for (int round = 0; round < 2000; ++round) {
+  for (int round = 0; round < tests::rounds(2000); ++round) {
     GuardedView view(random, someBlockFormat(random), random.below(40), random.below(40), false);
     makeRuns(random, view);
     const Bytes bytes = exactBlock(view.view());
@@ -241,7 +242,7 @@ size_t naiveFrame(uint32 format, size_t width, size_t height) {
 
 TEST(RasterChecked_YuvToRgb, EqualsTheExactConversion) {
   Random random(66);
-  for (int round = 0; round < 3000; ++round) {
+  for (int round = 0; round < tests::rounds(3000); ++round) {
     GuardedView dst(random, tests::someFormat(random), random.below(30), random.below(30),
                     random.below(4) == 0);
     const RasterView& v = dst.view();

@@ -83,7 +83,7 @@ struct Modelled {
 
 TEST(ChangeList, IsExactWhileThereIsRoom) {
   Random random(1);
-  for (int round = 0; round < 300; ++round) {
+  for (int round = 0; round < tests::rounds(300); ++round) {
     Modelled both;
     for (int i = 0; i < 3; ++i) both.add(randomRect(random, 100));
     const Cover cover = coverOf(both.list.all());
@@ -94,7 +94,7 @@ TEST(ChangeList, IsExactWhileThereIsRoom) {
 
 TEST(ChangeList, HoldsEverythingWhenItOverflows) {
   Random random(2);
-  for (int round = 0; round < 100; ++round) {
+  for (int round = 0; round < tests::rounds(100); ++round) {
     Modelled both;
     for (int i = 0; i < 60; ++i) both.add(randomRect(random, 12));
     expectDisjointAndCovering(both.list.all(), both.model);
@@ -121,7 +121,7 @@ TEST(ChangeList, JoinsWhatGoesOnInTheNextStrip) {
 
 TEST(ChangeList, TakesOutNothingElse) {
   Random random(3);
-  for (int round = 0; round < 500; ++round) {
+  for (int round = 0; round < tests::rounds(500); ++round) {
     Modelled both;
     for (int i = 0; i < 12; ++i) {
       both.add(randomRect(random, 40));
@@ -179,7 +179,7 @@ TEST(ChangeList, JoinsWhatIsNear) {
 
 TEST(ChangeList, JoinsAndLosesNothing) {
   Random random(5);
-  for (int round = 0; round < 300; ++round) {
+  for (int round = 0; round < tests::rounds(300); ++round) {
     std::vector<Rect> rects;
     for (uint32 i = random.below(20); i != 0; --i) rects.push_back(randomRect(random, 30));
     const std::vector<Rect> apart = rects;

@@ -207,7 +207,7 @@ TEST(Protocol, KnowsWhenItIsWithinAMessage) {
 
 TEST(Protocol, SurvivesRandomBytes) {
   Random random(20);
-  for (int round = 0; round < 20000; ++round) {
+  for (int round = 0; round < tests::rounds(20000); ++round) {
     Diary diary;
     Protocol protocol(diary);
     Bytes out;

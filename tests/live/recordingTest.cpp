@@ -152,7 +152,7 @@ TEST(Recording, FollowsANewSize) {
 TEST(Recording, SurvivesDamage) {
   const Sample sample = makeSample();
   Random random(3);
-  for (int round = 0; round < 3000; ++round) {
+  for (int round = 0; round < tests::rounds(3000); ++round) {
     GuardedBuffer file(sample.file.size());
     file.assign(sample.file);
     for (uint32 i = 1 + random.below(3); i != 0; --i) {

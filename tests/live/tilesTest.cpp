@@ -34,7 +34,7 @@ bool sameColor(const uint8* a, const uint8* b) { return memcmp(a, b, 3) == 0; }
 
 TEST(Tiles, TakesOverWhatDiffersWithinTheDamage) {
   Random random(1);
-  for (int round = 0; round < 200; ++round) {
+  for (int round = 0; round < tests::rounds(200); ++round) {
     GuardedBuffer now(kSize);
     GuardedBuffer seen(kSize);
     seen.assign(random.bytes(kSize));

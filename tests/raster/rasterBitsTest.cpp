@@ -281,7 +281,7 @@ void expectWithin(Random& random, uint32 bytesPerPixel, uint32 width, uint32 fir
 // A run of bits anywhere, and no memory before it or behind it, as far as the level can do without.
 TEST(Raster_BitsToPixelsStencil, TouchesNothingBesideTheSetBits) {
   Random random(3);
-  for (int round = 0; round < 6000; ++round) {
+  for (int round = 0; round < tests::rounds(6000); ++round) {
     const uint32 bytesPerPixel = 1 + random.below(4);
     const uint32 together = pixelsReachedTogether(bytesPerPixel);
     const uint32 width = 1 + random.below(600);
