@@ -97,7 +97,8 @@ void addPixman(Contenders& c, const Job& job, Extent e, uint8* dst, uint8* src, 
   auto* mask = (job.flags & RASTER_BLEND_USE_SRC_ALPHA) != 0
                    ? pixman_image_create_solid_fill(&faded)
                    : nullptr;
-  c.add(dstAlpha ? "pixman~dst" : "pixman", [=, op = static_cast<pixman_op_t>(job.op)] {
+  const char* name = dstAlpha ? "pixman~dst" : job.bpp == 32 ? "pixman~x" : "pixman";
+  c.add(name, [=, op = static_cast<pixman_op_t>(job.op)] {
     pixman_image_composite32(op, from, mask, to, 0, 0, 0, 0, 0, 0, static_cast<int>(e.width),
                              static_cast<int>(e.height));
   });
