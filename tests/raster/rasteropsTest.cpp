@@ -185,10 +185,11 @@ TEST(Raster_RectCopy, ShiftsOneRowDownUpAndOnePixelRight) {
   }
 }
 
-TEST(Raster_RectCopy, MovesRowsOfAnyLengthWithinThemselves) {
+TEST(Raster_RectCopy, MovesRowsOfAnyLengthWithinThemselvesAndApart) {
   Random random(7);
-  for (const uint32 bytes : {129u, 200u, 257u, 1000u, 5003u, 32768u, 32769u, 262144u, 262145u}) {
-    for (const uint32 distance : {1u, 15u, 64u, 65u, 256u, 300u}) {
+  for (const uint32 bytes :
+       {129u, 200u, 257u, 1000u, 4095u, 4096u, 5003u, 32767u, 32768u, 32769u, 262144u, 262145u}) {
+    for (const uint32 distance : {1u, 15u, 64u, 65u, 256u, 300u, bytes - 1, bytes, bytes + 77}) {
       for (const bool right : {false, true}) {
         const uint32 from = random.below(64) + (right ? 0 : distance);
         const uint32 to = right ? from + distance : from - distance;
@@ -200,6 +201,24 @@ TEST(Raster_RectCopy, MovesRowsOfAnyLengthWithinThemselves) {
         ASSERT_EQ(actual.bytes(), expected) << bytes << " bytes from " << from << " to " << to;
       }
     }
+  }
+}
+
+TEST(Raster_RectCopy, CopiesSeveralLongRowsBetweenTheirGaps) {
+  Random random(8);
+  for (const uint32 bytes : {4095u, 4096u, 9001u, 32768u, 40000u}) {
+    const uint32 pitch = bytes + 1 + random.below(100);
+    const uint32 srcPitch = bytes + 1 + random.below(100);
+    const uint32 x = random.below(64);
+    constexpr uint32 kRows = 3;
+    const Bytes source = random.bytes(size_t{srcPitch} * kRows);
+    Bytes expected = random.bytes(size_t{pitch} * (kRows - 1) + x + bytes);
+    GuardedBuffer actual(expected.size(), tests::someGuard(random));
+    actual.assign(expected);
+    for (size_t y = 0; y < kRows; ++y)
+      memcpy(&expected[y * pitch + x], &source[y * srcPitch], bytes);
+    Raster_RectCopy(actual.data(), pitch, source.data(), srcPitch, 1, 0, 0, x, 0, bytes, kRows);
+    ASSERT_TRUE(actual.bytes() == expected) << bytes << " bytes at " << x;
   }
 }
 

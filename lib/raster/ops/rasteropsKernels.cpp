@@ -121,9 +121,13 @@ HWY_NOINLINE void fillLongRuns(const Rows& rows, uint32 word) {
   forRows(rows, [=](uint8* row) { storeLongRun(row, word, bytes); });
 }
 
-/// The shortest row that is filled or copied as a long run.
+/// The shortest row that is filled or copied as a long run; that is copied by the same instructions
+/// in the inner caches, where it depends on the vectors that are the alternative; and for which
+/// anything but these is thought of.
 constexpr size_t kMinFilledRun = 2048;
 constexpr size_t kMinCopiedRun = 256 * 1024;
+constexpr size_t kMinNearRun = HWY_TARGET == HWY_AVX3 ? 32 * 1024 : 4096;
+constexpr size_t kMinFarRow = 2048;
 
 void fillRows(const Rows& rows, const PixelWords& pixels) {
   const uint32* const word = pixels.word;
@@ -158,16 +162,27 @@ bool areApart(const RowPair& rows) {
       .isApartFrom(RowSpan(rows.src, rows.srcStep, rows.bytes, rows.rows));
 }
 
-HWY_NOINLINE void copyLongRows(const RowPair& rows) {
+/// Copies rows of at least kMinFarRow bytes where vectors in the caches are not the quickest, and
+/// where no row shares bytes with the source. Returns whether it did.
+HWY_NOINLINE bool copyFarRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
-  if (areLongRuns(bytes, rows.rows, kMinCopiedRun) && areApart(rows)) {
-    return forRows(rows, [=](uint8* dst, const uint8* src) { copyLongRun(dst, src, bytes); });
-  }
-  if (isStreamed(bytes, 2 * bytes, rows.rows) && areApart(rows)) {
+  const bool longRuns = areLongRuns(bytes, rows.rows, kMinCopiedRun);
+  const bool streamed = !longRuns && isStreamed(bytes, 2 * bytes, rows.rows);
+  const bool runs = longRuns || (!streamed && bytes >= kMinNearRun && hasFastStringInstructions());
+  if (!(runs || streamed) || !areApart(rows)) return false;
+  if (runs) {
+    forRows(rows, [=](uint8* dst, const uint8* src) { copyLongRun(dst, src, bytes); });
+  } else {
     forRows(rows, [&](uint8* dst, const uint8* src)
                       HWY_ATTR { streamLongRow(dst, src, bytes, kCopied); });
-    return endStreams();
+    endStreams();
   }
+  return true;
+}
+
+HWY_NOINLINE void copyLongRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  if (bytes >= kMinFarRow && copyFarRows(rows)) return;
   forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
     if (bytes <= kMaxOwnBytes) {
       moveRow(dst, src, bytes);
