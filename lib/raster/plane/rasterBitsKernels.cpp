@@ -262,7 +262,8 @@ HWY_NOINLINE void expandRowsByRuns(const Expansion& e, const BitColors& colors) 
 template <unsigned kBytes, bool kStencil>
 void expandRows(const Expansion& e, const BitColors& colors) {
   if (e.width < 8) return expandNarrowRows<kBytes, kStencil>(e, colors);
-  constexpr bool kMayBeFar = kBytes > 1;  // pixels of one byte come slowly enough as it is
+  // Pixels of one byte come slowly enough as it is, but where only a masked store touches them.
+  constexpr bool kMayBeFar = kBytes > 1 || (kStencil && HWY_TARGET == HWY_AVX3);
   const bool far = kMayBeFar && isFar(e.width * kBytes, e.height);
   if constexpr (kStencil && kBytes <= 2) {  // of larger pixels, a group is a run
     if (e.width >= kRun<kBytes>) {

@@ -20,13 +20,21 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
+/// Whether packed rows that are far are fetched ahead. With AVX-512 and eight registers most
+/// constants are loaded again for every vector, and these loads leave few places to begin those of
+/// far memory early.
+inline constexpr bool kFetchesPacked = HWY_TARGET == HWY_AVX3 && sizeof(void*) == 4;
+
 /// One set of rows of a packed layout: a luma byte and a chroma byte alternate.
 /// Deliberate: a group's first chroma byte is the red-difference, its second the blue-difference.
 template <bool kLumaFirst> struct PackedRows {
   static constexpr size_t kRows = 1;
   const uint8* bytes;
+  bool far = false;
 
-  PackedRows(const YuvFrame& frame, uint32 set) : bytes(frame.luma.first + set * frame.luma.step) {}
+  PackedRows(const YuvFrame& frame, uint32 set)
+      : bytes(frame.luma.first + set * frame.luma.step),
+        far(kFetchesPacked && isFar(4 * frame.groups, frame.rowSets)) {}
 
 #if HWY_TARGET == HWY_SCALAR
   uint8 luma(size_t pixel, size_t /*row*/) const { return bytes[2 * pixel + (kLumaFirst ? 0 : 1)]; }
@@ -34,6 +42,11 @@ template <bool kLumaFirst> struct PackedRows {
   uint8 cb(size_t group) const { return bytes[4 * group + (kLumaFirst ? 3 : 2)]; }
 #else
   explicit PackedRows(const uint8* first) : bytes(first) {}
+
+  /// Asks for what the groups of a vector come to soon.
+  HWY_INLINE void fetch(size_t group) const {
+    if (kFetchesPacked && far) fetchAhead(bytes + 4 * group);
+  }
 
   template <class P, class D>
   HWY_INLINE Unsigned16<D> luma(P /*packing*/, D d, size_t group, size_t /*row*/) const {
@@ -84,6 +97,8 @@ struct PlanarRows {
 #else
   PlanarRows(const uint8* luma, size_t pitch, const uint8* cb, const uint8* cr)
       : lumas(luma), lumaPitch(pitch), cbs(cb), crs(cr) {}
+
+  HWY_INLINE void fetch(size_t /*group*/) const {}
 
   template <class P, class D>
   HWY_INLINE Unsigned16<D> luma(P /*packing*/, D /*d*/, size_t group, size_t row) const {
@@ -160,8 +175,10 @@ HWY_INLINE void convertFrom(D d, const Rows& rows, size_t group, size_t groups, 
                             size_t dstPitch) {
   constexpr size_t kStep = kLanes<D> / 2;
   constexpr size_t kGroupBytes = 2 * P::kBytes;
-  for (; groups - group >= kStep; group += kStep)
+  for (; groups - group >= kStep; group += kStep) {
+    rows.fetch(group);
     convertBlock<P>(d, rows, group, dst + group * kGroupBytes, dstPitch);
+  }
   if (group == groups) return;
   if constexpr (kLanes < D >> 8) {
     convertFrom<Rows, P>(hn::Half<D>(), rows, group, groups, dst, dstPitch);
