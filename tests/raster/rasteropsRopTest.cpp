@@ -251,6 +251,22 @@ TEST(Raster_RectROPcopy, EqualsTheModelAtEveryByteDistanceInEveryWalk) {
   }
 }
 
+TEST(Raster_RectROPcopy, WalksLongRowsWithoutAGapIntoWhatItStored) {
+  Random random(6);
+  for (int round = 0; round < tests::rounds(1000); ++round) {
+    Copy c{};
+    c.bytesPerPixel = 1 + random.below(4);
+    c.rop = random.oneOf({uint32{RASTER_ROP_XOR}, uint32{RASTER_ROP_COPY_INVERTED}});
+    c.width = 20 + random.below(150);
+    c.height = 2 + random.below(5);
+    c.srcPitch = c.dstPitch = static_cast<int32>(c.width * c.bytesPerPixel);
+    // Nearer than the rectangle is long, before or behind the source.
+    c.dst = random.between(-4, 4) * c.dstPitch + random.between(-70, 70);
+    checkCopy(random, c);
+    if (HasFatalFailure()) FAIL() << "round " << round;
+  }
+}
+
 TEST(Raster_RectROPcopy, EqualsTheModelWithinOneFrameBuffer) {
   Random random(4);
   for (int round = 0; round < tests::rounds(6000); ++round) {

@@ -121,6 +121,9 @@ HWY_NOINLINE void fillLongRuns(const Rows& rows, uint32 word) {
   forRows(rows, [=](uint8* row) { storeLongRun(row, word, bytes); });
 }
 
+/// Whether the processor's string instructions store more at once than vectors do.
+constexpr bool kHasShortVectors = kLanes<Bytes> == 16;
+
 /// The shortest row that is filled or copied as a long run; that is copied by the same instructions
 /// in the inner caches, where it depends on the vectors that are the alternative; and for which
 /// anything but these is thought of.
@@ -142,7 +145,7 @@ void fillRows(const Rows& rows, const PixelWords& pixels) {
 constexpr auto kCopied = [](auto d, const uint8* src, const uint8* /*dst*/, size_t at)
                              HWY_ATTR { return loadLanes(d, src + at); };
 
-/// As memmove, of more than a vector.
+/// As memmove, of more than two vectors.
 void moveRow(uint8* dst, const uint8* src, size_t bytes) {
   const uintptr_t ahead = reinterpret_cast<uintptr_t>(dst) - reinterpret_cast<uintptr_t>(src);
   if (ahead >= bytes) {
@@ -154,7 +157,9 @@ void moveRow(uint8* dst, const uint8* src, size_t bytes) {
 
 // Rows up to here are moved by moveRow, which is faster than the C library's memmove for them: in
 // the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
-constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 32 * 1024;
+constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 16 * 1024;
+// The C library may know longer vectors; but it is slow with long rows from right to left.
+constexpr size_t kMaxOwnCopied = kHasShortVectors && sizeof(void*) != 4 ? 128 : kMaxOwnBytes;
 
 /// Whether no row shares bytes with any row of the source.
 bool areApart(const RowPair& rows) {
@@ -183,8 +188,9 @@ HWY_NOINLINE bool copyFarRows(const RowPair& rows) {
 HWY_NOINLINE void copyLongRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
   if (bytes >= kMinFarRow && copyFarRows(rows)) return;
+  const size_t maxOwn = rows.overlap() ? kMaxOwnBytes : kMaxOwnCopied;
   forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
-    if (bytes <= kMaxOwnBytes) {
+    if (bytes <= maxOwn) {
       moveRow(dst, src, bytes);
     } else {
       memmove(dst, src, bytes);
@@ -192,10 +198,18 @@ HWY_NOINLINE void copyLongRows(const RowPair& rows) {
   });
 }
 
-// Two functions, as the short rows need nothing from the stack and so no alignment of it.
+/// Copies rows of two to four vectors.
+HWY_NOINLINE void copyMediumRows(const RowPair& rows) {
+  const size_t bytes = rows.bytes;
+  forRows(rows, [&](uint8* dst, const uint8* src)
+                    HWY_ATTR { storeFourVectors(Bytes(), dst, src, 0, bytes, kCopied); });
+}
+
+// Functions of their own, as the short rows need nothing from the stack and so no alignment of it.
 void copyRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
-  if (bytes > 2 * kLanes<Bytes>) return copyLongRows(rows);
+  if (bytes > 2 * kLanes<Bytes>)
+    return bytes > 4 * kLanes<Bytes> ? copyLongRows(rows) : copyMediumRows(rows);
   withShortRow(Bytes(), bytes, kCopied, [&](auto copy) HWY_ATTR {
     forRows(rows, [&](uint8* dst, const uint8* src) HWY_ATTR { copy(dst, src, bytes); });
   });

@@ -44,12 +44,24 @@ template <class Rop> HWY_NOINLINE void combineShortRows(const RowPair& rows) {
   });
 }
 
-template <class Rop, Walk kWalk> void combineRows(const RowPair& rows) {
+template <class Rop, Walk kWalk> HWY_NOINLINE void combineLongRows(const RowPair& rows) {
   const size_t bytes = rows.bytes;
-  if (bytes <= 2 * kLanes<Bytes>) return combineShortRows<Rop>(rows);
   const CombinedAt<Rop> combinedAt;
+  if (bytes <= 4 * kLanes<Bytes>) {
+    return forRowsInStep(rows, [&](uint8* dst, const uint8* src) HWY_ATTR {
+      storeFourVectors(Bytes(), dst, src, 0, bytes, combinedAt);
+    });
+  }
   forRowsInStep(rows, [&](uint8* dst, const uint8* src)
                           HWY_ATTR { storeLongRow<kWalk>(dst, src, bytes, combinedAt); });
+}
+
+template <class Rop, Walk kWalk> void combineRows(const RowPair& rows) {
+  if (rows.bytes <= 2 * kLanes<Bytes>) return combineShortRows<Rop>(rows);
+  // Rows without a gap are one, unless it stores ahead of where it reads.
+  const RowPair joined = rows.joined();
+  const bool isOne = joined.ahead() == 0 || joined.ahead() >= joined.bytes;
+  combineLongRows<Rop, kWalk>(kWalk == Walk::kToRight && isOne ? joined : rows);
 }
 
 #endif

@@ -69,29 +69,45 @@ HWY_INLINE void withShortRow(D d, size_t bytes, const Make& make, const Body& bo
   });
 }
 
-/// Stores a row of more than a vector in the order of a walk.
+/// Stores `bytes` from the offset `at` of a row on, two to four vectors, which are made first.
+template <class D, class Make>
+HWY_INLINE void storeFourVectors(D d, uint8* dst, const uint8* src, size_t at, size_t bytes,
+                                 const Make& make) {
+  constexpr size_t n = kLanes<D>;
+  const size_t end = at + bytes;
+  const auto first = make(d, src, dst, at);
+  const auto second = make(d, src, dst, at + n);
+  const auto third = make(d, src, dst, end - 2 * n);
+  const auto last = make(d, src, dst, end - n);
+  storeLanes(d, first, dst + at);
+  storeLanes(d, second, dst + at + n);
+  storeLanes(d, third, dst + end - 2 * n);
+  storeLanes(d, last, dst + end - n);
+}
+
+/// Stores a row of more than two vectors in the order of a walk, four at a time. The outer two are
+/// made first and stored last.
 template <Walk kWalk, class Make>
 HWY_INLINE void storeLongRow(uint8* dst, const uint8* src, size_t bytes, const Make& make) {
   const hn::ScalableTag<uint8> d;
   constexpr size_t n = kLanes<decltype(d)>;
-  constexpr bool kRight = kWalk == Walk::kToRight;
-  const size_t end = kRight ? bytes - n : 0;
-  size_t at = kRight ? 0 : bytes - n;
-  auto block = make(d, src, dst, at);
-  const auto storeAndMake = [&](size_t next) HWY_ATTR {
-    const auto made = make(d, src, dst, next);
-    storeLanes(d, block, dst + at);
-    block = made;
-    at = next;
-  };
-  if constexpr (kRight) {
-    for (size_t i = n - reinterpret_cast<uintptr_t>(dst) % n; i < end; i += n) storeAndMake(i);
+  const size_t end = bytes - n;
+  const auto first = make(d, src, dst, 0);
+  const auto last = make(d, src, dst, end);
+  const auto storeOne = [&](size_t at) HWY_ATTR { storeLanes(d, make(d, src, dst, at), dst + at); };
+  const auto storeFour = [&](size_t at)
+                             HWY_ATTR { storeFourVectors(d, dst, src, at, 4 * n, make); };
+  if constexpr (kWalk == Walk::kToRight) {
+    size_t i = n - reinterpret_cast<uintptr_t>(dst) % n;
+    for (; i + 3 * n < end; i += 4 * n) storeFour(i);
+    for (; i < end; i += n) storeOne(i);
   } else {
     size_t i = bytes - 1 - (reinterpret_cast<uintptr_t>(dst) + bytes - 1) % n;
-    for (; i > n; i -= n) storeAndMake(i - n);
+    for (; i > 4 * n; i -= 4 * n) storeFour(i - 4 * n);
+    for (; i > n; i -= n) storeOne(i - n);
   }
-  storeAndMake(end);
-  storeLanes(d, block, dst + at);
+  storeLanes(d, first, dst);
+  storeLanes(d, last, dst + end);
 }
 
 /// Stores a row of more than a vector past the caches.
