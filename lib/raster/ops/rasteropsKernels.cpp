@@ -19,6 +19,8 @@ HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
 namespace {
 
+using Bytes = hn::ScalableTag<uint8>;
+
 #if HWY_TARGET == HWY_SCALAR
 
 // Rows without bytes may have no address: the C library is not told of them.
@@ -39,8 +41,6 @@ void copyRows(const RowPair& rows) {
 }
 
 #else
-
-using Bytes = hn::ScalableTag<uint8>;
 
 /// Fills rows of at least one vector with the three vectors that start the pattern, over and over.
 /// The end of a row is stored as one vector that overlaps what is there already.
@@ -217,14 +217,41 @@ void copyRows(const RowPair& rows) {
 
 #endif
 
-void fillAlphaRows(const Rows& rows, uint32 alphaBits) {
+/// Gives pixels an alpha.
+struct AlphaFill {
+  uint32 alphaBits;
+
+  template <class D> HWY_INLINE void operator()(D d, uint8* at) const {
+    const auto color = hn::And(loadLanes(d, at), hn::Set(d, 0x00FFFFFFu));
+    storeLanes(d, hn::Or(color, hn::Set(d, alphaBits)), at);
+  }
+};
+
+template <bool kFetches> HWY_INLINE void fillAlphaOfRows(const Rows& rows, AlphaFill fill) {
   const size_t pixels = rows.bytes / 4;
   forRows(rows, [&](uint8* row) HWY_ATTR {
-    forLanes(hn::ScalableTag<uint32>(), pixels, [&](auto d, size_t x) HWY_ATTR {
-      const auto color = hn::And(loadLanes(d, row + 4 * x), hn::Set(d, 0x00FFFFFFu));
-      storeLanes(d, hn::Or(color, hn::Set(d, alphaBits)), row + 4 * x);
-    });
+    forLanesOfLongRow<kFetches>(hn::ScalableTag<uint32>(), pixels, row, fill);
   });
+}
+
+HWY_NOINLINE void fillAlphaOfLongRows(const Rows& rows, uint32 alphaBits) {
+  isFetchedAhead(rows.bytes, rows.rows) ? fillAlphaOfRows<true>(rows, {alphaBits})
+                                        : fillAlphaOfRows<false>(rows, {alphaBits});
+}
+
+// On its own: GCC would make something else of a loop that it knows to be short.
+HWY_NOINLINE void fillAlphaOfShortRows(const Rows& rows, uint32 alphaBits) {
+  const AlphaFill fill{alphaBits};
+  const size_t pixels = rows.bytes / 4;
+  forRows(rows, [&](uint8* row) HWY_ATTR {
+    forLanes(hn::ScalableTag<uint32>(), pixels,
+             [&](auto d, size_t x) HWY_ATTR { fill(d, row + 4 * x); });
+  });
+}
+
+void fillAlphaRows(const Rows& rows, uint32 alphaBits) {
+  rows.bytes > 16 * kLanes<Bytes> ? fillAlphaOfLongRows(rows, alphaBits)
+                                  : fillAlphaOfShortRows(rows, alphaBits);
 }
 
 constexpr RasteropsKernels kKernels = {fillRows, copyRows, fillAlphaRows};

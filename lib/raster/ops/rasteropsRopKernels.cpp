@@ -95,9 +95,9 @@ struct FillPatterns {
   }
 };
 
-/// Fills rows of more than two vectors.
-HWY_NOINLINE void fillLongRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
-  const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
+/// Fills long rows with patterns that repeat after three vectors.
+template <bool kFetches>
+HWY_INLINE void fillWithPatterns(const Rows& rows, const FillPatterns& filledAt) {
   const Bytes d;
   constexpr size_t n = kLanes<Bytes>;
   const size_t bytes = rows.bytes;
@@ -106,7 +106,7 @@ HWY_NOINLINE void fillLongRows(const Rows& rows, const PixelWords& keep, const P
   forRows(rows, [&](uint8* row) HWY_ATTR {
     size_t i = 0;
     for (; bytes - i >= 3 * n; i += 3 * n) {
-      for (size_t k = 0; k < 3 * n; k += kCacheLine) fetchAhead(row + i + k);
+      for (size_t k = 0; kFetches && k < 3 * n; k += kCacheLine) fetchAhead(row + i + k);
       fill(d, row + i, 0);
       fill(d, row + i, n);
       fill(d, row + i, 2 * n);
@@ -115,9 +115,42 @@ HWY_NOINLINE void fillLongRows(const Rows& rows, const PixelWords& keep, const P
   });
 }
 
+/// Fills long rows with words that are all the same.
+template <bool kFetches>
+HWY_INLINE void fillWithWords(const Rows& rows, const FillPatterns& filledAt) {
+  const size_t bytes = rows.bytes;
+  const auto fill = [&](auto tag, uint8* dst)
+                        HWY_ATTR { storeLanes(tag, filledAt(tag, nullptr, dst, 0), dst); };
+  forRows(rows,
+          [&](uint8* row) HWY_ATTR { forLanesOfLongRow<kFetches>(Bytes(), bytes, row, fill); });
+}
+
+bool areSame(const PixelWords& words) {
+  return words.word[0] == words.word[1] && words.word[1] == words.word[2];
+}
+
+HWY_NOINLINE void fillLongRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
+  const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
+  const bool fetches = isFetchedAhead(rows.bytes, rows.rows);
+  if (areSame(keep) && areSame(flip)) {
+    fetches ? fillWithWords<true>(rows, filledAt) : fillWithWords<false>(rows, filledAt);
+  } else {
+    fetches ? fillWithPatterns<true>(rows, filledAt) : fillWithPatterns<false>(rows, filledAt);
+  }
+}
+
+/// Fills rows of two to four vectors.
+HWY_NOINLINE void fillMediumRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
+  const size_t bytes = rows.bytes;
+  const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
+  forRows(rows, [&](uint8* row)
+                    HWY_ATTR { storeFourVectors(Bytes(), row, nullptr, 0, bytes, filledAt); });
+}
+
 void fillRows(const Rows& rows, const PixelWords& keep, const PixelWords& flip) {
   const size_t bytes = rows.bytes;
-  if (bytes > 2 * kLanes<Bytes>) return fillLongRows(rows, keep, flip);
+  if (bytes > 4 * kLanes<Bytes>) return fillLongRows(rows, keep, flip);
+  if (bytes > 2 * kLanes<Bytes>) return fillMediumRows(rows, keep, flip);
   const FillPatterns filledAt = {patternOf(keep), patternOf(flip)};
   withShortRow(Bytes(), bytes, filledAt, [&](auto shortRow) HWY_ATTR {
     forRows(rows, [&](uint8* row) HWY_ATTR { shortRow(row, nullptr, bytes); });

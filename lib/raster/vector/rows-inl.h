@@ -18,6 +18,7 @@
 #include <cstring>
 
 #include "baseTypes.h"
+#include "cacheSize.h"
 #include "frame/frameBuffer.h"
 #include "hwy/highway.h"
 
@@ -65,6 +66,12 @@ inline constexpr size_t kCacheLine = 64;
 HWY_INLINE bool isFar(size_t bytes, uint32 height) {
   constexpr uint64 kInnerCaches = uint64{512} * 1024;
   return uint64{bytes} * height >= kInnerCaches;
+}
+
+/// Whether it pays to fetch ahead rows that are read and written back. Beyond all caches the
+/// processor is faster alone.
+HWY_INLINE bool isFetchedAhead(size_t bytes, uint32 height) {
+  return isFar(bytes, height) && !isBeyondCaches(uint64{bytes} * height);
 }
 
 /// Asks for the memory that a loop over a long row comes to soon: processors do not fetch far ahead
@@ -119,6 +126,23 @@ template <class D, class Body> HWY_INLINE void forLanes(D d, size_t count, const
   if constexpr (kHasHalf<D>) {
     if (first != count) forRestOfLanes(hn::Half<D>(), first, count, body);
   }
+}
+
+/// Runs body(tag, at) over a row of `count` lanes that is read and written back, from left to
+/// right, four vectors at a time; with kFetches its memory is fetched ahead.
+template <bool kFetches, class D, class Body>
+HWY_INLINE void forLanesOfLongRow(D d, size_t count, uint8* row, const Body& body) {
+  constexpr size_t kBytes = kLanes<D> * sizeof(hn::TFromD<D>);
+  uint8* at = row;
+  for (size_t fours = count / (4 * kLanes<D>); fours != 0; --fours, at += 4 * kBytes) {
+    for (size_t k = 0; kFetches && k < 4 * kBytes; k += kCacheLine) fetchAhead(at + k);
+    body(d, at);
+    body(d, at + kBytes);
+    body(d, at + 2 * kBytes);
+    body(d, at + 3 * kBytes);
+  }
+  forLanes(d, count % (4 * kLanes<D>),
+           [&](auto tag, size_t x) HWY_ATTR { body(tag, at + x * sizeof(hn::TFromD<D>)); });
 }
 
 /// forLanesFromRight for the rest of a row, [0, count), that is shorter than two blocks of `d`.
