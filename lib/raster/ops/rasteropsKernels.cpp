@@ -135,7 +135,7 @@ constexpr size_t kMinFarRow = 2048;
 void fillRows(const Rows& rows, const PixelWords& pixels) {
   const uint32* const word = pixels.word;
   const bool isWord = word[0] == word[1] && word[1] == word[2];
-  if (isWord && areLongRuns(rows.bytes, rows.rows, kMinFilledRun))
+  if (isWord && areLongRuns(rows.bytes, rows.rows, kMinFilledRun, kHasShortVectors))
     return fillLongRuns(rows, word[0]);
   if (isStreamed(rows.bytes, rows.bytes, rows.rows)) return fillFarRows(rows, pixels);
   isWord ? fillWithWord(rows, word[0]) : fillWithPattern(rows, pixels);

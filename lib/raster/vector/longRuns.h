@@ -19,10 +19,11 @@ namespace raster {
 bool hasFastStringInstructions();
 
 /// Whether `rows` runs of `bytes`, each of at least `leastBytes`, are better left to these
-/// instructions: together they are more than the inner caches hold.
-inline bool areLongRuns(size_t bytes, uint32 rows, size_t leastBytes) {
+/// instructions: together they are more than the inner caches hold, or it is better there too.
+inline bool areLongRuns(size_t bytes, uint32 rows, size_t leastBytes, bool anywhere = false) {
   constexpr uint64 kInnerCaches = uint64{1} << 20;
-  return bytes >= leastBytes && uint64{bytes} * rows >= kInnerCaches && hasFastStringInstructions();
+  return bytes >= leastBytes && (anywhere || uint64{bytes} * rows >= kInnerCaches) &&
+         hasFastStringInstructions();
 }
 
 /// Stores a word over and over, the last time as much of it as fits. At least a word.
