@@ -113,17 +113,21 @@ template <class D> HWY_INLINE void storeByteBlock(D d, const Block<D>& block, ui
   }
 }
 
-/// Stores the low halves of 32-bit lanes.
+/// Stores lanes below 65536 as halves.
 template <bool kStreams, class D>
-HWY_INLINE void storeHalfBlock(D d, const Block<D>& block, uint8* at) {
+HWY_INLINE void storeHalfBlock(D /*d*/, const Block<D>& block, uint8* at) {
   const hn::Repartition<uint16, D> d16;
   for (size_t i = 0; i < 2; ++i) {
-    putLanes<kStreams>(
-        d16,
-        hn::ConcatEven(d16, hn::BitCast(d16, block.v[2 * i + 1]), hn::BitCast(d16, block.v[2 * i])),
-        at + i * kBlockPixels<D>);
+    const auto low = block.v[2 * i];
+    const auto high = block.v[2 * i + 1];
+#if HWY_TARGET == HWY_SSE4
+    // ConcatEven would clear the upper halves first.
+    const hn::Vec<decltype(d16)> halves{_mm_packus_epi32(low.raw, high.raw)};
+#else
+    const auto halves = hn::ConcatEven(d16, hn::BitCast(d16, high), hn::BitCast(d16, low));
+#endif
+    putLanes<kStreams>(d16, halves, at + i * kBlockPixels<D>);
   }
-  (void)d;
 }
 
 // ---- Wide channels -----------------------------------------------------------------------------

@@ -51,6 +51,40 @@ HWY_INLINE hn::Vec<D> addRepeated(D d, hn::Vec<D> color, hn::Vec<D> tops) {
   }
 }
 
+/// Whether red lies in the upper half of a pixel and is narrowed to two bytes with the others, so
+/// that one instruction moves red and blue (narrowByProducts).
+template <class From, class To>
+inline constexpr bool kHasProducts =
+    From::Red::kMask == 0xFF0000 && From::Blue::kMask == 0xFF && To::kBytes == 2;
+
+#if HWY_TARGET != HWY_SCALAR
+
+/// Red and blue, as numbers of 16 bits, are multiplied to where they meet green, and added.
+template <class From, class To, class D>
+HWY_INLINE hn::Vec<D> narrowByProducts(D d, hn::Vec<D> pixels) {
+  using Move = ColorMove<From, To>;
+  const hn::Repartition<int16, D> d16;
+  const hn::RebindToSigned<D> d32;
+  constexpr int kRight = Move::Green::kRight;
+  constexpr auto topsOf = [](uint32 mask, int right) {
+    return right < 0 ? mask >> -right : mask << right;
+  };
+  constexpr uint32 kRedFactor = 1u << (kRight + 16 - Move::Red::kRight);
+  constexpr uint32 kBlueFactor = 1u << (kRight - Move::Blue::kRight);
+  static_assert(kRedFactor < 0x8000 && kBlueFactor < 0x8000);
+  const auto outer =
+      hn::And(pixels, setMask(d, topsOf(Move::Red::kTopMask, Move::Red::kRight) |
+                                     topsOf(Move::Blue::kTopMask, Move::Blue::kRight)));
+  const auto factors = hn::BitCast(d16, hn::Set(d, kRedFactor << 16 | kBlueFactor));
+  auto rest = hn::Zero(d32);
+  const auto moved =
+      hn::ReorderWidenMulAccumulate(d32, hn::BitCast(d16, outer), factors, hn::Zero(d32), rest);
+  const auto green = setMask(d, topsOf(Move::Green::kTopMask, kRight));
+  return hn::ShiftRight<kRight>(hn::OrAnd(hn::BitCast(d, moved), pixels, green));
+}
+
+#endif
+
 /// convertColor on lanes. Channels that move alike move together.
 template <class From, class To, class D>
 HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
@@ -58,6 +92,9 @@ HWY_INLINE hn::Vec<D> convertLanes(D d, hn::Vec<D> pixels) {
   using R = typename Move::Red;
   using G = typename Move::Green;
   using B = typename Move::Blue;
+#if HWY_TARGET != HWY_SCALAR
+  if constexpr (kHasProducts<From, To>) return narrowByProducts<From, To>(d, pixels);
+#endif
   auto tops = hn::And(shiftLanes<B::kRight>(pixels), setMask(d, B::kTopMask));
   const auto green = shiftLanes<G::kRight>(pixels);
   if constexpr (R::kRight == G::kRight) {
