@@ -10,6 +10,7 @@
 
 #include "raster.h"
 #include "reference/rasterConvReference.h"
+#include "reference/rasterScaleReference.h"
 #include "reference/rasteropsReference.h"
 #include "reference/rasterpixReference.h"
 #include "support/guardedBuffer.h"
@@ -221,6 +222,46 @@ TEST(FarRectangles, AreConvertedToPixelsBesideTheirBoundaries) {
   checkConversion(random, 16, 32, 1);
   checkConversion(random, 24, 32, 2);
   checkConversion(random, 32, 16, 1);
+}
+
+/// Rows of 4-byte pixels, all of whose addresses are `shift` pixels beside a multiple of a vector.
+void checkScaling(Random& random, double scale, int32 smooth, uint32 shift) {
+  constexpr uint32 kVector = 64;
+  reference::ScaleCall c;
+  c.dstBpp = c.srcBpp = 32;
+  c.dstDepth = 24;
+  c.srcDepth = 24;
+  c.scaleX = c.scaleY = scale;
+  c.smooth = smooth;
+  c.dstWidth = 1024 + random.below(1500);
+  c.dstHeight = static_cast<uint32>(kFar / (size_t{4} * c.dstWidth)) + 1;
+  c.dstPitch = (4 * c.dstWidth / kVector + 1) * kVector;
+  c.dstBase = size_t{4} * shift;
+  c.x2 = static_cast<int32>(c.dstWidth);
+  c.y2 = static_cast<int32>(c.dstHeight);
+  c.srcWidth = static_cast<uint32>(c.dstWidth / scale);
+  c.srcHeight = static_cast<uint32>(c.dstHeight / scale);
+  c.srcPitch = static_cast<int32>(4 * c.srcWidth);
+  const Bytes source = noise(random, size_t{4} * c.srcWidth * c.srcHeight);
+  Bytes expected(size_t{c.dstPitch} * c.dstHeight + kVector, 0x5A);
+  GuardedBuffer actual(expected.size());
+  actual.assign(expected);
+  ASSERT_TRUE(reference::scale(expected, source, c).result);
+  ASSERT_TRUE(Raster_Scale(actual.data() + c.dstBase, c.dstPitch, 32, 24, c.dstWidth, c.dstHeight,
+                           0, 0, 0, c.x2, c.y2, source.data(), c.srcPitch, 32, 24, 0, c.srcWidth,
+                           c.srcHeight, 0, scale, scale, smooth));
+  ASSERT_TRUE(areEqual(actual, expected)) << c.dstWidth << "x" << c.dstHeight << " by " << scale
+                                          << (smooth != 0 ? ", smooth" : "") << ", shift " << shift;
+}
+
+TEST(FarRectangles, AreScaled) {
+  Random random(7);
+  for (const int32 smooth : {0, 1}) {
+    for (const double scale : {2.0, 1.5, 0.8}) checkScaling(random, scale, smooth, 0);
+  }
+  checkScaling(random, 0.5, 0, 0);
+  checkScaling(random, 2, 0, 3);
+  checkScaling(random, 1.5, 1, 5);
 }
 
 }  // namespace

@@ -10,6 +10,7 @@
 #include "hwy/highway.h"
 
 #include "rasterScaleAverage-inl.h"
+#include "rasterScaleDirect-inl.h"
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
 #include "rasterScaleMix-inl.h"
@@ -96,18 +97,20 @@ template <class Cache> WeightedRows rowsOfStep(Cache& cache, uint32 y, uint32 st
 }
 
 /// Mixed or averaged rows.
-template <unsigned kBytes, class Cache> void drawSmoothRows(const ScaleJob& job, Cache& cache) {
+template <unsigned kBytes, bool kStreams, class Cache>
+void drawSmoothRows(const ScaleJob& job, Cache& cache) {
   const bool enlarges = job.stepY < kOnePixel;
   uint32 y = job.startY - (enlarges ? kHalfPixel : 0);
   uint8* dst = job.dst;
   for (uint32 i = 0; i < job.height; ++i, y += job.stepY, dst = nextRow(dst, job.dstPitch)) {
     if (enlarges) {
       const uint32* upper = cache.at(y);
-      mixRows<kBytes>(dst, upper, cache.at(y + kOnePixel), mixWeights(y), job.width);
+      mixRows<kBytes, kStreams>(dst, upper, cache.at(y + kOnePixel), mixWeights(y), job.width);
     } else {
-      averageRows<kBytes>(dst, rowsOfStep(cache, y, job.stepY), job.stepY, job.width);
+      averageRows<kBytes, kStreams>(dst, rowsOfStep(cache, y, job.stepY), job.stepY, job.width);
     }
   }
+  if (kStreams) endStreams();
 }
 
 /// 24-bit pixels from a row of 32-bit ones. Deliberate: the walk takes every fourth pixel (16 bytes
@@ -192,15 +195,20 @@ void drawWidePixels(const ScaleJob& job) {
 }
 
 /// Nearest sampling of 4-byte pixels that are written where they belong at once.
-template <class Sampler> void drawNearestWith(const ScaleJob& job) {
+template <class Sampler, bool kStreams> HWY_NOINLINE void drawNearestTo(const ScaleJob& job) {
   ScaleMemory memory(Sampler::memoryFor(job));
-  Sampler(job, memory).draw();
+  Sampler(job, memory).template draw<kStreams>();
 }
 void drawNearest(const ScaleJob& job) {
   constexpr size_t kFewPixels = 32;
-  const bool few = size_t{job.width} * job.height <= kFewPixels;
-  few ? drawNearestWith<PlainNearest>(job) : drawNearestWith<Nearest>(job);
+  if (size_t{job.width} * job.height <= kFewPixels) return drawNearestTo<PlainNearest, false>(job);
+  if (drawDirect<EachTwice>(job) || drawDirect<EveryOther>(job)) return;
+  (areStreamed(job) ? drawNearestTo<Nearest, true> : drawNearestTo<Nearest, false>)(job);
 }
+
+/// Whether mixed and averaged rows may go past the caches. In vectors of 16 bytes, with as much to
+/// compute between them, that takes longer.
+constexpr bool kStreamsSmooth = 4 * kBlock >= 32;
 
 /// Everything else: source rows are resampled and kept, and made into destination rows.
 template <class Sampler> void drawWith(const ScaleJob& job, bool apart) {
@@ -208,7 +216,13 @@ template <class Sampler> void drawWith(const ScaleJob& job, bool apart) {
   const Sampler sampler(job, memory);
   RowCache<Sampler> cache(job, sampler, memory);
   if (job.smoothRows()) {
-    job.dstBytesPerPixel == 4 ? drawSmoothRows<4>(job, cache) : drawSmoothRows<3>(job, cache);
+    if (job.dstBytesPerPixel == 3) {
+      drawSmoothRows<3, false>(job, cache);
+    } else if (kStreamsSmooth && areStreamed(job)) {
+      drawSmoothRows<4, true>(job, cache);
+    } else {
+      drawSmoothRows<4, false>(job, cache);
+    }
   } else {
     const bool wholePixels = !job.converts() || (job.depthsDiffer && job.dstBytesPerPixel == 2);
     drawPlainRows(job, apart && wholePixels,

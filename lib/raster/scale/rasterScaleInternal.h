@@ -6,6 +6,8 @@
 #ifndef RASTER_RASTER_SCALE_INTERNAL_H
 #define RASTER_RASTER_SCALE_INTERNAL_H
 
+#include <algorithm>
+
 #include "frame/frameBuffer.h"
 
 namespace raster {
@@ -58,6 +60,12 @@ struct ScaleJob {
     return row < srcHeight ? row : srcHeight - 1;
   }
   size_t rowBytes() const { return size_t{width} * dstBytesPerPixel; }
+  /// What is read and written for a destination row, at most.
+  size_t touchedBytes() const {
+    const uint64 columns = std::min<uint64>(uint64{width} * stepX >> 16, srcWidth);
+    const uint32 rows = std::min(stepY, (smooth ? kMaxRows : 1) * kOnePixel);
+    return rowBytes() + static_cast<size_t>(columns * srcBytesPerPixel * rows >> 16);
+  }
 
   /// Whether no byte of the destination is a byte of the source or of two rows. Otherwise a source
   /// row is to be kept as it was when it was first needed, and resampled whole before it is drawn.

@@ -15,6 +15,7 @@
 
 #include "rasterScaleInternal.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 #include "vector/triples-inl.h"
 
 HWY_BEFORE_NAMESPACE();
@@ -27,6 +28,9 @@ inline constexpr size_t kBlock = 1;
 
 inline void copyRow(uint8* dst, const uint8* src, size_t bytes) { memcpy(dst, src, bytes); }
 
+inline bool areStreamed(const ScaleJob&) { return false; }
+inline void endStreams() {}
+
 #else
 
 using Pixels = hn::ScalableTag<uint32>;          // one pixel a lane
@@ -36,6 +40,14 @@ using PixelVec = hn::Vec<Pixels>;
 using HalvesVec = hn::Vec<Halves>;
 
 inline constexpr size_t kBlock = kLanes<Pixels>;
+
+/// Whether rows of 4-byte pixels go past the caches: where their vectors lie at multiples of their
+/// size.
+inline bool areStreamed(const ScaleJob& job) {
+  const auto places = reinterpret_cast<uintptr_t>(job.dst) | static_cast<uintptr_t>(job.dstPitch);
+  return isStreamed(job.rowBytes(), job.touchedBytes(), job.height) &&
+         places % sizeof(PixelVec) == 0;
+}
 
 /// Copies a run of a few vectors at most, without a call.
 HWY_INLINE void copyShort(uint8* dst, const uint8* src, size_t bytes) {

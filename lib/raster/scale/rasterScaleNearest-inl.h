@@ -13,6 +13,7 @@
 #endif
 
 #include <algorithm>
+#include <type_traits>
 
 #include "rasterScaleInternal.h"
 #include "rasterScaleMemory.h"
@@ -51,7 +52,7 @@ class PlainNearest {
   }
 
   /// Draws the job's rectangle, of 4-byte pixels: not a byte beyond.
-  void draw() const {
+  template <bool /*kPastCaches*/> void draw() const {
     forShownRows(job_, [&](const uint8* row, uint8* dst, uint32 rows) {
       sampleAs<4>(row, dst);
       for (uint8* next = nextRow(dst, job_.dstPitch); --rows != 0;
@@ -79,73 +80,79 @@ using Nearest = PlainNearest;
 
 #else
 
+/// How pixels are written: into how many destination rows at once, and whether past the caches.
+template <unsigned kRowsAtOnce, bool kPastCaches> struct Writing {
+  static constexpr bool kTwice = kRowsAtOnce == 2;
+
+  uint8* first;
+  uint8* second;  ///< if there are two
+
+  HWY_INLINE void pixel(size_t i, uint32 value) const {
+    storePixel<4>(first + 4 * i, value);
+    if constexpr (kTwice) storePixel<4>(second + 4 * i, value);
+  }
+  template <class D> HWY_INLINE void lanes(D d, size_t i, hn::Vec<D> pixels) const {
+    putLanes<kPastCaches>(d, pixels, first + 4 * i);
+    if constexpr (kTwice) putLanes<kPastCaches>(d, pixels, second + 4 * i);
+  }
+  HWY_INLINE void firstOf(size_t i, PixelVec pixels, size_t count) const {
+    storeFirst(Pixels(), pixels, count, first + 4 * i);
+    if constexpr (kTwice) storeFirst(Pixels(), pixels, count, second + 4 * i);
+  }
+};
+
+/// Calls sample(row, writing) for the source rows that are shown, until all rows are drawn.
+template <bool kPastCaches, class Sample>
+HWY_INLINE void drawShownRows(const ScaleJob& job, const Sample& sample) {
+  const intptr_t pitch = job.dstPitch;
+  forShownRows(job, [&](const uint8* row, uint8* dst, uint32 rows) HWY_ATTR {
+    for (; rows >= 2; rows -= 2, dst = rowAt(dst, pitch, 2, 0, 0))
+      sample(row, Writing<2, kPastCaches>{dst, nextRow(dst, pitch)});
+    if (rows != 0) sample(row, Writing<1, kPastCaches>{dst, dst});
+  });
+  if (kPastCaches) endStreams();
+}
+
 class Nearest {
  public:
   static size_t memoryFor(const ScaleJob& job) { return SourcePlaces::memoryFor(job); }
 
-  Nearest(const ScaleJob& job, ScaleMemory& memory)
-      : job_(job), everyOther_(everyOtherOf(job)), places_(job, 1, memory) {
-    const int64 start = job.startX + int64{job.stepX} * static_cast<int64>(everyOther_);
-    places_.forBlocks(start, blockPixels(job) - everyOther_,
-                      [&](size_t block, PixelVec at)
-                          HWY_ATTR { places_.place(everyOther_ + block, hn::ShiftRight<16>(at)); });
+  Nearest(const ScaleJob& job, ScaleMemory& memory) : job_(job), places_(job, 1, memory) {
+    places_.forBlocks(job.startX, blockPixels(job), [&](size_t block, PixelVec at) HWY_ATTR {
+      places_.place(block, hn::ShiftRight<16>(at));
+    });
   }
 
   /// `out` has room for whole vectors.
   void resample(const uint8* row, uint32* out) const {
     places_.withReader([&](const auto& read) HWY_ATTR {
-      sample<1>(read, row, reinterpret_cast<uint8*>(out), 0, blockPixels(job_));
+      auto* const pixels = reinterpret_cast<uint8*>(out);
+      sample(read, row, Writing<1, false>{pixels, pixels}, blockPixels(job_));
     });
   }
 
   /// Draws the job's rectangle, of 4-byte pixels: not a byte beyond.
-  void draw() const {
-    const intptr_t pitch = job_.dstPitch;
+  template <bool kPastCaches> void draw() const {
     places_.withReader([&](const auto& read) HWY_ATTR {
-      forShownRows(job_, [&](const uint8* row, uint8* dst, uint32 rows) HWY_ATTR {
-        for (; rows >= 2; rows -= 2, dst = rowAt(dst, pitch, 2, 0, 0))
-          sample<2>(read, row, dst, pitch, job_.width);
-        if (rows != 0) sample<1>(read, row, dst, pitch, job_.width);
-      });
+      drawShownRows<kPastCaches>(job_, [&](const uint8* row, auto writing)
+                                           HWY_ATTR { sample(read, row, writing, job_.width); });
     });
   }
 
  private:
-  /// How many of the pixels are every other one of the row, in whole vectors.
-  static size_t everyOtherOf(const ScaleJob& job) {
-    const uint32 first = job.startX >> 16;
-    const bool every = job.stepX == 2 * kOnePixel && job.srcBytesPerPixel == 4;
-    if (!every || first >= job.srcWidth) return 0;
-    return std::min(job.width, (job.srcWidth - first) / 2) / kBlock * kBlock;
-  }
-
-  /// Writes the first `count` pixels of a row into kRows rows.
-  template <unsigned kRows, class Read>
-  HWY_INLINE void sample(const Read& read, const uint8* row, uint8* out, intptr_t pitch,
+  /// Writes the first `count` pixels of a row.
+  template <class Read, class Writing>
+  HWY_INLINE void sample(const Read& read, const uint8* row, const Writing& to,
                          size_t count) const {
-    const Pixels d;
-    uint8* const second = nextRow(out, pitch);
-    const auto store = [&](PixelVec pixels, size_t i) HWY_ATTR {
-      storeLanes(d, pixels, out + 4 * i);
-      if constexpr (kRows == 2) storeLanes(d, pixels, second + 4 * i);
-    };
-    const uint8* from = row + size_t{4} * (job_.startX >> 16);
-    size_t i = 0;
-    for (; i < everyOther_; i += kBlock, from += 8 * kBlock)
-      store(inOrder<2>(d, everyOther<0>(loadLanes(d, from), loadLanes(d, from + 4 * kBlock))), i);
-    if (i == count) return;
     const auto pixels = read(row);
     const auto block = [&](size_t at)
                            HWY_ATTR { return pixels.pick(places_.base(at), places_.index(at)); };
-    for (; count - i >= kBlock; i += kBlock) store(block(i), i);
-    if (i == count) return;
-    const PixelVec rest = block(i);
-    storeFirst(d, rest, count - i, out + 4 * i);
-    if constexpr (kRows == 2) storeFirst(d, rest, count - i, second + 4 * i);
+    size_t i = 0;
+    for (; count - i >= kBlock; i += kBlock) to.lanes(Pixels(), i, block(i));
+    if (i != count) to.firstOf(i, block(i), count - i);
   }
 
   const ScaleJob& job_;
-  const size_t everyOther_;
   SourcePlaces places_;
 };
 

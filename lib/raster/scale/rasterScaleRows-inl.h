@@ -33,13 +33,13 @@ void storeRow565(uint8* dst, const uint32* row, uint32 width) {
   makeRow<2>(dst, width, [=](uint32 i) { return convertColor<Code32, Code16>(row[i]); });
 }
 
-template <unsigned kBytes>
+template <unsigned kBytes, bool /*kStreams*/>
 void mixRows(uint8* dst, const uint32* upper, const uint32* lower, MixWeights weights,
              uint32 width) {
   makeRow<kBytes>(dst, width, [=](uint32 i) { return mixPixels(upper[i], lower[i], weights); });
 }
 
-template <unsigned kBytes>
+template <unsigned kBytes, bool /*kStreams*/>
 void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width) {
   makeRow<kBytes>(dst, width, [&](uint32 i) {
     ChannelSums sums;
@@ -50,14 +50,15 @@ void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width
 
 #else
 
-/// Makes block(i) for each block of a row and stores the `width` results in pixels of kBytes.
-template <unsigned kBytes, class Block>
+/// Makes block(i) for each block of a row and stores the `width` results in pixels of kBytes, those
+/// of four bytes past the caches if kStreams.
+template <unsigned kBytes, bool kStreams, class Block>
 HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
   static_assert(kBytes == 3 || kBytes == 4);
   const Pixels d;
   size_t i = 0;
   if constexpr (kBytes == 4) {
-    for (; width - i >= kBlock; i += kBlock) storeLanes(d, block(i), dst + 4 * i);
+    for (; width - i >= kBlock; i += kBlock) putLanes<kStreams>(d, block(i), dst + 4 * i);
     if (i != width) storeFirst(d, block(i), width - i, dst + 4 * i);
   } else {
     // A whole vector is stored while its excess lies within the row, and is then overwritten.
@@ -69,7 +70,7 @@ HWY_INLINE void makeRow(uint8* dst, size_t width, const Block& block) {
 }
 
 template <unsigned kBytes> void storeRow(uint8* dst, const uint32* row, uint32 width) {
-  makeRow<kBytes>(dst, width, [=](size_t i) { return hn::LoadU(Pixels(), row + i); });
+  makeRow<kBytes, false>(dst, width, [=](size_t i) { return hn::LoadU(Pixels(), row + i); });
 }
 
 void storeRow565(uint8* dst, const uint32* row, uint32 width) {
@@ -83,20 +84,20 @@ void storeRow565(uint8* dst, const uint32* row, uint32 width) {
   for (; i < width; ++i) storePixel<2>(dst + size_t{2} * i, convertColor<Code32, Code16>(row[i]));
 }
 
-template <unsigned kBytes>
+template <unsigned kBytes, bool kStreams>
 void mixRows(uint8* dst, const uint32* upper, const uint32* lower, MixWeights weights,
              uint32 width) {
   const HalvesVec w0 = hn::Set(Halves(), static_cast<uint16>(weights.first));
   const HalvesVec w1 = hn::Set(Halves(), static_cast<uint16>(weights.second));
-  makeRow<kBytes>(dst, width, [&](size_t i) {
+  makeRow<kBytes, kStreams>(dst, width, [&](size_t i) {
     return mixLanes(hn::LoadU(Pixels(), upper + i), hn::LoadU(Pixels(), lower + i), w0, w1);
   });
 }
 
-template <unsigned kBytes>
+template <unsigned kBytes, bool kStreams>
 void averageRows(uint8* dst, const WeightedRows& rows, uint32 step, uint32 width) {
   withDivider(step, rows.count, [&](const auto& divider) {
-    makeRow<kBytes>(dst, width, [&](size_t i) {
+    makeRow<kBytes, kStreams>(dst, width, [&](size_t i) {
       LaneSums sums = noSums();
       for (uint32 r = 0; r < rows.count; ++r) {
         sums.add(hn::LoadU(Pixels(), rows.row[r] + i),
