@@ -11,6 +11,7 @@
 #include "raster.h"
 #include "reference/rasterConvReference.h"
 #include "reference/rasterScaleReference.h"
+#include "reference/rasterYuvReference.h"
 #include "reference/rasteropsReference.h"
 #include "reference/rasterpixReference.h"
 #include "support/guardedBuffer.h"
@@ -262,6 +263,45 @@ TEST(FarRectangles, AreScaled) {
   checkScaling(random, 0.5, 0, 0);
   checkScaling(random, 2, 0, 3);
   checkScaling(random, 1.5, 1, 5);
+}
+
+/// A frame of video; `shift` is what the destination lies beside a multiple of a vector.
+void checkVideo(Random& random, uint32 format, int32 depth, size_t shift) {
+  constexpr uint32 kWidth = 2048;
+  const uint32 bytes = reference::bytesOf(depth);
+  const uint32 height = static_cast<uint32>(kFar / (size_t{kWidth} * bytes) + 2) / 2 * 2;
+  const Bytes source = noise(random, size_t{2} * kWidth * height);
+  Bytes frame(size_t{kWidth} * bytes * height);
+  reference::yuvToRgb(source, frame, kWidth, height, format, depth);
+  Bytes expected(shift, 0x5A);
+  expected.insert(expected.end(), frame.begin(), frame.end());
+  expected.resize(frame.size() + 64, 0x5A);
+  GuardedBuffer actual(expected.size());
+  actual.assign(Bytes(expected.size(), 0x5A));
+  Raster_YUVtoRGB(source.data(), actual.data() + shift, kWidth, height, format, depth);
+  ASSERT_TRUE(areEqual(actual, expected)) << "depth " << depth << ", shift " << shift;
+}
+
+TEST(FarRectangles, AreConvertedFromVideo) {
+  Random random(8);
+  checkVideo(random, RASTER_VIDEO_YUY2, 16, 0);
+  checkVideo(random, RASTER_VIDEO_UYVY, 32, 0);
+  checkVideo(random, RASTER_VIDEO_YV12, 15, 0);
+  checkVideo(random, RASTER_VIDEO_YV12, 32, 0);
+  checkVideo(random, RASTER_VIDEO_YV12, 32, 4);
+}
+
+TEST(FarRectangles, AreConvertedFromVideoInPlace) {
+  constexpr uint32 kWidth = 2048;
+  constexpr uint32 kHeight = kFar / (2 * kWidth);
+  Random random(9);
+  const Bytes source = noise(random, size_t{2} * kWidth * kHeight);
+  Bytes expected(source.size());
+  reference::yuvToRgb(source, expected, kWidth, kHeight, RASTER_VIDEO_UYVY, 16);
+  GuardedBuffer actual(source.size());
+  actual.assign(source);
+  Raster_YUVtoRGB(actual.data(), actual.data(), kWidth, kHeight, RASTER_VIDEO_UYVY, 16);
+  ASSERT_TRUE(areEqual(actual, expected));
 }
 
 }  // namespace

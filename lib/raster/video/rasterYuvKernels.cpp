@@ -163,7 +163,7 @@ HWY_INLINE void convertRest(const Rows& rows, size_t group, size_t groups, uint8
   constexpr size_t kBlockBytes = 8 * P::kBytes;
   rows.padded(group, groups, [&](const Rows& copy) HWY_ATTR {
     uint8 pixels[Rows::kRows * kBlockBytes];
-    convertBlock<P>(d, copy, 0, pixels, kBlockBytes);
+    convertBlock<typename P::Near>(d, copy, 0, pixels, kBlockBytes);
     for (size_t row = 0; row < Rows::kRows; ++row)
       memcpy(dst + row * dstPitch, pixels + row * kBlockBytes, groups * 2 * P::kBytes);
   });
@@ -194,10 +194,42 @@ void convertRows(const Rows& rows, uint8* dst, size_t dstPitch, size_t groups) {
 
 #endif
 
-template <class Rows, class P> void convertFrame(const YuvFrame& frame) {
+template <class Rows, class P> void convertSets(const YuvFrame& frame) {
   for (uint32 set = 0; set < frame.rowSets; ++set)
     convertRows<Rows, P>(Rows(frame, set), frame.dst + set * frame.dstStep, frame.dstPitch,
                          frame.groups);
+}
+
+#if HWY_TARGET != HWY_SCALAR
+
+/// Whether pixels may go past the caches: where a block of them is a whole cache line. In parts of
+/// one, with as much to compute between them, that takes longer.
+template <class P> constexpr bool kStreams = kLanes<Lanes16>* P::kBytes % kCacheLine == 0;
+
+/// Whether they do: where their vectors lie at multiples of their size, and the frame is not
+/// converted in place.
+template <class Rows, class P> bool areStreamed(const YuvFrame& frame) {
+  const size_t read = frame.groups * (Rows::kRows == 2 ? 6 : 4);
+  const size_t bytes = frame.groups * 2 * P::kBytes;
+  if (!isStreamed(bytes, Rows::kRows * bytes + read, frame.rowSets)) return false;
+  const auto places = reinterpret_cast<uintptr_t>(frame.dst) | frame.dstPitch | frame.dstStep;
+  const RowSpan to(frame.dst, 0, bytes, 1);
+  return places % (2 * kLanes<Lanes16>) == 0 &&
+         (Rows::kRows == 2 || to.isApartFrom(RowSpan(frame.luma.first, 0, read, 1)));
+}
+
+#endif
+
+template <class Rows, class P> void convertFrame(const YuvFrame& frame) {
+#if HWY_TARGET != HWY_SCALAR
+  if constexpr (P::kBytes != 3 && kStreams<P>) {
+    if (areStreamed<Rows, P>(frame)) {
+      convertSets<Rows, typename P::Far>(frame);
+      return endStreams();
+    }
+  }
+#endif
+  convertSets<Rows, P>(frame);
 }
 
 using Yuy2 = PackedRows<true>;

@@ -21,6 +21,7 @@
 
 #include "vector/fields-inl.h"
 #include "vector/rows-inl.h"
+#include "vector/streams-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace raster::HWY_NAMESPACE {
@@ -131,9 +132,12 @@ template <class D> constexpr size_t kQuads = kLanes<D> * sizeof(hn::TFromD<D>) /
 
 #endif
 
-/// What three colour channels become in memory: pixels of a format, lowest byte first.
-template <class Format> struct Packing {
+/// What three colour channels become in memory: pixels of a format, lowest byte first. With
+/// kPastCaches vectors of them go past the caches, to addresses that are multiples of their size.
+template <class Format, bool kPastCaches = false> struct Packing {
   static constexpr unsigned kBytes = Format::kBytes;
+  using Near = Packing<Format>;
+  using Far = Packing<Format, true>;
   using Red = typename Format::Red;
   using Green = typename Format::Green;
   using Blue = typename Format::Blue;
@@ -163,7 +167,7 @@ template <class Format> struct Packing {
   /// Stores the pixels of a vector.
   template <class D> static HWY_INLINE void store(D d, const Sums<D>& sums, uint8* dst) {
     if constexpr (kBytes == 2) {
-      storeLanes(hn::RebindToUnsigned<D>(), packWords(d, sums), dst);
+      putLanes<kPastCaches>(hn::RebindToUnsigned<D>(), packWords(d, sums), dst);
     } else if constexpr (kBytes == 3) {
       storeTriples(d, toBytes<false>(d, sums), dst);
     } else {
@@ -255,8 +259,8 @@ template <class Format> struct Packing {
     const hn::RebindToUnsigned<D> du;
     const auto bg = hn::BitCast(du, hn::InterleaveLower(bytes.blueRed, bytes.green));
     const auto r = hn::BitCast(du, hn::InterleaveUpper(d8, bytes.blueRed, bytes.green));
-    storeLanes(du, hn::InterleaveLower(bg, r), dst);
-    storeLanes(du, hn::InterleaveUpper(du, bg, r), dst + hn::Lanes(d8));
+    putLanes<kPastCaches>(du, hn::InterleaveLower(bg, r), dst);
+    putLanes<kPastCaches>(du, hn::InterleaveUpper(du, bg, r), dst + hn::Lanes(d8));
   }
 
 #endif
