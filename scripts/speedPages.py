@@ -62,25 +62,25 @@ def not_behind(level):
     return [row for row in with_peer(level) if row.of_peer() >= LEVEL_WITH]
 
 
-def reasons():
-    """The lines of docs/speed/reasons.txt: patterns of level, job and size, and the words."""
+def reasons(name):
+    """The lines of a file of docs/speed: patterns of level, job and size, and the words."""
     known = []
-    for line in (DATA.parent / "reasons.txt").read_text(encoding="utf-8").splitlines():
+    for line in (DATA.parent / name).read_text(encoding="utf-8").splitlines():
         if line and not line.startswith("#"):
             where, words = line.split(": ", 1)
             known.append((where.split(), words))
     return known
 
 
-def reason(behind, known):
+def reason(rows_behind, known):
     """The words for a job at a size that is behind at some levels."""
     found = {}
-    for row in behind:
+    for row in rows_behind:
         words = next((words for patterns, words in known
                       if all(map(fnmatchcase, (row.level, row.job, row.size), patterns))), None)
         if words:
             found.setdefault(words, []).append(row.level)
-    return "; ".join(words if len(at) == len(behind) else f"{', '.join(at)}: {words}"
+    return "; ".join(words if len(at) == len(rows_behind) else f"{', '.join(at)}: {words}"
                      for words, at in found.items()) or "not profiled"
 
 
@@ -99,17 +99,24 @@ def summary():
     return table(["level", "rows with a peer", "ahead", "level (3 %)", "behind", "median ratio"], body, 1)
 
 
-def lost():
-    behind = {}
+def table_of_behind(behind, least, known, words=lambda row: ""):
+    """The jobs and sizes that are below `least` at some level, the worst first, with the reasons: `behind` gives
+    pairs of a ratio and a row for a level, `words` what stands beside a ratio."""
+    found = {}
     for level in levels:
-        for row in with_peer(level):
-            if row.of_peer() < LEVEL_WITH:
-                behind.setdefault((row.job, row.size), {})[level] = row
-    known = reasons()
-    worst = lambda item: min(row.of_peer() for row in item[1].values())
-    body = [[job, size, *(f"{ratio(at[level].of_peer())} {peer_of(at[level])}" if level in at else "" for level in levels),
-             reason(at.values(), known)] for (job, size), at in sorted(behind.items(), key=worst)]
+        for value, row in behind(level):
+            if value < least:
+                found.setdefault((row.job, row.size), {})[level] = value, row
+    cell = lambda at, level: f"{ratio(at[level][0])} {words(at[level][1])}".strip() if level in at else ""
+    worst = lambda item: min(value for value, _ in item[1].values())
+    body = [[job, size, *(cell(at, level) for level in levels), reason([row for _, row in at.values()], known)]
+            for (job, size), at in sorted(found.items(), key=worst)]
     return table(["job", "size", *levels, "why"], body, 3 + len(levels)) if body else "None."
+
+
+def lost():
+    return table_of_behind(lambda level: [(row.of_peer(), row) for row in with_peer(level)], LEVEL_WITH,
+                           reasons("reasons.txt"), peer_of)
 
 
 def picture(name, words):
@@ -154,19 +161,47 @@ def scalar():
     return ahead + ("\n\n" + table(["blend", "size", "Mpx/s", "of limit", "of pixman"], worst, 2) if worst else "")
 
 
+NARROW = .8  # below this part of the 64-bit rate a row of the 32-bit build wants a reason
+SMALL = ("16x16", "4x4", "1x1")
+
+
+def narrow_pairs(level):
+    """The parts of the 64-bit rates that the rows of the 32-bit build reach."""
+    wide = {(row.job, row.size): row for row in of(level)}
+    return [(wide[row.job, row.size].ours / row.ours, row) for row in of(level, 32)
+            if row.ours and (row.job, row.size) in wide and wide[row.job, row.size].ours]
+
+
 def narrow():
     """The 32-bit build beside the 64-bit one."""
     body = []
     for level in levels:
-        wide = {(row.job, row.size): row for row in of(level)}
-        pairs = [(wide[row.job, row.size].ours / row.ours, row) for row in of(level, 32)
-                 if row.ours and wide.get((row.job, row.size)) and wide[row.job, row.size].ours]
+        pairs = narrow_pairs(level)
         if not pairs:
             continue
-        low = [pair for pair in pairs if pair[0] < .8]
+        low = [pair for pair in pairs if pair[0] < NARROW]
         body.append([level, str(len(pairs)), ratio(statistics.median(p[0] for p in pairs)), str(len(low)),
-                     str(sum(row.size not in ("16x16", "4x4") for _, row in low))])
-    return table(["level", "rows", "median of 32-bit / 64-bit", "below 0.8", "of these above 16x16"], body, 1)
+                     str(sum(row.size not in SMALL for _, row in low))])
+    return table(["level", "rows", "median of 32-bit / 64-bit", f"below {NARROW}", "of these above 16x16"], body, 1)
+
+
+def narrow_low():
+    return table_of_behind(lambda level: [pair for pair in narrow_pairs(level) if pair[1].size not in SMALL], NARROW,
+                           reasons("reasons32.txt"))
+
+
+def narrow_calls():
+    """How much more calls take in the 32-bit build."""
+    more = {}
+    for row in rows.values():
+        wide = rows.get((best, 64, row.job, row.size))
+        if row.job.startswith("call/") and (row.level, row.bits) == (best, 32) and wide:
+            more.setdefault(row.size, []).append(row.ours - wide.ours)
+    if "0x0" not in more:
+        return NOT_MEASURED
+    middle = {size: f"{statistics.median(times):.0f}" for size, times in more.items()}
+    return (f"At {best} an empty call takes {min(more['0x0']):.0f} to {max(more['0x0']):.0f} ns longer than in 64-bit "
+            f"(median {middle['0x0']}), one of\n4x4 {middle['4x4']} and one of 16x16 {middle['16x16']}.")
 
 
 def checked():
@@ -256,7 +291,8 @@ def replace(path, parts):
 replace(ROOT / "README.md", {"figures": readme})
 replace(ROOT / "docs/speed.md", {
     "machine": machine, "summary": summary, "families": families, "lost": lost, "growth": growth,
-    "calls": calls, "checked": checked, "scalar": scalar, "narrow": narrow})
+    "calls": calls, "checked": checked, "scalar": scalar, "narrow": narrow,
+    "narrow-low": narrow_low, "narrow-calls": narrow_calls})
 for page in DETAIL:
     file = DATA.parent / f"{page}.md"
     if page in levels:
