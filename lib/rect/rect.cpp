@@ -61,7 +61,13 @@ bool Rect_TranslateInv(Rect* out, const Rect* r, const Point* offset) {
 
 bool Rect_Intersect(Rect* out, const Rect* a, const Rect* b) {
   const Rect common = raster::intersection(*a, *b);
-  if (out != nullptr) *out = common;
+  if (out != nullptr) {
+    // Field by field: as a whole it would be put together in two registers first.
+    out->left = common.left;
+    out->top = common.top;
+    out->right = common.right;
+    out->bottom = common.bottom;
+  }
   return !raster::isEmpty(common);
 }
 
