@@ -71,8 +71,8 @@ class Contenders {
   }
 
  private:
-  /// A run of a large job takes long, and its times differ little.
-  static constexpr int kLargeRepetitions = 2;
+  /// A run of a large job takes long; but its times differ by a quarter, as memory is shared.
+  static constexpr int kLargeRepetitions = 5;
 
   static void remember(const std::string& prefix, const std::string& contender, double units);
   static void fillLargeBuffers();
