@@ -36,9 +36,16 @@ def ratio(value):
     return f"{value:.2f}" if value is not None else "-"
 
 
+def is_unheld(row):
+    """Whether the best peer could not be held to the row's level: docs/speed.md says why."""
+    peer = row.peer()
+    copies = peer == "OpenCV" and row.job.startswith("copy/") or peer == "swscale" and row.job == "convert/32-to-32"
+    return row.level == "sse4" and peer.startswith("Qt") or row.level in ("sse4", "avx2") and copies
+
+
 def peer_of(row):
     """The best peer's name, with a plus where it could not be held to the row's level."""
-    return row.peer() + ("+" if row.level == "sse4" and row.peer().startswith("Qt") else "")
+    return row.peer() + ("+" if is_unheld(row) else "")
 
 
 def table(head, body, right=0):
