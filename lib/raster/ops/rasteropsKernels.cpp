@@ -156,10 +156,13 @@ void moveRow(uint8* dst, const uint8* src, size_t bytes) {
 }
 
 // Rows up to here are moved by moveRow, which is faster than the C library's memmove for them: in
-// the nearest cache, and on 32-bit x86, for which few are written, in the next one too.
-constexpr size_t kMaxOwnBytes = sizeof(void*) == 4 ? 256 * 1024 : 16 * 1024;
+// the nearest cache, and on 32-bit x86, for which few are written, in the next one too, or anywhere
+// where vectors are longer than those few use.
+constexpr size_t kMaxOwnBytes = sizeof(void*) == 8       ? 16 * 1024
+                                : HWY_TARGET <= HWY_AVX2 ? SIZE_MAX
+                                                         : 256 * 1024;
 // The C library may know longer vectors; but it is slow with long rows from right to left.
-constexpr size_t kMaxOwnCopied = kHasShortVectors && sizeof(void*) != 4 ? 128 : kMaxOwnBytes;
+constexpr size_t kMaxOwnCopied = kHasShortVectors && sizeof(void*) == 8 ? 128 : kMaxOwnBytes;
 
 /// Whether no row shares bytes with any row of the source.
 bool areApart(const RowPair& rows) {
