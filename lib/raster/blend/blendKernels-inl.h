@@ -149,11 +149,6 @@ HWY_INLINE void blendEnd(const BlendRect& rect, Block at, size_t pixels) {
   copyBytes(at.dst, destination, bytes);
 }
 
-#else
-
-template <class Format, auto kOperator, uint32 kFlags>
-HWY_INLINE void blendEnd(const BlendRect& /*rect*/, Block /*at*/, size_t /*pixels*/) {}
-
 #endif
 
 /// How many source pixels are looked at at once, whether they are all clear: sprites are clear in
@@ -202,8 +197,10 @@ template <class Format, auto kOperator, uint32 kFlags> void blendRect(const Blen
   const size_t whole = (rect.width - (Format::kKeepsBytes ? 1 : 0)) / kBlock * kBlock;
   for (uint32 y = 0; y < rect.height; ++y) {
     blendBlocks<Format, kOperator, kFlags>(rect, row, whole);
+#if HWY_TARGET != HWY_SCALAR
     if (whole != rect.width)
       blendEnd<Format, kOperator, kFlags>(rect, row.pixel<Format>(whole), rect.width - whole);
+#endif
     // The steps come from memory: 32-bit x86 has no registers left for them.
     uint8* const dst = nextRow(row.dst, call.dstStep);
     row = {dst, kReadsApart ? nextRow(row.before, call.beforeStep) : dst,

@@ -64,11 +64,9 @@ HWY_INLINE void copyRow(uint8* dst, const uint8* src, size_t bytes) {
   }
 }
 
-/// Stores the first lanes, at least one of them.
+/// Stores the first lanes: at least one of them, and not all.
 template <class D> HWY_INLINE void storeFirst(D d, hn::Vec<D> pixels, size_t count, uint8* at) {
-  if (count >= kLanes<D>) {
-    storeLanes(d, pixels, at);
-  } else if constexpr (HWY_TARGET == HWY_AVX3 && kLanes<D> == kBlock) {
+  if constexpr (HWY_TARGET == HWY_AVX3 && kLanes<D> == kBlock) {
     void* to = at;
     hn::BlendedStore(pixels, hn::FirstN(d, count), d, static_cast<uint32*>(to));
   } else if constexpr (kHasHalf<D>) {
