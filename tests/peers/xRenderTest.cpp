@@ -77,7 +77,7 @@ xcb_render_pictformat_t formatId(const Format& f) {
 class Picture {
  public:
   Picture(const Format& format, const Bytes& pixels)
-      : format_(format), pixmap_(xcb_generate_id(x())), id_(xcb_generate_id(x())) {
+      : pixmap_(xcb_generate_id(x())), id_(xcb_generate_id(x())) {
     xcb_create_pixmap(x(), format.depth, pixmap_, tests::theXServer().screen().root, kWidth,
                       kHeight);
     const xcb_gcontext_t gc = xcb_generate_id(x());
@@ -110,7 +110,6 @@ class Picture {
   }
 
  private:
-  Format format_;
   xcb_pixmap_t pixmap_;
   xcb_render_picture_t id_;
 };
