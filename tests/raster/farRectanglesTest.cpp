@@ -266,20 +266,20 @@ TEST(FarRectangles, AreScaled) {
 }
 
 /// A frame of video; `shift` is what the destination lies beside a multiple of a vector.
-void checkVideo(Random& random, uint32 format, int32 depth, size_t shift) {
-  constexpr uint32 kWidth = 2048;
+void checkVideo(Random& random, uint32 format, int32 depth, size_t shift, uint32 width = 2048) {
   const uint32 bytes = reference::bytesOf(depth);
-  const uint32 height = static_cast<uint32>(kFar / (size_t{kWidth} * bytes) + 2) / 2 * 2;
-  const Bytes source = noise(random, size_t{2} * kWidth * height);
-  Bytes frame(size_t{kWidth} * bytes * height);
-  reference::yuvToRgb(source, frame, kWidth, height, format, depth);
+  const uint32 height = static_cast<uint32>(kFar / (size_t{width} * bytes) + 2) / 2 * 2;
+  const Bytes source = noise(random, size_t{2} * width * height);
+  Bytes frame(size_t{width} * bytes * height);
+  reference::yuvToRgb(source, frame, width, height, format, depth);
   Bytes expected(shift, 0x5A);
   expected.insert(expected.end(), frame.begin(), frame.end());
   expected.resize(frame.size() + 64, 0x5A);
   GuardedBuffer actual(expected.size());
   actual.assign(Bytes(expected.size(), 0x5A));
-  Raster_YUVtoRGB(source.data(), actual.data() + shift, kWidth, height, format, depth);
-  ASSERT_TRUE(areEqual(actual, expected)) << "depth " << depth << ", shift " << shift;
+  Raster_YUVtoRGB(source.data(), actual.data() + shift, width, height, format, depth);
+  ASSERT_TRUE(areEqual(actual, expected))
+      << width << " wide, depth " << depth << ", shift " << shift;
 }
 
 TEST(FarRectangles, AreConvertedFromVideo) {
@@ -289,6 +289,8 @@ TEST(FarRectangles, AreConvertedFromVideo) {
   checkVideo(random, RASTER_VIDEO_YV12, 15, 0);
   checkVideo(random, RASTER_VIDEO_YV12, 32, 0);
   checkVideo(random, RASTER_VIDEO_YV12, 32, 4);
+  checkVideo(random, RASTER_VIDEO_YUY2, 32, 0, 2064);  // rows that do not end with a vector
+  checkVideo(random, RASTER_VIDEO_YV12, 16, 0, 2080);
 }
 
 TEST(FarRectangles, AreConvertedFromVideoInPlace) {
