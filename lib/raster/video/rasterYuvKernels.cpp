@@ -218,15 +218,24 @@ template <class Rows, class P> bool areStreamed(const YuvFrame& frame) {
          (Rows::kRows == 2 || to.isApartFrom(RowSpan(frame.luma.first, 0, read, 1)));
 }
 
+/// Converts a frame past the caches, where that is right; says whether. A function of its own:
+/// small frames are done before the registers that it needs would be saved.
+template <class Rows, class P> HWY_NOINLINE bool streamFrame(const YuvFrame& frame) {
+  if (!areStreamed<Rows, P>(frame)) return false;
+  convertSets<Rows, typename P::Far>(frame);
+  endStreams();
+  return true;
+}
+
 #endif
 
 template <class Rows, class P> void convertFrame(const YuvFrame& frame) {
 #if HWY_TARGET != HWY_SCALAR
   if constexpr (P::kBytes != 3 && kStreams<P>) {
-    if (areStreamed<Rows, P>(frame)) {
-      convertSets<Rows, typename P::Far>(frame);
-      return endStreams();
-    }
+    constexpr uint64 kMostBytesOfGroup = 32;  // read and written
+    const uint64 groups = uint64{frame.groups} * frame.rowSets;
+    if (HWY_UNLIKELY(groups > kLeastCacheBytes / kMostBytesOfGroup) && streamFrame<Rows, P>(frame))
+      return;
   }
 #endif
   convertSets<Rows, P>(frame);
