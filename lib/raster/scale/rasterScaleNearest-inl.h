@@ -28,12 +28,18 @@ namespace {
 template <class Body> HWY_INLINE void forShownRows(const ScaleJob& job, const Body& body) {
   uint32 y = job.startY;
   uint8* dst = job.dst;
-  for (uint32 left = job.height, rows = 1; left != 0; left -= rows) {
-    const uint32 row = job.rowOf(y);
-    y += job.stepY;
-    for (rows = 1; rows != left && job.rowOf(y) == row; ++rows) y += job.stepY;
+  uint32 next = job.rowOf(y);
+  for (uint32 left = job.height; left != 0;) {
+    const uint32 row = next;
+    uint32 rows = 0;
+    do {
+      y += job.stepY;
+      next = job.rowOf(y);
+      ++rows;
+    } while (rows != left && next == row);
     body(job.srcRow(row), dst, rows);
     dst = rowAt(dst, job.dstPitch, rows, 0, 0);
+    left -= rows;
   }
 }
 

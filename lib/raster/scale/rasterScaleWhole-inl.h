@@ -23,7 +23,7 @@ namespace {
 
 #if HWY_TARGET != HWY_SCALAR
 
-/// The rows of one square of kSide x kSide source pixels.
+/// The rows of squares of kSide x kSide source pixels.
 template <unsigned kSide> using SquareRows = const uint8* [kSide];
 
 /// Sums of neighbouring bytes, and of neighbouring 16-bit lanes. Highway names the first one only
@@ -185,38 +185,64 @@ template <unsigned kSide, unsigned kBytes> class WholeSteps {
   }
 
   void draw() const {
-    uint32 y = job_.startY;
-    uint8* dst = job_.dst;
-    for (uint32 i = 0; i < job_.height; ++i, y += kStep, dst = nextRow(dst, job_.dstPitch)) {
-      SquareRows<kSide> rows;
-      for (uint32 r = 0; r < kSide; ++r) rows[r] = job_.srcRow(job_.rowOf(y + r * kOnePixel));
-      drawSquares(rows, dst);
-      drawEdge(rows, dst);
+    for (Band band{0, 0}; band.first < job_.height; band.first += band.count) {
+      band.count = std::clamp(wholeRowsFrom(positionOf(band)), 1u, job_.height - band.first);
+      drawSquares(band);
+      if (squares_ != job_.width)
+        forRows(band, [this](const auto& rows, uint8* dst) { drawEdge(rows, dst); });
     }
   }
 
  private:
   static constexpr uint32 kStep = kSide * kOnePixel;
 
-  void drawSquares(const SquareRows<kSide>& rows, uint8* dst) const {
+  /// Destination rows whose source rows follow one another.
+  struct Band {
+    uint32 first;
+    uint32 count;
+  };
+
+  uint32 positionOf(const Band& band) const { return job_.startY + band.first * kStep; }
+
+  /// The number of rows of squares from a vertical position on that lie within the source.
+  uint32 wholeRowsFrom(uint32 y) const {
+    const uint32 row = y >> 16;
+    return row < job_.srcHeight ? (job_.srcHeight - row) / kSide : 0;
+  }
+
+  /// Runs draw(rows, dst) for every row of a band.
+  template <class Draw> HWY_INLINE void forRows(const Band& band, const Draw& draw) const {
+    const uint32 y = positionOf(band);
+    const intptr_t srcPitch = job_.srcPitch, dstPitch = job_.dstPitch;
+    SquareRows<kSide> rows;
+    for (uint32 r = 0; r < kSide; ++r) rows[r] = job_.srcRow(job_.rowOf(y + r * kOnePixel));
+    uint8* dst = rowAt(job_.dst, dstPitch, band.first, 0, 0);
+    for (uint32 left = band.count; left != 0; --left, dst = nextRow(dst, dstPitch)) {
+      draw(rows, dst);
+      for (const uint8*& row : rows) row = rowAt(row, srcPitch, kSide, 0, 0);
+    }
+  }
+
+  void drawSquares(const Band& band) const {
     const Run run = {job_.startX >> 16, job_.srcWidth - 1, squares_};
     if constexpr (kBytes == 3) {
-      averageRun24<kSide>(rows, run, dst);
+      forRows(band,
+              [&](const auto& rows, uint8* dst) HWY_ATTR { averageRun24<kSide>(rows, run, dst); });
     } else {
-      averageRunOf(Pixels(), rows, run, dst);
+      averageRunOf(Pixels(), band, run);
     }
   }
   /// Takes vectors as wide as the run.
-  template <class D>
-  HWY_INLINE static void averageRunOf(D d, const SquareRows<kSide>& rows, const Run& run,
-                                      uint8* dst) {
+  template <class D> HWY_INLINE void averageRunOf(D d, const Band& band, const Run& run) const {
     if (run.count >= hn::Lanes(d)) {
-      averageRun<kSide>(d, rows, run, dst);
+      forRows(band,
+              [&](const auto& rows, uint8* dst) HWY_ATTR { averageRun<kSide>(d, rows, run, dst); });
     } else if constexpr (kLanes<D> > 4) {
-      averageRunOf(hn::Half<D>(), rows, run, dst);
+      averageRunOf(hn::Half<D>(), band, run);
 #if HWY_TARGET <= HWY_AVX2
     } else if (run.count != 0) {
-      averageFew<kSide>(d, rows, run, dst);
+      forRows(band,
+              [&](const auto& rows, uint8* dst) HWY_ATTR { averageFew<kSide>(d, rows, run, dst); });
 #endif
     }
   }
