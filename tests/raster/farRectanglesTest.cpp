@@ -6,7 +6,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <string>
 
 #include "raster.h"
 #include "reference/rasterConvReference.h"
@@ -14,76 +13,38 @@
 #include "reference/rasterYuvReference.h"
 #include "reference/rasteropsReference.h"
 #include "reference/rasterpixReference.h"
+#include "support/bigRows.h"
 #include "support/guardedBuffer.h"
 #include "support/random.h"
 
 namespace {
 
 using reference::Bytes;
+using tests::areEqual;
+using tests::BigRows;
 using tests::GuardedBuffer;
+using tests::noise;
 using tests::Random;
 
 /// What a call must read and write to be far: at least what is taken for the largest cache.
 constexpr size_t kFar = size_t{33} << 20;
 
-/// A destination that lies anywhere, with gaps between its rows or without.
-struct FarRows {
-  size_t base;
-  uint32 bytesPerPixel;
-  uint32 pitch;
-  uint32 width;
-  uint32 height;
-
-  size_t end() const { return base + size_t{pitch} * (height - 1) + size_t{width} * bytesPerPixel; }
-};
-
 /// Rows for which `touched` bytes a pixel are read and written.
-FarRows someFarRows(Random& random, uint32 bytesPerPixel, uint32 touched) {
-  FarRows rows{};
-  const uint32 gap = random.below(2) * bytesPerPixel * (1 + random.below(7));
-  rows.base = size_t{random.below(64)} * bytesPerPixel;
-  rows.bytesPerPixel = bytesPerPixel;
-  rows.width = 2048 + random.below(3000);
-  rows.pitch = rows.width * bytesPerPixel + gap;
-  rows.height = static_cast<uint32>(kFar / (size_t{rows.width} * touched)) + 1;
-  return rows;
-}
-
-std::string describe(const FarRows& r) {
-  return "base " + std::to_string(r.base) + " pitch " + std::to_string(r.pitch) + " size " +
-         std::to_string(r.width) + "x" + std::to_string(r.height) + " bytes " +
-         std::to_string(r.bytesPerPixel);
-}
-
-/// Noise that is made fast.
-Bytes noise(Random& random, size_t size) {
-  Bytes bytes = random.bytes(65521);
-  bytes.reserve(size + bytes.size());
-  while (bytes.size() < size) bytes.insert(bytes.end(), bytes.begin(), bytes.begin() + 65521);
-  bytes.resize(size);
-  return bytes;
-}
-
-/// Whether two buffers are equal; tells where they are not, in place of all their bytes.
-testing::AssertionResult areEqual(const GuardedBuffer& actual, const Bytes& expected) {
-  for (size_t i = 0; i < expected.size(); ++i) {
-    if (actual.data()[i] != expected[i])
-      return testing::AssertionFailure() << "byte " << i << " of " << expected.size() << " differs";
-  }
-  return testing::AssertionSuccess();
+BigRows someFarRows(Random& random, uint32 bytesPerPixel, uint32 touched) {
+  return tests::someBigRows(random, bytesPerPixel, 2048 + random.below(3000), kFar / touched);
 }
 
 TEST(FarRectangles, AreFilled) {
   Random random(1);
   for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
-    const FarRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
+    const BigRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
     const uint32 pixel = random.word();
     Bytes expected(r.end(), 0x5A);
     GuardedBuffer actual(expected.size());
     actual.assign(expected);
     reference::rectFill(expected, r.base, r.pitch, bytesPerPixel, pixel, 0, 0, r.width, r.height);
     Raster_RectFill(actual.data() + r.base, r.pitch, bytesPerPixel, pixel, 0, 0, r.width, r.height);
-    ASSERT_TRUE(areEqual(actual, expected)) << describe(r);
+    ASSERT_TRUE(areEqual(actual, expected)) << r;
   }
 }
 
@@ -130,7 +91,7 @@ TEST(FarRectangles, AreCopiedBetweenAnyAddresses) {
 TEST(FarRectangles, AreCopied) {
   Random random(2);
   for (uint32 bytesPerPixel = 1; bytesPerPixel <= 4; ++bytesPerPixel) {
-    const FarRows r = someFarRows(random, bytesPerPixel, 2 * bytesPerPixel);
+    const BigRows r = someFarRows(random, bytesPerPixel, 2 * bytesPerPixel);
     const Bytes source = noise(random, r.end());
     Bytes expected(r.end(), 0x5A);
     GuardedBuffer actual(expected.size());
@@ -141,7 +102,7 @@ TEST(FarRectangles, AreCopied) {
                   expected.begin() + static_cast<ptrdiff_t>(r.base + at));
     Raster_RectCopy(actual.data() + r.base, r.pitch, source.data(), r.pitch, bytesPerPixel, 0, 0, 0,
                     0, r.width, r.height);
-    ASSERT_TRUE(areEqual(actual, expected)) << describe(r);
+    ASSERT_TRUE(areEqual(actual, expected)) << r;
   }
 }
 
@@ -167,7 +128,7 @@ TEST(FarRectangles, AreMovedWhereTheyOverlap) {
 }
 
 void checkTiling(Random& random, uint32 bytesPerPixel, uint32 rop) {
-  const FarRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
+  const BigRows r = someFarRows(random, bytesPerPixel, bytesPerPixel);
   const uint32 tileWidth = 1 + random.below(100);
   const uint32 tileHeight = 1 + random.below(20);
   const uint32 tilePitch = tileWidth * bytesPerPixel;
@@ -181,7 +142,7 @@ void checkTiling(Random& random, uint32 bytesPerPixel, uint32 rop) {
   Raster_RectPixmapROPcopy(actual.data() + r.base, r.pitch, actual.data() + r.end(), tilePitch,
                            static_cast<int32>(bytesPerPixel), 3, 5, tileWidth, tileHeight, rop, 0,
                            0, r.width, r.height);
-  ASSERT_TRUE(areEqual(actual, expected)) << describe(r) << " operation " << rop;
+  ASSERT_TRUE(areEqual(actual, expected)) << r << " operation " << rop;
 }
 
 TEST(FarRectangles, AreTiled) {
@@ -193,7 +154,7 @@ TEST(FarRectangles, AreTiled) {
 /// `shift` is what the destination lies beside a multiple of its pixel size.
 void checkConversion(Random& random, int32 srcDepth, int32 dstDepth, size_t shift) {
   const auto bytesOf = [](int32 depth) { return static_cast<uint32>(depth + 7) / 8; };
-  FarRows r = someFarRows(random, bytesOf(dstDepth), bytesOf(srcDepth) + bytesOf(dstDepth));
+  BigRows r = someFarRows(random, bytesOf(dstDepth), bytesOf(srcDepth) + bytesOf(dstDepth));
   r.base += shift;
   const uint32 srcPitch = r.width * bytesOf(srcDepth);
   const Bytes source = noise(random, size_t{srcPitch} * r.height);
@@ -205,7 +166,7 @@ void checkConversion(Random& random, int32 srcDepth, int32 dstDepth, size_t shif
                            srcDepth, false, {}, r.width, r.height);
   Raster_ConvertPixels(actual.data() + r.base, r.pitch, dstDepth, source.data(), srcPitch, srcDepth,
                        false, nullptr, 0, 0, 0, 0, r.width, r.height);
-  ASSERT_TRUE(areEqual(actual, expected)) << srcDepth << " to " << dstDepth << ": " << describe(r);
+  ASSERT_TRUE(areEqual(actual, expected)) << srcDepth << " to " << dstDepth << ": " << r;
 }
 
 TEST(FarRectangles, AreConverted) {
