@@ -144,7 +144,7 @@ struct Size {
 /// The crop along one axis. `size` is below 2^31.
 RasterStatus resolveEdge(uint32 size, int32 nearEdge, int32 farEdge, uint32* crop) {
   const int64 end = farEdge == kNotGiven ? size : int64{farEdge};
-  if (nearEdge < 0 || end > size || nearEdge > end || end < 0) return RASTER_STATUS_OUTSIDE;
+  if (nearEdge < 0 || end > size || nearEdge > end) return RASTER_STATUS_OUTSIDE;
   *crop = static_cast<uint32>(end - nearEdge);
   return *crop != 0 ? RASTER_STATUS_OK : RASTER_STATUS_BAD_ARGUMENT;
 }

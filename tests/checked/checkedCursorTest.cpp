@@ -190,6 +190,7 @@ TEST(RasterChecked_ExpandCursor, RefusesSizesThatWrap) {
   EXPECT_EQ(statusOf(0x10000000, 1, 32, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(statusOf(0x10000, 0x10000, 32, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(statusOf(0x80000000, 0, 8, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
+  EXPECT_EQ(statusOf(0, 0x80000000, 8, bytes, bytes, dst), RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(statusOf(1, 1, 32, bytes, dst, dst), RASTER_STATUS_OVERLAP);
   EXPECT_EQ(statusOf(1, 1, 32, nullptr, bytes, dst), RASTER_STATUS_NULL);
   EXPECT_EQ(statusOf(1, 1, 32, bytes, bytes, nullptr), RASTER_STATUS_NULL);
@@ -275,6 +276,9 @@ TEST(RasterChecked_ScaledCursorSize, RefusesWhatCannotBeScaled) {
             RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(RasterChecked_ScaledCursorSize(20000, 20000, 0, 0, 1, 1, nullptr, &size),
             RASTER_STATUS_LIMIT);
+  const RasterLimits fewPixels = {100, 100, 64, 0, 0, 0};
+  EXPECT_EQ(RasterChecked_ScaledCursorSize(20, 20, 0, 0, 1, 1, &fewPixels, &size),
+            RASTER_STATUS_LIMIT);
   EXPECT_EQ(RasterChecked_ScaledCursorSize(2, 2, 0, 0, 1, 1, nullptr, nullptr), RASTER_STATUS_NULL);
   EXPECT_EQ(size.width, 77u);
 }
@@ -287,10 +291,18 @@ TEST(RasterChecked_ScaleCursor, RefusesOtherFormatsAndOverlap) {
   EXPECT_EQ(RasterChecked_ScaleCursor(&small.cursor, small.bytes, 1, 1, nullptr, dst.data(),
                                       dst.size(), nullptr),
             RASTER_STATUS_BAD_FORMAT);
+  const auto statusAt = [&](const OwnCursor& from, uint8* to) {
+    return RasterChecked_ScaleCursor(&from.cursor, from.bytes, 1, 1, nullptr, to, dst.size(),
+                                     nullptr);
+  };
+  EXPECT_EQ(statusAt(own, nullptr), RASTER_STATUS_NULL);
+  EXPECT_EQ(statusAt(own, dst.data()), RASTER_STATUS_OK);
   own.cursor.pixels = dst.data();
-  EXPECT_EQ(RasterChecked_ScaleCursor(&own.cursor, own.bytes, 1, 1, nullptr, dst.data(), dst.size(),
-                                      nullptr),
-            RASTER_STATUS_OVERLAP);
+  EXPECT_EQ(statusAt(own, dst.data()), RASTER_STATUS_OVERLAP);
+  OwnCursor mask(random, true, {24, 32}, 8, 8);
+  EXPECT_EQ(statusAt(mask, dst.data()), RASTER_STATUS_OK);
+  mask.cursor.xorMask = dst.data();
+  EXPECT_EQ(statusAt(mask, dst.data()), RASTER_STATUS_OVERLAP);
 }
 
 }  // namespace

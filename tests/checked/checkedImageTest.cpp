@@ -283,6 +283,11 @@ TEST(RasterChecked_CropAndScale, NamesWhatIsWrong) {
   EXPECT_EQ(
       RasterChecked_CropAndScale(&image, view.view().bytes, 0, 0, 5, 5, 32768, 1, &large, &result),
       RASTER_STATUS_TOO_BIG);
+  const GuardedView wide(random, {24, 24}, 40000, 1);
+  const ImageUtilImage wideImage = imageOf(random, wide.view());
+  EXPECT_EQ(RasterChecked_CropAndScale(&wideImage, wide.view().bytes, 0, 0, -1, -1, 5, 1, &large,
+                                       &result),
+            RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(RasterChecked_CropAndScale(nullptr, 0, 0, 0, 5, 5, 5, 5, nullptr, &result),
             RASTER_STATUS_NULL);
   EXPECT_EQ(RasterChecked_CropAndScale(&image, 0, 0, 0, 5, 5, 5, 5, nullptr, nullptr),

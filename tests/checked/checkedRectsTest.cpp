@@ -455,6 +455,22 @@ TEST(RasterChecked_CompareRects, LooksAtSixteenEntriesAtMost) {
   EXPECT_EQ(RasterChecked_CompareRects(&a, &b, list, 0, &difference), RASTER_STATUS_OK);
 }
 
+TEST(RasterChecked_CompareRects, RefusesNullAndUnknownFlags) {
+  Random random(30);
+  const GuardedView a(random, {24, 24}, 8, 8);
+  const GuardedView other(random, {16, 16}, 8, 8);
+  const RectList list = {{{0, 0, 8, 8}}};
+  int32 difference = 77;
+  EXPECT_EQ(RasterChecked_CompareRects(&a, &a, &list, 0, nullptr), RASTER_STATUS_NULL);
+  EXPECT_EQ(RasterChecked_CompareRects(&a, &a, nullptr, 0, &difference), RASTER_STATUS_NULL);
+  EXPECT_EQ(RasterChecked_CompareRects(nullptr, &a, &list, 0, &difference), RASTER_STATUS_NULL);
+  EXPECT_EQ(RasterChecked_CompareRects(&a, &a, &list, ~RASTER_CHECKED_CLIP, &difference),
+            RASTER_STATUS_BAD_ARGUMENT);
+  EXPECT_EQ(RasterChecked_CompareRects(&a, &other, &list, 0, &difference),
+            RASTER_STATUS_BAD_FORMAT);
+  EXPECT_EQ(difference, 77);
+}
+
 TEST(RasterChecked_CompareMasked, EqualsTheExactComparison) {
   Random random(28);
   for (int round = 0; round < kRounds; ++round) {
@@ -562,6 +578,61 @@ TEST(Drawing, RefusesNullAndBrokenViews) {
   }
   EXPECT_EQ(RasterChecked_Compare(&good, nullptr, &good, 0, 0, 0, nullptr), RASTER_STATUS_NULL);
   EXPECT_EQ(good.bytes(), before);
+}
+
+// ---- Parts of one frame buffer -----------------------------------------------------------------
+
+/// A frame buffer whose lower half is another view.
+struct Halves {
+  static constexpr uint32 kSide = 16;
+
+  explicit Halves(Random& random, PixelFormat format)
+      : frame(random, format, kSide, 2 * kSide, false), whole(frame.view()), lower(whole) {
+    lower.data += size_t{kSide} * whole.pitch;
+    lower.bytes -= size_t{kSide} * whole.pitch;
+    lower.height = kSide;
+  }
+
+  /// What a call says that draws from the lower half into the rows of the upper one, and one
+  /// further down.
+  template <class Call> void expectMayNotMeet(const Call& call) const {
+    constexpr auto kEdge = static_cast<int32>(kSide);
+    const Rect upper = {0, 0, kEdge, kEdge};
+    const Rect further = {0, 1, kEdge, kEdge + 1};
+    EXPECT_EQ(call(&whole, &upper, &lower), RASTER_STATUS_OK);
+    EXPECT_EQ(call(&whole, &further, &lower), RASTER_STATUS_OVERLAP);
+  }
+
+  GuardedView frame;
+  RasterView whole;
+  RasterView lower;
+};
+
+TEST(PartsOfOneFrameBuffer, AreNoOverlapUnlessTheyMeet) {
+  Random random(31);
+  const Halves colors(random, {24, 32});
+  const auto convert = [](const RasterView* dst, const Rect* rect, const RasterView* src) {
+    return RasterChecked_Convert(dst, rect, src, 0, 0, nullptr, 0, 0);
+  };
+  const auto copy = [](const RasterView* dst, const Rect* rect, const RasterView* src) {
+    return RasterChecked_Copy(dst, rect, src, 0, 0, 0);
+  };
+  const auto tile = [](const RasterView* dst, const Rect* rect, const RasterView* src) {
+    return RasterChecked_Tile(dst, rect, src, 0, 0, RASTER_ROP_XOR, 0);
+  };
+  const auto scale = [](const RasterView* dst, const Rect* rect, const RasterView* src) {
+    return RasterChecked_Scale(dst, rect, src, 1, 1, 1, 0);
+  };
+  colors.expectMayNotMeet(convert);
+  colors.expectMayNotMeet(copy);
+  colors.expectMayNotMeet(tile);
+  colors.expectMayNotMeet(scale);
+
+  Halves bytes(random, {8, 8});
+  bytes.lower.depth = bytes.lower.bpp = 1;
+  bytes.expectMayNotMeet([](const RasterView* dst, const Rect* rect, const RasterView* plane) {
+    return RasterChecked_Bits(dst, rect, plane, 0, 0, 1, 2, 0);
+  });
 }
 
 }  // namespace

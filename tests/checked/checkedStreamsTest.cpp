@@ -280,7 +280,26 @@ TEST(RasterChecked_YuvBytes, CountsBeyond32Bits) {
   EXPECT_EQ(bytes, uint64{6} * 0x8001 * 2);
   EXPECT_EQ(RasterChecked_YuvBytes(0x30323449, 2, 2, &bytes), RASTER_STATUS_BAD_FORMAT);
   EXPECT_EQ(RasterChecked_YuvBytes(kYv12, 0x80000000, 2, &bytes), RASTER_STATUS_TOO_BIG);
+  EXPECT_EQ(RasterChecked_YuvBytes(kYv12, 2, 0x80000000, &bytes), RASTER_STATUS_TOO_BIG);
   EXPECT_EQ(RasterChecked_YuvBytes(kYv12, 2, 2, nullptr), RASTER_STATUS_NULL);
+}
+
+// The views say that they have so many bytes, and nothing looks at them.
+TEST(RasterChecked_Compress, RefusesWhatNoBlockHolds) {
+  uint8 byte = 0;
+  uint8* block = nullptr;
+  size_t size = 77;
+  const RasterView none = {nullptr, 80, 40, 0, 2, 24, 32};
+  EXPECT_EQ(RasterChecked_Compress(&none, &block, &size), RASTER_STATUS_NULL);
+  if constexpr (sizeof(size_t) > 4) {
+    const RasterView large = {&byte, size_t{~0u} << 2, 0x10000, 0x4000, 0x10001, 24, 32};
+    EXPECT_EQ(RasterChecked_Compress(&large, &block, &size), RASTER_STATUS_TOO_BIG);
+    EXPECT_EQ(RasterChecked_YuvToRgb(&large, &byte, 1, kYuy2), RASTER_STATUS_TRUNCATED);
+    const RasterView larger = {&byte, size_t{~0u} << 4, 0x40000, 0x10000, 0x8000, 24, 32};
+    EXPECT_EQ(RasterChecked_YuvToRgb(&larger, &byte, 1, kYuy2), RASTER_STATUS_TOO_BIG);
+  }
+  EXPECT_EQ(block, nullptr);
+  EXPECT_EQ(size, 77u);
 }
 
 TEST(RasterChecked_YuvToRgb, RefusesOverlapAndNull) {
