@@ -211,6 +211,33 @@ def narrow_calls():
             f"(median {middle['0x0']}), one of\n4x4 {middle['4x4']} and one of 16x16 {middle['16x16']}.")
 
 
+# What is called with nothing to do, for the jobs that begin so; the first that fits.
+EMPTY_CALLS = {
+    "fill": "fill-32", "ropfill": "fill-32", "copy": "copy-32", "ropcopy": "ropcopy-32-xor", "tile": "tile-32-copy-64x64",
+    "bits": "bits-32", "convert": "convert-32-to-16", "compare": "compare-32-equal", "scale/box": "scale-box-32-x0.5",
+    "scale": "scale-bilinear-32-x1.5", "yuv": "yuv-YUY2-to-32", "blend": "blend-over-32"}
+
+
+def longer_call(job):
+    """How much longer an empty call of a job's kind takes in the 32-bit build, in ns."""
+    name = next((call for start, call in EMPTY_CALLS.items() if job.startswith(start)), None)
+    both = [rows.get((best, bits, f"call/{name}", "0x0")) for bits in (32, 64)]
+    return both[0].ours - both[1].ours if all(both) else None
+
+
+def narrow_small(level):
+    """The small rows of the 32-bit build that are below NARROW: where their time goes."""
+    body = []
+    for part, row in sorted(narrow_pairs(level), key=lambda pair: pair[0]):
+        if part >= NARROW or row.size not in SMALL:
+            continue
+        wide = row.ours * part
+        call = longer_call(row.job)
+        body.append([row.job, row.size, ratio(part), f"{row.ours:.1f}", f"{wide:.1f}",
+                     *(("-", "-") if call is None else (f"{call:.1f}", f"{row.ours - wide - call:.1f}"))])
+    return table(["job", "size", "of the 64-bit rate", "ns", "ns in 64-bit", "more for the call", "for the rest"], body, 1)
+
+
 def checked():
     """What the checks add to a call."""
     sizes = ["4x4", "16x16", "64x64", "256x256"]
@@ -282,6 +309,14 @@ A cell: rate · of the limit · of the best peer, and who that is.
 A cell: rate · of the limit · of the 64-bit rate.
 
 {family_tables(level, 32)}
+
+### Rows of 16x16 and less below {NARROW} of the 64-bit rate
+
+What they take longer: an empty call of their kind (for `-` none was measured), which is arguments on the stack
+and the way to the library's data, and the rest, which is constants and counters that seven general and eight
+vector registers do not hold.
+
+{narrow_small(level)}
 """
 
 
