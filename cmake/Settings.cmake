@@ -8,9 +8,7 @@ target_compile_options(raster_settings INTERFACE
   -Wpointer-arith
   $<$<CXX_COMPILER_ID:Clang>:-Wno-sign-conversion>  # which -Wconversion has there only
   $<$<COMPILE_LANGUAGE:CXX>:-Wnon-virtual-dtor -Wold-style-cast>
-  -ffp-contract=off -fno-common
-  # GCC clears some hundred bytes by string instructions, which take longer to begin than the stores.
-  $<$<CXX_COMPILER_ID:GNU>:-mmemset-strategy=unrolled_loop:512:noalign$<COMMA>libcall:-1:noalign>)
+  -ffp-contract=off -fno-common)
 if(RASTER_WERROR)
   target_compile_options(raster_settings INTERFACE -Werror)
 endif()

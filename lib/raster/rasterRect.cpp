@@ -42,7 +42,8 @@ uint32 addRect(RectList* list, const RectListEntry& rect) {
   uint32 area = 0;
   if (used < kMaxResult && endsAt(*list, used + 1) && addWhole(list, used, rect, area)) return area;
   if (sweepWith(list, used, rect, area)) return area;
-  *list = RectList{{boundingBox(*list)}};
+  list->rects[0] = boundingBox(*list);
+  clearFrom(list, 1);
   return areaOf(list->rects[0]);
 }
 
@@ -58,7 +59,7 @@ uint32 subRect(RectList* list, const RectListEntry& rect) {
 
 extern "C" {
 
-void Raster_ClearRectList(RectList* list) { *list = RectList{}; }
+void Raster_ClearRectList(RectList* list) { raster::clearFrom(list, 0); }
 
 uint32 Raster_AddRect(RectList* list, int32 x, int32 y, int32 width, int32 height) {
   if (height == 0 || width == 0) return 0;

@@ -45,15 +45,14 @@ RectListEntry unionOf(const RectListEntry& a, const RectListEntry& b) {
 class Draft {
  public:
   void append(const RectListEntry& r) {
-    if (count_ <= kMaxResult) list_.rects[count_++] = r;
+    if (count_ <= kMaxResult) rects_[count_++] = r;
   }
 
   void insert(const RectListEntry& r) {
     if (count_ > kMaxResult) return;
     uint32 at = count_++;
-    for (; at != 0 && comesBefore(r, list_.rects[at - 1]); --at)
-      list_.rects[at] = list_.rects[at - 1];
-    list_.rects[at] = r;
+    for (; at != 0 && comesBefore(r, rects_[at - 1]); --at) rects_[at] = rects_[at - 1];
+    rects_[at] = r;
   }
 
   /// Inserts what a hole leaves of a rectangle that it meets.
@@ -79,26 +78,29 @@ class Draft {
 
   uint32 moveTo(RectList* list) const {
     uint32 area = 0;
-    for (uint32 i = 0; i != count_; ++i) area += areaOf(list_.rects[i]);
-    *list = list_;
+    for (uint32 i = 0; i != count_; ++i) {
+      list->rects[i] = rects_[i];
+      area += areaOf(rects_[i]);
+    }
+    clearFrom(list, count_);
     return area;
   }
 
  private:
   bool isSweptFrom(uint32 i) const {
-    const RectListEntry& r = list_.rects[i];
+    const RectListEntry& r = rects_[i];
     const int32 bottom = bottomOf(r);
     if (!isPlain(r)) return false;
-    if (i + 1 != count_ && !comesBefore(r, list_.rects[i + 1])) return false;
-    for (uint32 k = i + 1; k != count_ && list_.rects[k].y <= bottom; ++k) {
-      const RectListEntry& other = list_.rects[k];
+    if (i + 1 != count_ && !comesBefore(r, rects_[i + 1])) return false;
+    for (uint32 k = i + 1; k != count_ && rects_[k].y <= bottom; ++k) {
+      const RectListEntry& other = rects_[k];
       if (other.y == bottom ? hasSameColumns(r, other) : touchesColumns(r, other)) return false;
     }
     return true;
   }
 
   uint32 count_ = 0;
-  RectList list_ = {};
+  RectListEntry rects_[kListSize];
 };
 
 /// Grows a rectangle over those of the list with which it makes one, and tells which. False when

@@ -33,6 +33,10 @@ inline uint32 usedEntries(const RectList& list) {
   return count;
 }
 
+/// Clears the entries of a list from number `first` on. Not in line: where the size is known, GCC
+/// takes string instructions, which take longer to begin than the whole.
+void clearFrom(RectList* list, uint32 first);
+
 /// Some rectangles of a list, one bit each: bit i is entry i.
 using Rects = uint32;
 inline constexpr Rects kNone = 0;

@@ -147,8 +147,11 @@ class BandTable {
  public:
   /// Begins with the first `settled` rectangles of a list.
   BandTable(const RectList& list, uint32 settled) : count_(settled) {
-    std::copy_n(list.rects, settled, rects_);
-    for (uint32 i = 0; i != settled; ++i) area_ += areaOf(rects_[i]);
+    for (uint32 i = 0; i != settled; ++i) {
+      rects_[i] = list.rects[i];
+      area_ += areaOf(rects_[i]);
+    }
+    rects_[settled] = {};
   }
 
   /// Goes on to scanline `y`: spans that were on the last scanline too keep their rectangle; the
@@ -172,7 +175,10 @@ class BandTable {
   }
 
   uint32 area() const { return area_; }
-  void copyTo(RectList* list) const { std::copy_n(rects_, kListSize, list->rects); }
+  void copyTo(RectList* list) const {
+    for (uint32 i = 0; i <= count_; ++i) list->rects[i] = rects_[i];
+    clearFrom(list, count_ + 1);
+  }
 
  private:
   /// Deliberate: a span too wide for a signed width is written behind the others, but does not
@@ -182,6 +188,7 @@ class BandTable {
     rects_[count_] = {spans.start[i], y, width, 0};
     if (width > 0) {
       spans.rect[i] = count_++;
+      rects_[count_] = {};
     } else {
       spans.end[i] = spans.start[i];
       spans.rect[i] = kNowhere;
@@ -197,7 +204,7 @@ class BandTable {
   static constexpr uint32 kNowhere = kListSize;
   uint32 count_;
   uint32 area_ = 0;
-  RectListEntry rects_[kListSize + 1] = {};
+  RectListEntry rects_[kListSize + 1];  ///< `count_`, and the one behind them
 };
 
 // ---- The sweep ---------------------------------------------------------------------------------
