@@ -151,7 +151,7 @@ class BandTable {
       rects_[i] = list.rects[i];
       area_ += areaOf(rects_[i]);
     }
-    rects_[settled] = {};
+    rects_[settled] = rects_[kNowhere] = {};
   }
 
   /// Goes on to scanline `y`: spans that were on the last scanline too keep their rectangle; the
@@ -201,10 +201,11 @@ class BandTable {
     area_ += areaOf(rect);
   }
 
+  /// Where spans end that have no rectangle: one without width.
   static constexpr uint32 kNowhere = kListSize;
   uint32 count_;
   uint32 area_ = 0;
-  RectListEntry rects_[kListSize + 1];  ///< `count_`, and the one behind them
+  RectListEntry rects_[kListSize + 1];  ///< `count_`, the one behind them, and kNowhere
 };
 
 // ---- The sweep ---------------------------------------------------------------------------------
