@@ -313,7 +313,7 @@ A cell: rate · of the limit · of the 64-bit rate.
 ### Rows of 16x16 and less below {NARROW} of the 64-bit rate
 
 What they take longer: an empty call of their kind (for `-` none was measured), which is arguments on the stack
-and the way to the library's data, and the rest, which is constants and counters that seven general and eight
+and the way to the library's data, and the rest: mostly constants and counters that seven general and eight
 vector registers do not hold.
 
 {narrow_small(level)}

@@ -466,6 +466,9 @@ TEST(RasterChecked_CompareRects, RefusesNullAndUnknownFlags) {
   EXPECT_EQ(RasterChecked_CompareRects(nullptr, &a, &list, 0, &difference), RASTER_STATUS_NULL);
   EXPECT_EQ(RasterChecked_CompareRects(&a, &a, &list, ~RASTER_CHECKED_CLIP, &difference),
             RASTER_STATUS_BAD_ARGUMENT);
+  const RectList none = {};
+  EXPECT_EQ(RasterChecked_CompareRects(&a, &a, &none, ~RASTER_CHECKED_CLIP, &difference),
+            RASTER_STATUS_BAD_ARGUMENT);
   EXPECT_EQ(RasterChecked_CompareRects(&a, &other, &list, 0, &difference),
             RASTER_STATUS_BAD_FORMAT);
   EXPECT_EQ(difference, 77);

@@ -23,7 +23,7 @@ namespace {
 
 #if HWY_TARGET != HWY_SCALAR
 
-/// The rows of squares of kSide x kSide source pixels.
+/// The rows of one square of kSide x kSide source pixels.
 template <unsigned kSide> using SquareRows = const uint8* [kSide];
 
 /// Sums of neighbouring bytes, and of neighbouring 16-bit lanes. Highway names the first one only
